@@ -1,0 +1,135 @@
+#include "wordcatcher/fuzzy/LXFuzzyIndex.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "wordcatcher/text/TextForm.h"
+#include "wordcatcher/text/Unicode.h"
+#include "wordcatcher/text/WordSegmenter.h"
+
+namespace wordcatcher {
+
+namespace {
+
+constexpr std::u16string_view kAny = u"*";
+
+/// A place in the walk: the state of the query's automaton, and the state of the prefix tree, whose
+/// name is the string read so far.
+struct WalkItem {
+  const LXDFAState<LXIntTupleSet>* query;
+  std::u16string prefix;
+};
+
+/// The state that a stored symbol leads to: the symbol's own edge wins over "*".
+const LXDFAState<LXIntTupleSet>* queryStep(const LXDFAState<LXIntTupleSet>& state,
+                                           std::u16string_view symbol) {
+  const auto* exact = state.followingStateWithSymbol(symbol);
+  return exact != nullptr ? exact : state.followingStateWithSymbol(kAny);
+}
+
+/// The least distance of the state's final labels, and `maxDistance` if none is smaller.
+std::int64_t distanceOf(const LevenshteinNFA& nfa, const LXIntTupleSet& labels,
+                        std::int64_t maxDistance) {
+  std::int64_t distance = maxDistance;
+  for (const auto& label : labels) {
+    if (nfa.isFinalState(label)) {
+      distance = std::min(distance, label.distance());
+    }
+  }
+  return distance;
+}
+
+/// The order of a search's result: many data strings outrank a small distance, on purpose.
+bool ranksBefore(const LXFuzzyMatch& a, const LXFuzzyMatch& b) {
+  if (a.data().size() != b.data().size()) {
+    return a.data().size() > b.data().size();
+  }
+  if (a.distance() != b.distance()) {
+    return a.distance() < b.distance();
+  }
+  if (a.value().size() != b.value().size()) {
+    return a.value().size() < b.value().size();
+  }
+  return a.value() < b.value();
+}
+
+}  // namespace
+
+LXFuzzyIndex::LXFuzzyIndex() : _segmenter(std::make_unique<WordSegmenter>()) {}
+
+LXFuzzyIndex::LXFuzzyIndex(std::string path)
+    : _LXindex(std::move(path)), _segmenter(std::make_unique<WordSegmenter>()) {}
+
+LXFuzzyIndex::~LXFuzzyIndex() = default;
+
+void LXFuzzyIndex::setMode(std::int32_t mode) { _LXindex.setMode(mode); }
+
+std::int32_t LXFuzzyIndex::getMode() const noexcept { return _LXindex.getMode(); }
+
+void LXFuzzyIndex::addString(std::u16string_view string) {
+  addString_withData(string, std::nullopt);
+}
+
+void LXFuzzyIndex::addString_withData(std::u16string_view string,
+                                      std::optional<std::u16string_view> data) {
+  const std::u16string stored = toLower(string);
+  const std::u16string_view view = stored;
+  for (std::size_t i = 0; i < view.size(); ++i) {
+    _LXindex.addEdge_fromState_toState(view.substr(i, 1), view.substr(0, i), view.substr(0, i + 1));
+  }
+  _LXindex.addFinalState(view);
+  if (data) {
+    _LXindex.setDataFor_to(view, *data);
+  }
+}
+
+void LXFuzzyIndex::addWordsFromString_data(std::u16string_view text,
+                                           std::optional<std::u16string_view> data) {
+  _segmenter->start(text);
+  while (const auto word = _segmenter->next()) {
+    addString_withData(*word, data);
+  }
+}
+
+std::vector<LXFuzzyMatch> LXFuzzyIndex::search_withMaxDistance(
+    std::optional<std::u16string_view> query, std::int64_t maxDistance) {
+  std::vector<LXFuzzyMatch> matches;
+  if (!query || query->empty()) {
+    return matches;
+  }
+  const LevenshteinNFA nfa = _LXcreateNFAWithWord_withMaxDistance(toLower(*query), maxDistance);
+  const LevenshteinDFA dfa = _LXcreateDFAFromNFA(nfa);
+  std::vector<WalkItem> pending;
+  pending.push_back({dfa.stateNamed(*dfa.startState()), _LXindex.startState()});
+  while (!pending.empty()) {
+    const WalkItem item = std::move(pending.back());
+    pending.pop_back();
+    for (const auto& symbol : _LXindex.edgesFromState(item.prefix)) {
+      // A U+0000 inside an added string leaves an empty symbol behind, which leads nowhere new.
+      if (symbol.size() != 1) {
+        continue;
+      }
+      const auto* next = queryStep(*item.query, symbol);
+      if (next == nullptr) {
+        continue;
+      }
+      std::u16string prefix = item.prefix + symbol;
+      if (next->final() && _LXindex.isFinalState(prefix)) {
+        const auto data = _LXindex.dataFor(prefix);
+        matches.emplace_back(prefix, distanceOf(nfa, next->data(), maxDistance),
+                             std::vector<std::u16string>(data.begin(), data.end()));
+      }
+      pending.push_back({next, std::move(prefix)});
+    }
+  }
+  std::sort(matches.begin(), matches.end(), &ranksBefore);
+  return matches;
+}
+
+std::u16string LXFuzzyIndex::description() const { return _LXindex.description(); }
+
+std::ostream& operator<<(std::ostream& stream, const LXFuzzyIndex& index) {
+  return writeUtf8(stream, index.description());
+}
+
+}  // namespace wordcatcher

@@ -1,0 +1,71 @@
+#ifndef WORDCATCHER_FUZZY_LXINTTUPLESET_H
+#define WORDCATCHER_FUZZY_LXINTTUPLESET_H
+
+#include <cstddef>
+#include <cstdint>
+#include <functional>
+#include <initializer_list>
+#include <ostream>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "wordcatcher/Export.h"
+#include "wordcatcher/fuzzy/LXIntTuple.h"
+
+namespace wordcatcher {
+
+/// A set of labels, which is the name of a state of a query's deterministic automaton: two sets are
+/// the same state when they hold the same labels, in whatever order those were collected. Kept as a
+/// sorted list, since the sets are small and compared often. A value: copyable, comparable,
+/// hashable.
+class WORDCATCHER_EXPORT LXIntTupleSet {
+ public:
+  using value_type = LXIntTuple;
+  using const_iterator = std::vector<LXIntTuple>::const_iterator;
+
+  LXIntTupleSet() = default;
+  LXIntTupleSet(std::initializer_list<LXIntTuple> labels);
+
+  /// The labels, ascending by index, then distance.
+  const_iterator begin() const noexcept { return _labels.begin(); }
+  const_iterator end() const noexcept { return _labels.end(); }
+  std::size_t size() const noexcept { return _labels.size(); }
+  bool empty() const noexcept { return _labels.empty(); }
+  bool contains(const LXIntTuple& label) const;
+  std::size_t count(const LXIntTuple& label) const { return contains(label) ? 1 : 0; }
+
+  /// Adds a label and tells where it is and whether it is new. Linear in the size.
+  std::pair<const_iterator, bool> insert(const LXIntTuple& label);
+
+  /// Adds every label of a range.
+  template <typename Iterator>
+  void insert(Iterator first, Iterator last) {
+    for (; first != last; ++first) {
+      insert(*first);
+    }
+  }
+
+  std::uint64_t hash() const noexcept;
+
+  /// The labels' text forms: {(0_1), (1_1)}.
+  std::u16string description() const;
+
+  friend bool operator==(const LXIntTupleSet&, const LXIntTupleSet&) = default;
+
+ private:
+  std::vector<LXIntTuple> _labels;
+};
+
+WORDCATCHER_EXPORT std::ostream& operator<<(std::ostream& stream, const LXIntTupleSet& labels);
+
+}  // namespace wordcatcher
+
+template <>
+struct std::hash<wordcatcher::LXIntTupleSet> {
+  std::size_t operator()(const wordcatcher::LXIntTupleSet& labels) const noexcept {
+    return labels.hash();
+  }
+};
+
+#endif

@@ -1,0 +1,58 @@
+#ifndef WORDCATCHER_MATCHER_KXWORDCATCH_H
+#define WORDCATCHER_MATCHER_KXWORDCATCH_H
+
+#include <cstdint>
+#include <functional>
+#include <ostream>
+#include <string>
+#include <utility>
+
+#include "wordcatcher/Export.h"
+
+namespace wordcatcher {
+
+/// One phrase that a query found: a data string that the host stored with it, and its score, of
+/// which smaller is better. Two records are equal when their values are, whatever their distances:
+/// a set of records holds each phrase once.
+class WORDCATCHER_EXPORT KXWordcatch {
+ public:
+  KXWordcatch(std::u16string value, std::int64_t distance)
+      : _value(std::move(value)), _distance(distance) {}
+
+  const std::u16string& value() const noexcept { return _value; }
+  void setValue(std::u16string value) { _value = std::move(value); }
+
+  /// Edits of the words plus penalties for missing and surplus words.
+  std::int64_t distance() const noexcept { return _distance; }
+  void setDistance(std::int64_t distance) noexcept { _distance = distance; }
+
+  /// Whether the values hold the same code units.
+  bool isEqual(const KXWordcatch& other) const noexcept { return _value == other._value; }
+
+  /// The hash of the value.
+  std::uint64_t hash() const noexcept { return std::hash<std::u16string>()(_value); }
+
+  /// {KXWordcatch v:"the value", dist: 4}
+  std::u16string description() const;
+
+  friend bool operator==(const KXWordcatch& a, const KXWordcatch& b) noexcept {
+    return a.isEqual(b);
+  }
+
+ private:
+  std::u16string _value;
+  std::int64_t _distance;
+};
+
+WORDCATCHER_EXPORT std::ostream& operator<<(std::ostream& stream, const KXWordcatch& record);
+
+}  // namespace wordcatcher
+
+template <>
+struct std::hash<wordcatcher::KXWordcatch> {
+  std::size_t operator()(const wordcatcher::KXWordcatch& record) const noexcept {
+    return record.hash();
+  }
+};
+
+#endif
