@@ -45,6 +45,15 @@ int openLocked(const std::string& path, int flags) {
   return descriptor;
 }
 
+/// Closes a file and gives its lock back. Closing alone would not: a mapping that outlives the
+/// descriptor keeps the open file, and with it the lock, alive.
+void closeLocked(int descriptor) {
+  if (descriptor >= 0) {
+    flock(descriptor, LOCK_UN);
+    close(descriptor);
+  }
+}
+
 /// The bytes that are stored for a string: its UTF-8 form up to the first zero byte.
 std::optional<std::string> storedBytes(std::optional<std::u16string_view> text) {
   if (!text) {
@@ -74,7 +83,7 @@ void TinyCDB::setMode(std::int32_t mode) {
         logLine("%s Could not finalize for db make at %@, db may be corrupted!", {kSetMode, _path});
       }
     }
-    close(_fileDesc);
+    closeLocked(_fileDesc);
     // A mode that opens nothing may be left later, and must not close the number a second time.
     _fileDesc = -1;
   }
