@@ -124,14 +124,14 @@ TEST_F(KXWordcatcherTest, AMovedFromMatcherIsOneOverNothing) {
   indexTheGoldenOnes();
   KXWordcatcher taken = std::move(matcher);
   EXPECT_EQ(taken.getMode(), 1);
-  // NOLINTBEGIN(bugprone-use-after-move)
+  // NOLINTBEGIN(bugprone-use-after-move,clang-analyzer-cplusplus.Move)
   EXPECT_EQ(matcher.getMode(), 0);
   matcher.setMode(2);
   matcher.index_withData(u"nothing", u"nothing");
   EXPECT_EQ(matcher.query(u"nothing"), std::nullopt);
   matcher.setOptions(1);
   EXPECT_TRUE(std::get<std::vector<LXFuzzyMatch>>(*matcher.query(u"nothing")).empty());
-  // NOLINTEND(bugprone-use-after-move)
+  // NOLINTEND(bugprone-use-after-move,clang-analyzer-cplusplus.Move)
   EXPECT_TRUE(taken.query(u"golden").has_value());
 }
 
@@ -195,7 +195,8 @@ TEST_F(KXWordcatcherTest, WordsWithTheSamePhrasesContributeOnce) {
 }
 
 TEST_F(KXWordcatcherTest, TheFirstMatchOfTheIndexsOrderFixesAPhrasesDistance) {
-  // "banner" carries two data strings and so is listed before "manner", which is nearer to the query.
+  // "banner" carries two data strings and so is listed before "manner", which is nearer to the
+  // query.
   index({{u"banner manner", u"banner manner"}, {u"banner", u"banner"}});
   EXPECT_EQ(query(u"manner"), (Records{{u"banner", 1}}))
       << "the long phrase has 1, not 0, and 2 more for its length";

@@ -30,9 +30,9 @@ TEST(LXIntTupleTest, HashesByThirtyOne) {
   EXPECT_EQ(LXIntTuple(0, 0).hash(), 961U);
   EXPECT_EQ(LXIntTuple(1, 2).hash(), 994U);
   EXPECT_EQ(LXIntTuple(-1, 0).hash(), 930U);
-  EXPECT_EQ(LXIntTuple(INT64_MAX, INT64_MIN).hash(),
-            static_cast<std::uint64_t>(INT64_MAX) * 31 + static_cast<std::uint64_t>(INT64_MIN) +
-                961);
+  EXPECT_EQ(
+      LXIntTuple(INT64_MAX, INT64_MIN).hash(),
+      static_cast<std::uint64_t>(INT64_MAX) * 31 + static_cast<std::uint64_t>(INT64_MIN) + 961);
   EXPECT_EQ(std::hash<LXIntTuple>()(LXIntTuple(1, 2)), 994U);
 }
 

@@ -51,10 +51,10 @@ TEST(LevenshteinNFATest, BuildsTheEdgesOfCat) {
   EXPECT_EQ(nfa.size(), 8U);
   EXPECT_EQ(nfa.startState(), LXIntTuple(0, 0));
   const std::vector<std::tuple<LXIntTuple, std::u16string, Targets>> expected = {
-      {{0, 0}, u"c", {{1, 0}}}, {{0, 0}, u"*", {{0, 1}, {1, 1}}}, {{0, 0}, u"_", {{1, 1}}},
-      {{0, 1}, u"c", {{1, 1}}}, {{3, 0}, u"*", {{3, 1}}},         {{1, 0}, u"a", {{2, 0}}},
-      {{1, 0}, u"*", {{1, 1}, {2, 1}}}, {{1, 0}, u"_", {{2, 1}}}, {{1, 1}, u"a", {{2, 1}}},
-      {{2, 0}, u"t", {{3, 0}}}, {{2, 0}, u"*", {{2, 1}, {3, 1}}}, {{2, 0}, u"_", {{3, 1}}},
+      {{0, 0}, u"c", {{1, 0}}},         {{0, 0}, u"*", {{0, 1}, {1, 1}}}, {{0, 0}, u"_", {{1, 1}}},
+      {{0, 1}, u"c", {{1, 1}}},         {{3, 0}, u"*", {{3, 1}}},         {{1, 0}, u"a", {{2, 0}}},
+      {{1, 0}, u"*", {{1, 1}, {2, 1}}}, {{1, 0}, u"_", {{2, 1}}},         {{1, 1}, u"a", {{2, 1}}},
+      {{2, 0}, u"t", {{3, 0}}},         {{2, 0}, u"*", {{2, 1}, {3, 1}}}, {{2, 0}, u"_", {{3, 1}}},
       {{2, 1}, u"t", {{3, 1}}}};
   std::map<LXIntTuple, Symbols> symbols;
   for (const auto& [from, symbol, targets] : expected) {
@@ -131,18 +131,17 @@ TEST(LevenshteinDFATest, ConvertsCatToElevenStates) {
     bool final;
     std::map<std::u16string, LXIntTupleSet> edges;
   };
-  const std::vector<Row> rows = {
-      {s0, false, {{u"c", s2}, {u"*", s1}}},
-      {s1, false, {{u"c", s10}, {u"a", s6}}},
-      {s2, false, {{u"c", s3}, {u"a", s4}, {u"t", s5}, {u"*", s3}}},
-      {s3, false, {{u"a", s6}, {u"t", s7}}},
-      {s4, true, {{u"a", s8}, {u"t", s9}, {u"*", s8}}},
-      {s5, true, {{u"a", s6}, {u"t", s7}}},
-      {s6, false, {{u"t", s7}}},
-      {s7, true, {}},
-      {s8, true, {{u"t", s7}}},
-      {s9, true, {{u"t", s7}, {u"*", s7}}},
-      {s10, false, {{u"a", s6}}}};
+  const std::vector<Row> rows = {{s0, false, {{u"c", s2}, {u"*", s1}}},
+                                 {s1, false, {{u"c", s10}, {u"a", s6}}},
+                                 {s2, false, {{u"c", s3}, {u"a", s4}, {u"t", s5}, {u"*", s3}}},
+                                 {s3, false, {{u"a", s6}, {u"t", s7}}},
+                                 {s4, true, {{u"a", s8}, {u"t", s9}, {u"*", s8}}},
+                                 {s5, true, {{u"a", s6}, {u"t", s7}}},
+                                 {s6, false, {{u"t", s7}}},
+                                 {s7, true, {}},
+                                 {s8, true, {{u"t", s7}}},
+                                 {s9, true, {{u"t", s7}, {u"*", s7}}},
+                                 {s10, false, {{u"a", s6}}}};
   EXPECT_EQ(dfa.size(), rows.size());
   EXPECT_EQ(dfa.startState(), s0);
   for (const auto& row : rows) {

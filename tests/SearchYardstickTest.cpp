@@ -101,14 +101,21 @@ TEST(SearchYardstickTest, EveryWordOfASmallWorldAtEveryDistance) {
 /// Strings over letters that mean something to the automata, letters outside ASCII, and halves and
 /// wholes of surrogate pairs.
 rc::Gen<std::u16string> anyString() {
-  return rc::gen::container<std::u16string>(rc::gen::weightedElement<char16_t>(
-      {{8, u'a'}, {8, u'b'}, {3, u'*'}, {3, u'_'}, {2, u'é'}, {1, char16_t{0xD83D}},
-       {1, char16_t{0xDE00}}, {1, u'日'}}));
+  return rc::gen::container<std::u16string>(
+      rc::gen::weightedElement<char16_t>({{8, u'a'},
+                                          {8, u'b'},
+                                          {3, u'*'},
+                                          {3, u'_'},
+                                          {2, u'é'},
+                                          {1, char16_t{0xD83D}},
+                                          {1, char16_t{0xDE00}},
+                                          {1, u'日'}}));
 }
 
 RC_GTEST_PROP(SearchYardstickTest, RandomIndexesAndQueries, ()) {
   const auto strings = *rc::gen::container<std::vector<std::u16string>>(anyString());
-  const auto tags = *rc::gen::container<std::vector<char>>(strings.size(), rc::gen::inRange('0', '4'));
+  const auto tags =
+      *rc::gen::container<std::vector<char>>(strings.size(), rc::gen::inRange('0', '4'));
   Entries entries;
   for (std::size_t i = 0; i < strings.size(); ++i) {
     auto& data = entries[strings[i]];

@@ -47,7 +47,7 @@ void writeFile(const std::string& path, std::string_view bytes) {
 }
 
 std::string outputOf(const std::string& command) {
-  FILE* pipe = popen(command.c_str(), "r");
+  FILE* pipe = popen(command.c_str(), "r");  // NOLINT(cert-env33-c): our own commands
   std::string output;
   std::array<char, 4096> chunk{};
   for (std::size_t got = 0; (got = fread(chunk.data(), 1, chunk.size(), pipe)) > 0;) {

@@ -67,7 +67,7 @@ __attribute__((visibility("default"))) void syslog(int priority, const char* for
   char line[256];
   va_list arguments;
   va_start(arguments, format);
-  vsnprintf(line, sizeof line, format, arguments);
+  (void)vsnprintf(line, sizeof line, format, arguments);
   va_end(arguments);
   errorLog.push_back(std::to_string(priority & 7) + " " + line);
 }
@@ -78,8 +78,8 @@ __attribute__((visibility("default"))) void* realloc(void* block, std::size_t si
     errno = ENOMEM;
     return nullptr;
   }
-  static const auto real = reinterpret_cast<void* (*)(void*, std::size_t)>(
-      dlsym(RTLD_NEXT, "realloc"));
+  static const auto real =
+      reinterpret_cast<void* (*)(void*, std::size_t)>(dlsym(RTLD_NEXT, "realloc"));
   return real(block, size);
 }
 #endif

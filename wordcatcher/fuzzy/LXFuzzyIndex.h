@@ -34,9 +34,9 @@ using LevenshteinDFA = LXDFA<LXIntTupleSet>;
 /// construct, setMode(2), add, setMode(1), search. Modes and locks are those of TinyCDB; a failure
 /// is a line in the log, and the index carries on with what it can read.
 ///
-/// A string that holds a character outside the Basic Multilingual Plane keeps its final mark and its
-/// data, but no search finds it: its two code units would each need an edge of their own, and half a
-/// surrogate pair has no UTF-8 form to store. The same holds for a string with an unpaired
+/// A string that holds a character outside the Basic Multilingual Plane keeps its final mark and
+/// its data, but no search finds it: its two code units would each need an edge of their own, and
+/// half a surrogate pair has no UTF-8 form to store. The same holds for a string with an unpaired
 /// surrogate.
 ///
 /// Growth: the tables hold one record an adding call, so finishing a table and every walk from the
@@ -102,8 +102,8 @@ class WORDCATCHER_EXPORT LXFuzzyIndex {
                                                              std::int64_t maxDistance);
 
   /// The deterministic form of an automaton by subset construction. An edge "*" stands for every
-  /// symbol that has no edge of its own. The start state is the given automaton's start label alone,
-  /// not closed under empty moves.
+  /// symbol that has no edge of its own. The start state is the given automaton's start label
+  /// alone, not closed under empty moves.
   static LevenshteinDFA _LXcreateDFAFromNFA(const LevenshteinNFA& nfa);
 
   /// The labels that edges of exactly this symbol lead to from a set of labels, in one step.

@@ -34,7 +34,8 @@ class LXNFA {
   LXNFA& operator=(const LXNFA&) = delete;
 
   /// Takes over the states; `other` is left without any.
-  LXNFA(LXNFA&& other) noexcept
+  LXNFA(LXNFA&& other)
+  noexcept
       : _LXstates(std::move(other._LXstates)), _LXstart(std::exchange(other._LXstart, nullptr)) {
     other._LXstates.clear();
   }

@@ -25,8 +25,8 @@ LogSink& logSink() noexcept;
 /// Precondition: there are as many arguments as placeholders.
 std::string formatLogLine(std::string_view pattern, std::initializer_list<LogArgument> arguments);
 
-/// Writes one line to the sink in force, formatting it only if the sink wants it. Leaves errno as it
-/// was, so that logging never disturbs an error test that follows.
+/// Writes one line to the sink in force, formatting it only if the sink wants it. Leaves errno as
+/// it was, so that logging never disturbs an error test that follows.
 void logLine(std::string_view pattern, std::initializer_list<LogArgument> arguments);
 
 }  // namespace wordcatcher

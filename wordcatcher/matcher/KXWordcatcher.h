@@ -31,8 +31,8 @@ using QueryResult = std::variant<std::vector<KXWordcatch>, std::vector<LXFuzzyMa
 ///
 /// A life is: construct, setMode(2), index_withData() for every phrase, setMode(1), query(). No
 /// errors are reported: a failure of the files is a line in the log (see LogSink), and queries then
-/// find less. A moved-from matcher behaves as one over nothing: it stores nothing, its mode is 0, and
-/// it finds nothing.
+/// find less. A moved-from matcher behaves as one over nothing: it stores nothing, its mode is 0,
+/// and it finds nothing.
 ///
 /// Growth: the index holds one record an adding call, so that finishing it grows with the square of
 /// the number of words added, and every query with that number (see LXFuzzyIndex).
@@ -55,18 +55,18 @@ class WORDCATCHER_EXPORT KXWordcatcher {
   /// 1 once the index has been opened for reading, else 0; not the mode last set.
   std::int32_t getMode() const noexcept;
 
-  /// Adds one phrase with its data string, in mode 2. A data string that begins with the phrase, and
-  /// puts any further fields after "{ ", lets queries judge the phrase's length: "golden retriever{
-  /// 7 }". A phrase without data is never found in word mode and phonetic word mode.
+  /// Adds one phrase with its data string, in mode 2. A data string that begins with the phrase,
+  /// and puts any further fields after "{ ", lets queries judge the phrase's length: "golden
+  /// retriever{ 7 }". A phrase without data is never found in word mode and phonetic word mode.
   void index_withData(std::u16string_view text, std::optional<std::u16string_view> data);
 
   /// The stored phrases that occur in the text, in mode 1.
   ///
   /// Word mode: each word of more than 2 code units is looked up within 2 edits (shorter ones only
-  /// if there is no other); the words' phrases are intersected in text order; a phrase's distance is
-  /// the sum of its words' edits, plus penalties for words that find nothing and for every counted
-  /// word (of more than 3 code units) that phrase or text has more than the other; at most 2 a
-  /// counted word of the text is allowed. Phonetic word mode does the same on codes, which must
+  /// if there is no other); the words' phrases are intersected in text order; a phrase's distance
+  /// is the sum of its words' edits, plus penalties for words that find nothing and for every
+  /// counted word (of more than 3 code units) that phrase or text has more than the other; at most
+  /// 2 a counted word of the text is allowed. Phonetic word mode does the same on codes, which must
   /// match exactly: only distance 0 is returned, and every later query of this matcher searches
   /// within 0 edits. Both return records ascending by distance, then value; nothing when no word
   /// finds data; an empty list when all candidates are too far.

@@ -27,7 +27,8 @@ struct SpanQueryLimits {
 /// Arithmetic on scores wraps around: the host may set the running counter to any value.
 class SpanQuery {
  public:
-  /// `wordsMatched` is the matcher's running counter, which the query raises and takes into account.
+  /// `wordsMatched` is the matcher's running counter, which the query raises and takes into
+  /// account.
   SpanQuery(LXFuzzyIndex& index, WordSegmenter& segmenter, const SpanQueryLimits& limits,
             std::int64_t& wordsMatched)
       : _index(index), _segmenter(segmenter), _limits(limits), _wordsMatched(wordsMatched) {}

@@ -8,5 +8,5 @@ class WORDCATCHER_EXPORT KXMetaphone {
  public:
   std::u16string translate(std::u16string_view text);
 };
-}
+}  // namespace wordcatcher
 #endif

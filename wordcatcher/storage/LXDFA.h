@@ -31,7 +31,8 @@ class LXDFA {
   LXDFA& operator=(const LXDFA&) = delete;
 
   /// Takes over the states; `other` is left without any.
-  LXDFA(LXDFA&& other) noexcept
+  LXDFA(LXDFA&& other)
+  noexcept
       : _LXstates(std::move(other._LXstates)), _LXstart(std::exchange(other._LXstart, nullptr)) {
     other._LXstates.clear();
   }
@@ -53,15 +54,15 @@ class LXDFA {
     return state != nullptr && state->final();
   }
 
-  /// Leads `symbol` from one state to another, adding both if need be. An earlier edge of the symbol
-  /// is replaced.
+  /// Leads `symbol` from one state to another, adding both if need be. An earlier edge of the
+  /// symbol is replaced.
   void addEdge_fromState_toState(std::u16string_view symbol, const Name& from, const Name& to) {
     auto& source = _LXaddState(from);
     source.addEdgeWithSymbol_toState(symbol, _LXaddState(to));
   }
 
-  /// The name of the state that exactly this symbol leads to; nothing when there is no such state or
-  /// edge.
+  /// The name of the state that exactly this symbol leads to; nothing when there is no such state
+  /// or edge.
   std::optional<Name> followingStateFrom_withSymbol(const Name& from,
                                                     std::u16string_view symbol) const {
     const auto* source = stateNamed(from);

@@ -15,8 +15,8 @@ namespace wordcatcher {
 
 /// A deterministic automaton kept on disk in three table files: its edges, its final states and the
 /// data strings of its states. It holds the index's prefix tree: a state is named by the symbols
-/// that lead to it from the start state "", so an edge's target, being the source's name followed by
-/// the symbol, is not stored.
+/// that lead to it from the start state "", so an edge's target, being the source's name followed
+/// by the symbol, is not stored.
 ///
 /// The files are the path followed directly by "edgeTable.tdb", "finalTable.tdb" and
 /// "dataTable.tdb": a directory is given with its trailing "/". docs/index-directory.md shows them
@@ -45,8 +45,8 @@ class WORDCATCHER_EXPORT PLXDFA {
   /// 1 once the edge table has been opened for reading, else 0.
   std::int32_t getMode() const noexcept;
 
-  /// Stores the edge of `symbol` that leaves `from`. `to` must be `from` followed by `symbol`; it is
-  /// not stored. The same edge added twice is two records that read back as one.
+  /// Stores the edge of `symbol` that leaves `from`. `to` must be `from` followed by `symbol`; it
+  /// is not stored. The same edge added twice is two records that read back as one.
   void addEdge_fromState_toState(std::u16string_view symbol, std::u16string_view from,
                                  std::u16string_view to);
 

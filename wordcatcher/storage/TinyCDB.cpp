@@ -32,8 +32,8 @@ constexpr mode_t kPermissions = 0666;
 // The table of contents at the start of every cdb file.
 constexpr unsigned kHeaderBytes = 2048;
 
-/// Opens a file and waits for its exclusive lock. errno afterwards is what open() left: a failure of
-/// the lock (a file system without locks) neither fails the call nor shows in it.
+/// Opens a file and waits for its exclusive lock. errno afterwards is what open() left: a failure
+/// of the lock (a file system without locks) neither fails the call nor shows in it.
 int openLocked(const std::string& path, int flags) {
   const int descriptor = open(path.c_str(), flags | O_CLOEXEC, kPermissions);
   if (descriptor >= 0) {
@@ -202,7 +202,8 @@ void TinyCDB::_allocbuf(std::int32_t size) {
   if (blen >= size) {
     return;
   }
-  auto* const grown = static_cast<unsigned char*>(std::realloc(buf, static_cast<std::size_t>(size)));
+  auto* const grown =
+      static_cast<unsigned char*>(std::realloc(buf, static_cast<std::size_t>(size)));
   if (grown == nullptr) {
     std::free(buf);
     syslog(LOG_USER | LOG_ERR, "Unable to allocate %u bytes", static_cast<unsigned>(size));

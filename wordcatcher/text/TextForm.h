@@ -22,12 +22,10 @@ std::u16string textForm(Integer number) {
 }
 
 template <typename Object>
-  requires requires(const Object& object) {
-    { object.description() } -> std::convertible_to<std::u16string>;
-  }
-std::u16string textForm(const Object& object) {
-  return object.description();
+requires requires(const Object& object) {
+  { object.description() } -> std::convertible_to<std::u16string>;
 }
+std::u16string textForm(const Object& object) { return object.description(); }
 
 /// The text forms of a range's members in its own order: {a, b}.
 template <typename Range>

@@ -27,8 +27,8 @@ std::u16string mapCase(CaseMapping mapping, std::u16string_view text) {
   const std::int32_t length = icuLength(text.size());
   std::u16string result(text.size() + text.size() / 8 + 8, u'\0');
   UErrorCode status = U_ZERO_ERROR;
-  std::int32_t needed = mapping(result.data(), icuLength(result.size()), text.data(), length,
-                                kRootLocale, &status);
+  std::int32_t needed =
+      mapping(result.data(), icuLength(result.size()), text.data(), length, kRootLocale, &status);
   if (status == U_BUFFER_OVERFLOW_ERROR) {
     status = U_ZERO_ERROR;
     result.resize(static_cast<std::size_t>(needed));

@@ -11,8 +11,8 @@ namespace wordcatcher {
 // linear in the text and safe for concurrent use. A text longer than 2^31 - 1 code units or bytes
 // is refused with std::length_error, since that is what ICU can count.
 
-/// UTF-8 form of a string, or nothing if it holds an unpaired surrogate: such a string has none, and
-/// a replacement character would make another string of it.
+/// UTF-8 form of a string, or nothing if it holds an unpaired surrogate: such a string has none,
+/// and a replacement character would make another string of it.
 std::optional<std::string> toUtf8(std::u16string_view text);
 
 /// The string that these bytes are the UTF-8 form of, or nothing if they are not well-formed.
