@@ -1,0 +1,45 @@
+#!/usr/bin/env bash
+# Installs a build into a temporary prefix, and builds and runs a host against it: once found by
+# CMake, once by pkg-config. Arguments: source directory, build directory, compiler flags.
+set -euo pipefail
+source=$1 build=$2 flags=$3
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+prefix=$work/prefix
+
+cmake --install "$build" --prefix "$prefix" >/dev/null
+# A moved tree must work as well: nothing in it may hold the place that it was installed to.
+mv "$prefix" "$work/moved"
+prefix=$work/moved
+libdir=$(dirname "$(find "$prefix" -name libwordcatcher.so)")
+export LD_LIBRARY_PATH=$libdir
+
+expected=$'1.0.0\n{KXWordcatch v:"golden retriever", dist: 1}'
+check() {
+  mkdir "$work/$1"
+  local output
+  output=$("$2" "$work/$1/")
+  [ "$output" = "$expected" ] || {
+    echo "the host built by $1 printed: $output" >&2
+    exit 1
+  }
+  echo "the host built by $1 works"
+}
+
+cmake -S "$source/examples/installed_host" -B "$work/host" -DCMAKE_PREFIX_PATH="$prefix" \
+  -DCMAKE_CXX_FLAGS="$flags" --log-level=WARNING
+cmake --build "$work/host" >/dev/null
+check cmake "$work/host/host"
+
+export PKG_CONFIG_PATH=$libdir/pkgconfig
+# shellcheck disable=SC2046
+g++ -std=c++20 $flags "$source/examples/installed_host/host.cpp" -o "$work/by_pkg_config" \
+  $(pkg-config --cflags --libs wordcatcher)
+check pkg-config "$work/by_pkg_config"
+
+# Every public header stands on its own.
+find "$prefix/include" -name '*.h' | while read -r header; do
+  echo "#include \"${header#"$prefix/include/"}\"" |
+    g++ -std=c++20 -Wall -Wextra -Wpedantic -Werror -fsyntax-only -I"$prefix/include" -x c++ -
+done
+echo "every installed header compiles by itself"

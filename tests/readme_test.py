@@ -1,0 +1,39 @@
+"""The README's examples, as they stand: the C++ one is compiled and run, the shell one typed."""
+
+import os
+import pathlib
+import re
+import subprocess
+import sys
+import tempfile
+import unittest
+
+SOURCE, WORDCATCHER, QUICK_START = (pathlib.Path(path) for path in sys.argv[1:4])
+README = (SOURCE / "README.md").read_text(encoding="utf-8")
+
+
+def block(language):
+    return re.search(rf"```{language}\n(.*?)```", README, re.DOTALL).group(1)
+
+
+class ReadmeTest(unittest.TestCase):
+    def test_quick_start_prints_what_the_readme_says(self):
+        with tempfile.TemporaryDirectory() as directory:
+            printed = subprocess.run([QUICK_START], cwd=directory, check=True, text=True,
+                                     stdout=subprocess.PIPE).stdout
+        self.assertEqual(printed, block("text"))
+
+    def test_shell_example_prints_what_the_readme_says(self):
+        environment = dict(os.environ, PATH=f"{WORDCATCHER.parent}:{os.environ['PATH']}")
+        with tempfile.TemporaryDirectory() as directory:
+            for step in block("console").split("$ ")[1:]:
+                command, _, expected = step.partition("\n")
+                with self.subTest(command=command):
+                    printed = subprocess.run(
+                        command, shell=True, cwd=directory, env=environment, text=True,
+                        check=False, stdout=subprocess.PIPE, stderr=subprocess.DEVNULL).stdout
+                    self.assertEqual(printed, expected)
+
+
+if __name__ == "__main__":
+    unittest.main(argv=sys.argv[:1])
