@@ -9,6 +9,7 @@
 #include <utility>
 #include <vector>
 
+#include "cli/Arguments.h"
 #include "cli/Failure.h"
 #include "cli/IndexDirectory.h"
 #include "cli/InputLines.h"
@@ -165,10 +166,9 @@ void addIndexVerb(CLI::App& program, ChosenVerb& chosen) {
   const auto arguments = std::make_shared<Arguments>();
   addModeOption(*verb, arguments->option);
   verb->add_flag("--verbose", arguments->verbose, "Show the storage log on standard error");
-  verb->add_option("DIR", arguments->directory, "The index directory")->required();
-  verb->add_option("FILE", arguments->files,
-                   "Files of phrases, \"-\" for standard input; without any, standard input")
-      ->allow_extra_args(false);
+  addArgument(*verb, "DIR", arguments->directory, "The index directory");
+  addArguments(*verb, "FILE", arguments->files,
+               "Files of phrases, \"-\" for standard input; without any, standard input");
   verb->footer(kFooter);
   verb->callback([arguments, &chosen] { chosen = [arguments] { return runIndex(*arguments); }; });
 }

@@ -83,6 +83,9 @@ void NewTables::createDirectory() {
   }
   const int code = errno;
   struct stat status {};
+  if (stat(_directory.name().c_str(), &status) == 0 && !S_ISDIR(status.st_mode)) {
+    throw Failure(quoted(_directory.name()) + " is not a directory: choose another name.");
+  }
   if (stat(_directory.path().c_str(), &status) != 0) {
     throw Failure("Cannot create the directory " + quoted(_directory.name()) + " (" +
                   errorText(code) + "): create its parent directory or choose another place.");

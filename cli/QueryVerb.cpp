@@ -8,6 +8,7 @@
 #include <variant>
 #include <vector>
 
+#include "cli/Arguments.h"
 #include "cli/Failure.h"
 #include "cli/IndexDirectory.h"
 #include "cli/Modes.h"
@@ -142,9 +143,8 @@ void addQueryVerb(CLI::App& program, ChosenVerb& chosen) {
   addModeOption(*verb, arguments->option);
   verb->add_flag("--json", arguments->json, "Print a JSON object a text");
   verb->add_flag("--verbose", arguments->verbose, "Show the storage log on standard error");
-  verb->add_option("DIR", arguments->directory, "The index directory")->required();
-  verb->add_option("TEXT", arguments->texts, "Texts; without any, the lines of standard input")
-      ->allow_extra_args(false);
+  addArgument(*verb, "DIR", arguments->directory, "The index directory");
+  addArguments(*verb, "TEXT", arguments->texts, "Texts; without any, the lines of standard input");
   verb->footer(kFooter);
   verb->callback([arguments, &chosen] { chosen = [arguments] { return runQuery(*arguments); }; });
 }

@@ -5,6 +5,7 @@
 #include <string>
 #include <vector>
 
+#include "cli/Arguments.h"
 #include "cli/Failure.h"
 #include "cli/IndexDirectory.h"
 #include "cli/Output.h"
@@ -105,9 +106,8 @@ void addSearchVerb(CLI::App& program, ChosenVerb& chosen) {
       ->capture_default_str();
   verb->add_flag("--json", arguments->json, "Print a JSON object a word");
   verb->add_flag("--verbose", arguments->verbose, "Show the storage log on standard error");
-  verb->add_option("DIR", arguments->directory, "The index directory")->required();
-  verb->add_option("WORD", arguments->words, "Words; without any, the lines of standard input")
-      ->allow_extra_args(false);
+  addArgument(*verb, "DIR", arguments->directory, "The index directory");
+  addArguments(*verb, "WORD", arguments->words, "Words; without any, the lines of standard input");
   verb->footer(kFooter);
   verb->callback([arguments, &chosen] { chosen = [arguments] { return runSearch(*arguments); }; });
 }

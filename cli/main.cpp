@@ -8,6 +8,7 @@
 #include <sstream>
 #include <string>
 
+#include "cli/Arguments.h"
 #include "cli/Failure.h"
 #include "cli/Output.h"
 #include "cli/Verbs.h"
@@ -83,7 +84,7 @@ ExitCode run(int argc, char** argv) {
     return kFailed;
   }
   try {
-    program.parse(argc, argv);
+    program.parse(shieldedArguments(argc, argv));
   } catch (const CLI::ParseError& error) {
     return endParsing(program, error);
   }
