@@ -88,10 +88,13 @@ std::vector<Phrase> readPhrases(std::vector<std::string> files) {
   return phrases;
 }
 
-Failure cannotIndex(const IndexDirectory& directory, const TableLog& log) {
-  return Failure("Cannot write the index in " + quoted(directory.name()) + " (" +
-                 errorText(log.errorCode()) +
-                 "): make room there or choose another directory, then index again.");
+void checkWritten(const IndexDirectory& directory, const TableLog& log) {
+  if (!log.failed()) {
+    return;
+  }
+  throw Failure("Cannot write the index in " + quoted(directory.name()) + " (" +
+                errorText(log.errorCode()) +
+                "): make room there or choose another directory, then index again.");
 }
 
 // A matcher that is destroyed finishes its tables, and half-written ones must stay unfinished. So a
@@ -105,9 +108,7 @@ void writeTables(const Arguments& arguments, const IndexDirectory& directory,
     const LockWatcher watcher(directory);
     unfinished->setMode(kWriting);
   }
-  if (log.failed()) {
-    throw cannotIndex(directory, log);
-  }
+  checkWritten(directory, log);
   tables.startWriting();
   ProgressBar progress(phrases.size());
   for (std::size_t i = 0; i < phrases.size() && !log.failed(); ++i) {
@@ -118,9 +119,7 @@ void writeTables(const Arguments& arguments, const IndexDirectory& directory,
     progress.say("Finishing the tables ...");
     unfinished->setMode(kClosed);
   }
-  if (log.failed()) {
-    throw cannotIndex(directory, log);
-  }
+  checkWritten(directory, log);
   delete std::exchange(unfinished, nullptr);
 }
 

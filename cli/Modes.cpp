@@ -22,10 +22,9 @@ constexpr std::array kModes{
 };
 
 std::vector<std::string> names() {
-  std::vector<std::string> all;
-  for (const auto& mode : kModes) {
-    all.emplace_back(mode.name);
-  }
+  std::vector<std::string> all(kModes.size());
+  std::transform(kModes.begin(), kModes.end(), all.begin(),
+                 [](const Mode& mode) { return mode.name; });
   return all;
 }
 

@@ -17,9 +17,9 @@ constexpr mode_t kDirectoryPermissions = 0777;
 constexpr mode_t kFilePermissions = 0666;
 constexpr std::size_t kHeaderBytes = 2048;
 
-Failure cannotWrite(const std::string& path, const std::string& reason) {
-  return Failure("Cannot write " + quoted(path) + " (" + reason +
-                 "): make the directory and its tables writable, or choose another directory.");
+[[noreturn]] void throwCannotWrite(const std::string& path, const std::string& reason) {
+  throw Failure("Cannot write " + quoted(path) + " (" + reason +
+                "): make the directory and its tables writable, or choose another directory.");
 }
 
 /// Whether no process holds the file's lock.
@@ -101,13 +101,13 @@ bool NewTables::createTable(const std::string& path) {
     descriptor = open(path.c_str(), O_RDWR | O_NOFOLLOW | O_CLOEXEC | O_NONBLOCK);
   }
   if (descriptor < 0) {
-    throw cannotWrite(path, errorText());
+    throwCannotWrite(path, errorText());
   }
   struct stat status {};
   const bool regular = fstat(descriptor, &status) == 0 && S_ISREG(status.st_mode);
   close(descriptor);
   if (!regular) {
-    throw cannotWrite(path, "not a regular file");
+    throwCannotWrite(path, "not a regular file");
   }
   return created;
 }

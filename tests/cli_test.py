@@ -265,6 +265,14 @@ class IndexTest(CommandTest):
         self.index()
         self.assertEqual(self.values("golden gate bridge"), [[BRIDGE]])
 
+    def test_failed_run_marks_the_tables_that_it_had_not_reached(self):
+        """Only edges grow before the failure; the other tables would still pass for the old ones."""
+        self.index("poodle\n", None, "--mode", "text")
+        self.fail_with("Cannot write the index", of=["index", "--mode", "text", self.dogs],
+                       stdin="retriever " * 120, preexec_fn=limit_file_size(100000))
+        for table, content in self.snapshot(self.dogs).items():
+            self.assertEqual(content[:2048], b"\0" * 2048, table)
+
     def test_progress_only_on_a_terminal(self):
         names = self.write("names.txt", DOGS)
         master, terminal = pty.openpty()
