@@ -7,7 +7,6 @@
 
 #include <algorithm>
 #include <cerrno>
-#include <cstdlib>
 #include <memory>
 
 #include "cli/Failure.h"
@@ -23,6 +22,9 @@ namespace {
 constexpr std::size_t kHeaderBytes = 2048;
 constexpr std::size_t kPairBytes = 8;
 constexpr std::uint64_t kSlotBytes = 8;
+
+// Links to the files that this process has open.
+const std::string kDescriptors = "/proc/self/fd/";
 
 using Header = std::array<unsigned char, kHeaderBytes>;
 
@@ -139,7 +141,7 @@ std::uint64_t IndexDirectory::tableBytes() const {
 }
 
 std::optional<std::size_t> IndexDirectory::lastOpenTable() const {
-  const std::unique_ptr<DIR, CloseDirectory> descriptors(opendir("/proc/self/fd"));
+  const std::unique_ptr<DIR, CloseDirectory> descriptors(opendir(kDescriptors.c_str()));
   std::array<struct stat, kTables> tables{};
   std::array<bool, kTables> exists{};
   for (std::size_t i = 0; i < kTables; ++i) {
@@ -152,9 +154,7 @@ std::optional<std::size_t> IndexDirectory::lastOpenTable() const {
       break;
     }
     struct stat open {};
-    char* end = nullptr;
-    const long descriptor = std::strtol(entry->d_name, &end, 10);
-    if (*end != '\0' || fstat(static_cast<int>(descriptor), &open) != 0) {
+    if (stat((kDescriptors + entry->d_name).c_str(), &open) != 0) {
       continue;
     }
     for (std::size_t i = 0; i < kTables; ++i) {
