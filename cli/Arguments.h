@@ -1,0 +1,29 @@
+#ifndef WORDCATCHER_CLI_ARGUMENTS_H
+#define WORDCATCHER_CLI_ARGUMENTS_H
+
+#include <string>
+#include <vector>
+
+namespace CLI {
+class App;
+}
+
+namespace wordcatcher::cli {
+
+/// The command line as the parser is given it, in CLI11's order: the last argument first. CLI11
+/// takes "[a, b]" for a list of arguments, and "--" for the end of the verb's own arguments.
+/// Neither suits texts, so that texts in brackets and everything after "--" go in with a mark in
+/// front.
+std::vector<std::string> shieldedArguments(int argc, char** argv);
+
+/// Adds a required positional argument whose value arrives as the user wrote it.
+void addArgument(CLI::App& verb, const std::string& name, std::string& value,
+                 const std::string& description);
+
+/// Adds a positional argument that may be repeated or left out.
+void addArguments(CLI::App& verb, const std::string& name, std::vector<std::string>& values,
+                  const std::string& description);
+
+}  // namespace wordcatcher::cli
+
+#endif

@@ -1,0 +1,58 @@
+#ifndef WORDCATCHER_CLI_INDEXDIRECTORY_H
+#define WORDCATCHER_CLI_INDEXDIRECTORY_H
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <functional>
+#include <optional>
+#include <string>
+
+namespace wordcatcher::cli {
+
+class TableLog;
+
+/// The directory of an index and its three table files.
+class IndexDirectory {
+ public:
+  static constexpr std::size_t kTables = 3;
+
+  /// `directory` with or without its trailing "/"; Failure if it is empty.
+  explicit IndexDirectory(const std::string& directory);
+
+  /// As the user wrote it, for messages.
+  const std::string& name() const noexcept { return _name; }
+
+  /// With its trailing "/", as the library wants it.
+  const std::string& path() const noexcept { return _path; }
+
+  /// The table files in the order in which the library opens them: edges, data, final states.
+  const std::array<std::string, kTables>& tables() const noexcept { return _tables; }
+
+  /// Has `open` open the tables for reading, says so when that waits for another process, and
+  /// checks what was opened. Failure if the directory or a table is missing, cannot be read, or is
+  /// no finished table.
+  void openForReading(const TableLog& log, const std::function<void()>& open) const;
+
+  /// Failure if a look-up so far could not read what a table holds.
+  void checkLookups(const TableLog& log) const;
+
+  /// Bytes of the three tables; a longer file's tail that an earlier index left does not count.
+  /// Failure if one of them is no finished table.
+  std::uint64_t tableBytes() const;
+
+  /// The last of the tables() that this process has open, by its place there. While the library
+  /// opens tables it is the one whose lock is being waited for; those before it are locked by us.
+  std::optional<std::size_t> lastOpenTable() const;
+
+ private:
+  void checkReadable() const;
+
+  std::string _name;
+  std::string _path;
+  std::array<std::string, kTables> _tables;
+};
+
+}  // namespace wordcatcher::cli
+
+#endif

@@ -1,0 +1,629 @@
+"""What the wordcatcher command promises, tried on the built program.
+
+Usage: cli_test.py PROGRAM VERSION [unittest arguments]
+"""
+
+import contextlib
+import fcntl
+import json
+import os
+import pty
+import resource
+import select
+import shutil
+import signal
+import subprocess
+import sys
+import tempfile
+import time
+import unittest
+
+PROGRAM = ""
+VERSION = ""
+
+EDGES, DATA, FINALS = TABLES = ("edgeTable.tdb", "dataTable.tdb", "finalTable.tdb")
+PATIENCE = 30
+
+DOGS = "golden retriever puppy\t7\ngolden gate bridge\t8\n"
+PUPPY = "golden retriever puppy{ 7 }"
+BRIDGE = "golden gate bridge{ 8 }"
+
+
+def limit_file_size(limit):
+    return lambda: resource.setrlimit(resource.RLIMIT_FSIZE, (limit, limit))
+
+
+def many_phrases(count):
+    return "".join(f"retriever number{i} kennel{i}\n" for i in range(count))
+
+
+@contextlib.contextmanager
+def locked(path):
+    """Holds a file's lock as another process with the table open does."""
+    with open(path, "rb") as file:
+        fcntl.flock(file, fcntl.LOCK_EX)
+        yield
+
+
+class CommandTest(unittest.TestCase):
+    def setUp(self):
+        self.root = tempfile.mkdtemp(prefix="wordcatcher-cli-")
+        self.addCleanup(shutil.rmtree, self.root)
+        self.dogs = self.path("dogs")
+
+    def path(self, *names):
+        return os.path.join(self.root, *names)
+
+    def write(self, name, content):
+        with open(self.path(name), "wb") as file:
+            file.write(content if isinstance(content, bytes) else content.encode())
+        return self.path(name)
+
+    def run_it(self, *arguments, stdin="", **options):
+        stdin = stdin if isinstance(stdin, bytes) else stdin.encode()
+        done = subprocess.run([PROGRAM, *arguments], input=stdin, capture_output=True,
+                              timeout=PATIENCE, **options)
+        self.out, self.err = done.stdout.decode(), done.stderr.decode()
+        return done.returncode
+
+    def succeed(self, *arguments, **options):
+        code = self.run_it(*arguments, **options)
+        self.assertEqual(code, 0, self.err)
+        return self.out
+
+    def fail_with(self, *words, of, **options):
+        """The command must fail with one line on standard error that holds these words."""
+        self.assertEqual(self.run_it(*of, **options), 2, self.err)
+        self.assertEqual(self.out, "")
+        self.assertEqual(self.err.count("\n"), 1, self.err)
+        self.assertTrue(self.err.startswith("wordcatcher: "), self.err)
+        for word in words:
+            self.assertIn(word, self.err)
+
+    def index(self, phrases=DOGS, directory=None, *options):
+        self.succeed("index", *options, directory or self.dogs, stdin=phrases)
+
+    def start(self, *arguments, **options):
+        process = subprocess.Popen([PROGRAM, *arguments], stdin=subprocess.PIPE,
+                                   stdout=subprocess.PIPE, stderr=subprocess.PIPE, **options)
+        self.addCleanup(self.stop, process)
+        return process
+
+    @staticmethod
+    def stop(process):
+        if process.poll() is None:
+            process.kill()
+        process.wait()
+        for stream in (process.stdin, process.stdout, process.stderr):
+            if not stream.closed:
+                with contextlib.suppress(BrokenPipeError):
+                    stream.close()
+
+    def line_of(self, stream):
+        ready, _, _ = select.select([stream], [], [], PATIENCE)
+        self.assertTrue(ready, "nothing came")
+        return stream.readline().decode()
+
+    def wait_until(self, condition):
+        deadline = time.monotonic() + PATIENCE
+        while not condition():
+            self.assertLess(time.monotonic(), deadline, "waited in vain")
+            time.sleep(0.01)
+
+    def snapshot(self, directory):
+        content = {}
+        for name in sorted(os.listdir(directory)):
+            with open(os.path.join(directory, name), "rb") as file:
+                content[name] = file.read()
+        return content
+
+
+class ProgramTest(CommandTest):
+    def test_without_arguments_shows_help_on_standard_error(self):
+        self.assertEqual(self.run_it(), 2)
+        self.assertEqual(self.out, "")
+        for verb in ("index", "query", "search"):
+            self.assertIn(verb, self.err)
+
+    def test_version(self):
+        self.assertEqual(self.succeed("--version"), f"wordcatcher {VERSION}\n")
+
+    def test_help_has_examples(self):
+        self.assertIn("Examples:", self.succeed("--help"))
+        for verb in ("index", "query", "search"):
+            help_text = self.succeed(verb, "--help")
+            self.assertIn(f"Usage: wordcatcher {verb}", help_text)
+            self.assertIn(f"  wordcatcher {verb} ", help_text.split("Examples:")[1])
+            self.assertEqual(self.err, "")
+
+    def test_wrong_usage(self):
+        self.fail_with("--help", of=["fetch"])
+        self.fail_with("wordcatcher query --help", of=["query"])
+        self.fail_with("--nonsense", of=["query", "--nonsense", self.dogs])
+        self.fail_with("sounds", "words", "text", of=["query", "--mode", "sounds", self.dogs])
+        self.fail_with("sounds", of=["index", "--mode", "sounds", self.dogs])
+        self.assertFalse(os.path.exists(self.dogs))
+
+    def test_help_that_cannot_be_written(self):
+        with open("/dev/full", "wb") as full:
+            done = subprocess.run([PROGRAM, "--help"], stdout=full, stderr=subprocess.PIPE)
+        self.assertEqual(done.returncode, 2)
+
+
+class IndexTest(CommandTest):
+    def values(self, *texts, options=()):
+        lines = self.succeed("query", "--json", *options, self.dogs, *texts).splitlines()
+        return [[match["value"] for match in json.loads(line)["matches"] or []] for line in lines]
+
+    def test_reports_phrases_words_bytes_and_time(self):
+        self.index()
+        size = sum(len(content) for content in self.snapshot(self.dogs).values())
+        self.assertRegex(self.err,
+                         rf"^Indexed 2 phrases \(6 words\) into {size} bytes in \d+\.\d\d s\.\n$")
+        self.assertEqual(self.out, "")
+        self.assertEqual(sorted(os.listdir(self.dogs)), sorted(TABLES))
+
+    def test_counts_only_the_new_tables_when_a_larger_index_stood_there(self):
+        self.index("poodle\n")
+        small = self.err.split(" in ")[0]
+        self.index(many_phrases(50))
+        self.index("poodle\n")
+        self.assertEqual(self.err.split(" in ")[0], small)
+        self.assertEqual(self.values("retriever", "poodle"), [[], ["poodle"]])
+
+    def test_data_is_the_phrase_with_its_fields_in_braces(self):
+        self.index("golden retriever\t7, gold\nborder collie\ngreat dane\t\n")
+        self.assertEqual(self.values("golden retriever", "border collie", "great dane"),
+                         [["golden retriever{ 7, gold }"], ["border collie"], ["great dane"]])
+
+    def test_reads_files_and_standard_input(self):
+        names = self.write("names.txt", "border collie\n")
+        more = self.write("more.txt", "great dane")
+        self.succeed("index", self.dogs, names, "-", more, stdin="golden retriever\n")
+        self.assertIn("Indexed 3 phrases (6 words)", self.err)
+        self.assertEqual(self.values("border collie", "great dane", "golden retriever"),
+                         [["border collie"], ["great dane"], ["golden retriever"]])
+
+    def test_files_of_other_systems(self):
+        self.index(b"\xef\xbb\xbfborder collie\r\n\r\n  \t \r\ngreat dane\t3\r\n")
+        self.assertIn("Indexed 2 phrases", self.err)
+        self.assertEqual(self.values("border collie", "great dane"),
+                         [["border collie"], ["great dane{ 3 }"]])
+
+    def test_text_mode(self):
+        self.index("The Great Gatsby\t1925\n", None, "--mode", "text")
+        self.assertEqual(self.values("the grate gatsby", options=["--mode", "text"]),
+                         [["the great gatsby"]])
+        self.assertEqual(self.run_it("query", self.dogs, "gatsby"), 1)
+
+    def test_no_phrases_make_an_empty_index(self):
+        self.index("\n")
+        self.assertIn("Indexed 0 phrases (0 words)", self.err)
+        self.assertEqual(self.run_it("query", self.dogs, "golden"), 1)
+
+    def test_directory_with_a_slash_and_without(self):
+        self.index(DOGS, self.dogs + "/")
+        self.succeed("query", self.dogs, "golden gate bridge")
+        self.succeed("search", self.dogs + "/", "golden")
+        self.assertEqual(os.listdir(self.root), ["dogs"])
+
+    def test_invalid_utf8_leaves_everything_as_it_was(self):
+        self.index()
+        before = self.snapshot(self.dogs)
+        bad = self.write("names.txt", b"border collie\ngr\xf6\xdfe\n")
+        self.fail_with(f"{bad}, line 2", "UTF-8", of=["index", self.dogs, bad])
+        self.fail_with("standard input, line 1", of=["index", self.dogs], stdin=b"\xff\n")
+        self.assertEqual(self.snapshot(self.dogs), before)
+        self.fail_with("line 2", of=["index", self.path("new"), bad])
+        self.assertFalse(os.path.exists(self.path("new")))
+
+    def test_input_that_cannot_be_stored(self):
+        self.fail_with("line 2", "zero byte", of=["index", self.dogs], stdin="collie\nda\0ne\n")
+        self.fail_with("line 1", "no phrase", of=["index", self.dogs], stdin="\t7\n")
+        self.fail_with("absent.txt", of=["index", self.dogs, self.path("absent.txt")])
+        self.fail_with(self.root, of=["index", self.dogs, self.root])
+        self.fail_with("empty", of=["index", ""])
+        self.assertFalse(os.path.exists(self.dogs))
+
+    def test_directory_that_cannot_be_written(self):
+        file = self.write("names.txt", "")
+        self.fail_with("not a directory", of=["index", file], stdin=DOGS)
+        self.fail_with("parent", of=["index", self.path("names.txt", "dogs")], stdin=DOGS)
+        self.fail_with("parent", of=["index", self.path("no", "dogs")], stdin=DOGS)
+        self.fail_with("/proc/self", "writable", of=["index", "/proc/self"], stdin=DOGS)
+
+    def test_table_that_cannot_be_written(self):
+        os.mkdir(self.dogs)
+        os.symlink(self.path("elsewhere"), self.path("dogs", DATA))
+        self.fail_with(DATA, of=["index", self.dogs], stdin=DOGS)
+        self.assertEqual(os.listdir(self.dogs), [DATA])
+        self.assertFalse(os.path.exists(self.path("elsewhere")))
+        os.remove(self.path("dogs", DATA))
+        os.mkfifo(self.path("dogs", FINALS))
+        self.fail_with(FINALS, "regular file", of=["index", self.dogs], stdin=DOGS)
+        self.assertEqual(os.listdir(self.dogs), [FINALS])
+
+    def test_full_disk_leaves_no_directory_behind(self):
+        for limit in (1024, 4096, 20000):
+            self.fail_with("Cannot write the index", "File too large", "room",
+                           of=["index", self.dogs], stdin=many_phrases(300),
+                           preexec_fn=limit_file_size(limit))
+            self.assertFalse(os.path.exists(self.dogs), limit)
+
+    def test_full_disk_leaves_no_new_tables_behind(self):
+        os.mkdir(self.dogs)
+        self.write("dogs/notes.txt", "mine")
+        self.fail_with("Cannot write the index", of=["index", self.dogs],
+                       stdin=DOGS, preexec_fn=limit_file_size(1024))
+        self.assertEqual(os.listdir(self.dogs), ["notes.txt"])
+
+    def test_full_disk_leaves_no_half_made_index_in_place_of_the_old_one(self):
+        self.index()
+        self.fail_with("Cannot write the index", of=["index", self.dogs],
+                       stdin=many_phrases(300), preexec_fn=limit_file_size(20000))
+        self.fail_with("unfinished", "wordcatcher index", of=["query", self.dogs, "golden"])
+        self.index()
+        self.assertEqual(self.values("golden gate bridge"), [[BRIDGE]])
+
+    def test_failed_run_marks_the_tables_that_it_had_not_reached(self):
+        """Only edges grow before the failure; the other tables would still pass for the old ones."""
+        self.index("poodle\n", None, "--mode", "text")
+        self.fail_with("Cannot write the index", of=["index", "--mode", "text", self.dogs],
+                       stdin="retriever " * 120, preexec_fn=limit_file_size(100000))
+        for table, content in self.snapshot(self.dogs).items():
+            self.assertEqual(content[:2048], b"\0" * 2048, table)
+
+    def test_progress_only_on_a_terminal(self):
+        names = self.write("names.txt", DOGS)
+        master, terminal = pty.openpty()
+        with open(master, "rb", buffering=0) as screen:
+            done = subprocess.run([PROGRAM, "index", self.dogs, names], stderr=terminal,
+                                  timeout=PATIENCE)
+            os.close(terminal)
+            shown = b""
+            with contextlib.suppress(OSError):
+                while chunk := screen.read(4096):
+                    shown += chunk
+        self.assertEqual(done.returncode, 0)
+        self.assertIn(b"% of 2 phrases", shown)
+        self.assertIn(b"\r\x1b[KIndexed 2 phrases", shown)
+        self.succeed("index", self.dogs, names)
+        self.assertNotIn("\r", self.err)
+
+    def test_verbose_shows_the_storage_log(self):
+        self.succeed("index", "--verbose", self.dogs, stdin=DOGS)
+        self.assertIn(f"-[TinyCDB setMode:] Finalizing {self.dogs}/{EDGES}\n", self.err)
+        self.succeed("query", "--verbose", self.dogs, "golden gate bridge")
+        self.assertIn("-[TinyCDB valuesFor:] Could not init query", self.err)
+        self.succeed("query", self.dogs, "golden gate bridge")
+        self.assertEqual(self.err, "")
+
+
+class QueryTest(CommandTest):
+    def setUp(self):
+        super().setUp()
+        self.index()
+
+    def test_plain_output(self):
+        self.assertEqual(self.succeed("query", self.dogs, "a goldan retriver"), f"4\t{PUPPY}\n")
+
+    def test_several_texts_have_headings_and_counts_of_their_own(self):
+        texts = ["a goldan retriver", "xyzzy", "goldan xyzzy", "a goldan retriver"]
+        found = f"a goldan retriver\n4\t{PUPPY}\n"
+        expected = f"{found}xyzzy\ngoldan xyzzy\n{found}"
+        self.assertEqual(self.succeed("query", self.dogs, *texts), expected)
+        self.assertEqual(self.succeed("query", self.dogs, stdin="\n".join(texts)), expected)
+
+    def test_json(self):
+        out = self.succeed("query", "--json", self.dogs, "a goldan retriver", "xyzzy",
+                           "goldan xyzzy")
+        self.assertEqual(out, '{"query":"a goldan retriver","matches":[{"value":"' + PUPPY +
+                         '","distance":4}]}\n'
+                         '{"query":"xyzzy","matches":null}\n'
+                         '{"query":"goldan xyzzy","matches":[]}\n')
+
+    def test_json_keeps_utf8_and_its_order(self):
+        self.index("größe ﬀ\ngröße 𝄞\ngröße a\n")
+        line = self.succeed("query", "--json", self.dogs, "GRÖßE")
+        self.assertEqual(line, '{"query":"GRÖßE","matches":['
+                         '{"value":"größe a","distance":0},'
+                         '{"value":"größe 𝄞","distance":0},'
+                         '{"value":"größe ﬀ","distance":0}]}\n')
+
+    def test_text_mode_has_data_and_one_order(self):
+        self.index("coats\nCoats\ncats\nbat\tb\ncart\n", None, "--mode", "text")
+        out = self.succeed("query", "--mode", "text", "--json", self.dogs, "cat")
+        self.assertEqual(out, '{"query":"cat","matches":['
+                         '{"value":"bat","distance":1,"data":["bat{ b }"]},'
+                         '{"value":"cart","distance":1,"data":["cart"]},'
+                         '{"value":"cats","distance":1,"data":["cats"]},'
+                         '{"value":"coats","distance":2,"data":["Coats","coats"]}]}\n')
+        self.assertEqual(self.succeed("query", "--mode", "text", self.dogs, "cat"),
+                         "1\tbat\n1\tcart\n1\tcats\n2\tcoats\n")
+        self.assertEqual(self.run_it("query", "--mode", "text", "--json", self.dogs, "zebra"), 1)
+        self.assertEqual(self.out, '{"query":"zebra","matches":[]}\n')
+
+    def test_exit_code_tells_whether_anything_matched(self):
+        self.assertEqual(self.run_it("query", self.dogs, "xyzzy"), 1)
+        self.assertEqual((self.out, self.err), ("", ""))
+        self.assertEqual(self.run_it("query", self.dogs, "goldan xyzzy"), 1)
+        self.assertEqual(self.run_it("query", self.dogs, "xyzzy", "golden gate bridge"), 0)
+        self.assertEqual(self.run_it("query", self.dogs, stdin=""), 1)
+
+    def test_texts_arrive_as_they_are_written(self):
+        texts = ["[golden, bridge]", "{}", "", "--json", "-x", "index", "%%", "\x01", 'a "b"\\']
+        out = self.succeed("query", "--json", self.dogs, "--", *texts)
+        self.assertEqual([json.loads(line)["query"] for line in out.splitlines()], texts)
+        out = self.succeed("query", self.dogs, "[golden gate bridge]", "--json")
+        self.assertEqual(json.loads(out)["query"], "[golden gate bridge]")
+
+    def test_lines_of_standard_input(self):
+        out = self.succeed("query", "--json", self.dogs,
+                           stdin=b"\xef\xbb\xbfgolden gate bridge\r\n\nxyzzy")
+        self.assertEqual([json.loads(line)["query"] for line in out.splitlines()],
+                         ["golden gate bridge", "", "xyzzy"])
+
+    def test_invalid_utf8(self):
+        self.fail_with("Text 2", "UTF-8", of=["query", self.dogs, "golden", b"\xff"])
+        self.fail_with("standard input, line 1", of=["query", self.dogs], stdin=b"\xff\n")
+        code = self.run_it("query", "--json", self.dogs, stdin=b"golden gate bridge\n\xff\n")
+        self.assertEqual(code, 2)
+        self.assertEqual(len(self.out.splitlines()), 1)
+        self.assertIn("standard input, line 2", self.err)
+
+    def test_answers_each_line_before_the_next_one_comes(self):
+        process = self.start("query", "--json", self.dogs)
+        for text in ("golden gate bridge", "xyzzy", "goldan"):
+            process.stdin.write(text.encode() + b"\n")
+            process.stdin.flush()
+            self.assertEqual(json.loads(self.line_of(process.stdout))["query"], text)
+        process.stdin.close()
+        self.assertEqual(process.wait(PATIENCE), 0)
+
+    def test_reader_that_goes_away(self):
+        texts = self.write("texts.txt", "golden gate bridge\n" * 5000)
+        for verb in ("query", "search"):
+            with open(texts, "rb") as stdin:
+                process = subprocess.Popen([PROGRAM, verb, "--json", self.dogs], stdin=stdin,
+                                           stdout=subprocess.PIPE, stderr=subprocess.PIPE)
+            self.assertTrue(process.stdout.readline())
+            process.stdout.close()
+            self.assertEqual(process.stderr.read(), b"")
+            process.stderr.close()
+            self.assertIn(process.wait(PATIENCE), (0, 1))
+
+    def test_output_that_cannot_be_written(self):
+        for redirection in (">/dev/full", ">&-"):
+            done = subprocess.run(["sh", "-c", f'"$0" query "$1" golden gate bridge {redirection}',
+                                   PROGRAM, self.dogs], capture_output=True, timeout=PATIENCE)
+            self.assertEqual(done.returncode, 2, done.stderr)
+            self.assertIn(b"Cannot write standard output", done.stderr)
+        self.succeed("query", self.dogs, "golden gate bridge")
+
+    def test_closed_standard_input(self):
+        done = subprocess.run(["sh", "-c", '"$0" query "$1" <&-', PROGRAM, self.dogs],
+                              capture_output=True, timeout=PATIENCE)
+        self.assertEqual(done.returncode, 2)
+        self.assertIn(b"standard input", done.stderr)
+
+
+class SearchTest(CommandTest):
+    def setUp(self):
+        super().setUp()
+        self.index()
+
+    def test_plain_output(self):
+        self.assertEqual(self.succeed("search", self.dogs, "Goldan"),
+                         f"1\tgolden\t{BRIDGE} | {PUPPY}\n")
+
+    def test_several_words_have_headings(self):
+        expected = f"gold\n2\tgolden\t{BRIDGE} | {PUPPY}\nxyzzy\npupy\n1\tpuppy\t{PUPPY}\n"
+        self.assertEqual(self.succeed("search", self.dogs, "gold", "xyzzy", "pupy"), expected)
+        self.assertEqual(self.succeed("search", self.dogs, stdin="gold\nxyzzy\r\npupy"), expected)
+
+    def test_json(self):
+        out = self.succeed("search", "--json", self.dogs, "goldan", "xyzzy")
+        self.assertEqual(out, '{"word":"goldan","matches":[{"value":"golden","distance":1,'
+                         f'"data":["{BRIDGE}","{PUPPY}"]}}]}}\n'
+                         '{"word":"xyzzy","matches":[]}\n')
+
+    def test_order_is_the_search_s_own(self):
+        self.index("cart\nbat\nbat\tb\ncat\n")
+        out = self.succeed("search", "--json", self.dogs, "cat")
+        self.assertEqual([match["value"] for match in json.loads(out)["matches"]],
+                         ["bat", "cat", "cart"])
+
+    def test_max_distance(self):
+        def found(distance):
+            return self.run_it("search", "--max-distance", str(distance), self.dogs, "gilden gite")
+        self.index("golden gate\n", None, "--mode", "text")
+        self.assertEqual([found(distance) for distance in range(7)], [1, 1, 0, 0, 0, 0, 0])
+        for distance in ("7", "-1", "many", "1.5"):
+            self.fail_with("--max-distance",
+                           of=["search", "--max-distance", distance, self.dogs, "golden"])
+
+    def test_exit_code_tells_whether_anything_matched(self):
+        self.assertEqual(self.run_it("search", self.dogs, "xyzzy"), 1)
+        self.assertEqual((self.out, self.err), ("", ""))
+        self.assertEqual(self.run_it("search", self.dogs, "xyzzy", "golden"), 0)
+
+    def test_answers_each_line_before_the_next_one_comes(self):
+        process = self.start("search", "--json", self.dogs)
+        for word in ("golden", "xyzzy"):
+            process.stdin.write(word.encode() + b"\n")
+            process.stdin.flush()
+            self.assertEqual(json.loads(self.line_of(process.stdout))["word"], word)
+
+
+class DamagedIndexTest(CommandTest):
+    def check(self, *words):
+        for verb in ("query", "search"):
+            self.fail_with(*words, of=[verb, self.dogs, "golden"])
+
+    def test_missing_directory(self):
+        self.check("dogs", "wordcatcher index")
+        self.assertFalse(os.path.exists(self.dogs))
+        self.write("dogs", "a file")
+        self.check("Not a directory")
+
+    def test_missing_table(self):
+        os.mkdir(self.dogs)
+        self.check(EDGES, "wordcatcher index")
+        self.assertEqual(os.listdir(self.dogs), [])
+        self.index()
+        os.remove(self.path("dogs", FINALS))
+        self.check(FINALS)
+
+    def test_table_that_is_no_file(self):
+        self.index()
+        os.remove(self.path("dogs", DATA))
+        os.mkdir(self.path("dogs", DATA))
+        self.check(DATA, "regular file")
+        os.rmdir(self.path("dogs", DATA))
+        os.mkfifo(self.path("dogs", DATA))
+        self.check(DATA, "regular file")
+
+    def test_file_that_is_no_table(self):
+        for table in TABLES:
+            for content in (b"", b"x" * 2047, b"\0" * 2048, b"golden " * 1000, b"\xff" * 4096):
+                self.index()
+                self.write(f"dogs/{table}", content)
+                self.check(table, "wordcatcher index")
+
+    def test_truncated_table(self):
+        for table in TABLES:
+            self.index()
+            os.truncate(self.path("dogs", table), os.path.getsize(self.path("dogs", table)) - 1)
+            self.check(table, "damaged")
+
+
+class LockTest(CommandTest):
+    def said(self, process):
+        start = time.monotonic()
+        line = self.line_of(process.stderr)
+        return line, time.monotonic() - start
+
+    def test_says_which_table_it_waits_for_and_goes_on(self):
+        self.index()
+        self.index(DOGS, self.path("other"))
+        for table in TABLES[1:]:
+            with locked(self.path("dogs", table)), locked(self.path("other", table)):
+                waiting = [self.start("query", self.dogs, "golden gate bridge"),
+                           self.start("index", self.path("other"))]
+                waiting[1].stdin.write(b"great dane\n")
+                waiting[1].stdin.close()
+                line, seconds = self.said(waiting[0])
+                self.assertIn(f"waiting for \"{self.path('dogs', table)}\"", line)
+                self.assertGreater(seconds, 1.5)
+                line, _ = self.said(waiting[1])
+                self.assertIn(f"waiting for \"{self.path('other', table)}\"", line)
+                self.assertTrue(all(process.poll() is None for process in waiting))
+            self.assertEqual(waiting[0].wait(PATIENCE), 0)
+            self.assertEqual(waiting[0].stdout.read().decode(), f"0\t{BRIDGE}\n")
+            self.assertEqual(waiting[1].wait(PATIENCE), 0)
+            self.assertIn("Indexed 1 phrase", waiting[1].stderr.read().decode())
+        self.succeed("query", self.path("other"), "great dane")
+
+    def test_short_wait_is_silent(self):
+        self.index()
+        with locked(self.path("dogs", EDGES)):
+            process = self.start("search", self.dogs, "golden")
+            time.sleep(0.5)
+            self.assertIsNone(process.poll())
+        self.assertEqual(process.wait(PATIENCE), 0)
+        self.assertEqual(process.stderr.read(), b"")
+
+    def test_reads_what_another_process_finished_meanwhile(self):
+        os.mkdir(self.dogs)
+        self.index(DOGS, self.path("other"))
+        for table in TABLES:
+            self.write(f"dogs/{table}", b"")
+        with locked(self.path("dogs", EDGES)):
+            process = self.start("query", self.dogs, "golden gate bridge")
+            time.sleep(0.3)
+            for name, content in self.snapshot(self.path("other")).items():
+                self.write(f"dogs/{name}", content)
+        self.assertEqual(process.wait(PATIENCE), 0)
+
+    def interrupt_waiting(self, number, *arguments):
+        process = self.start(*arguments)
+        process.stdin.write(DOGS.encode())
+        process.stdin.close()
+        self.wait_until(lambda: self.has_open(process, DATA))
+        process.send_signal(number)
+        self.assertEqual(process.wait(5), -number)
+        self.assertEqual(process.stderr.read(), b"")
+
+    @staticmethod
+    def has_open(process, table):
+        descriptors = f"/proc/{process.pid}/fd"
+        names = []
+        for descriptor in os.listdir(descriptors):
+            with contextlib.suppress(FileNotFoundError):
+                names.append(os.readlink(os.path.join(descriptors, descriptor)))
+        # Every other table is open only for a moment before the waiting begins.
+        return any(name.endswith(table) for name in names) and \
+            any(name.endswith(EDGES) for name in names)
+
+    def test_interrupt_ends_waiting_and_keeps_the_old_index(self):
+        self.index()
+        before = self.snapshot(self.dogs)
+        with locked(self.path("dogs", DATA)):
+            for number in (signal.SIGINT, signal.SIGTERM, signal.SIGHUP):
+                self.interrupt_waiting(number, "index", self.dogs)
+            self.interrupt_waiting(signal.SIGINT, "query", self.dogs, "golden")
+            self.interrupt_waiting(signal.SIGINT, "search", self.dogs, "golden")
+        self.assertEqual(self.snapshot(self.dogs), before)
+
+    def test_interrupt_while_waiting_takes_new_tables_away(self):
+        os.mkdir(self.dogs)
+        self.write(f"dogs/{DATA}", b"")
+        with locked(self.path("dogs", DATA)):
+            self.interrupt_waiting(signal.SIGINT, "index", self.dogs)
+        self.assertEqual(os.listdir(self.dogs), [DATA])
+
+
+class InterruptTest(CommandTest):
+    def interrupt_indexing(self):
+        """Interrupts while table files are growing: the edges under one prefix make finishing slow."""
+        names = self.write("names.txt", many_phrases(40000))
+        edges = self.path("dogs", EDGES)
+        before = os.stat(edges).st_mtime_ns if os.path.exists(edges) else None
+
+        def growing():
+            return (os.path.exists(edges) and os.path.getsize(edges) > 0
+                    and os.stat(edges).st_mtime_ns != before)
+
+        process = self.start("index", self.dogs, names)
+        self.wait_until(growing)
+        process.send_signal(signal.SIGINT)
+        self.assertEqual(process.wait(5), -signal.SIGINT)
+        self.assertEqual(process.stderr.read(), b"")
+
+    def test_interrupt_leaves_no_directory_behind(self):
+        self.interrupt_indexing()
+        self.assertFalse(os.path.exists(self.dogs))
+
+    def test_interrupt_leaves_no_half_made_index_in_place_of_the_old_one(self):
+        self.index()
+        self.interrupt_indexing()
+        self.fail_with("unfinished", of=["query", self.dogs, "golden"])
+
+    def test_ignored_signals_stay_ignored(self):
+        self.index()
+        with locked(self.path("dogs", EDGES)):
+            process = self.start("index", self.dogs,
+                                 preexec_fn=lambda: signal.signal(signal.SIGHUP, signal.SIG_IGN))
+            process.stdin.write(b"great dane\n")
+            process.stdin.close()
+            time.sleep(0.3)
+            process.send_signal(signal.SIGHUP)
+            time.sleep(0.2)
+            self.assertIsNone(process.poll())
+        self.assertEqual(process.wait(PATIENCE), 0)
+        self.succeed("query", self.dogs, "great dane")
+
+
+if __name__ == "__main__":
+    PROGRAM, VERSION = os.path.abspath(sys.argv[1]), sys.argv[2]
+    unittest.main(argv=[sys.argv[0], *sys.argv[3:]])
