@@ -1,6 +1,6 @@
-#include <iostream>
 #include <wordcatcher/Version.h>
 #include <wordcatcher/matcher/KXWordcatcher.h>
+#include <iostream>
 
 int main(int, char** arguments) {
   wordcatcher::KXWordcatcher matcher(arguments[1], 0);

@@ -1,0 +1,225 @@
+#ifndef WORDCATCHER_FUZZY_BANDEDAUTOMATON_H
+#define WORDCATCHER_FUZZY_BANDEDAUTOMATON_H
+
+// The Levenshtein automaton of a query, simulated in one 64-bit word.
+//
+// A state (p, e) means: p code units of the query are accounted for, at a cost of e edits. After d
+// code units of a stored word have been read, p lies within K of d, where K is the greatest number
+// of edits: every other p costs more. So the set of states is kept as K + 1 rows, one for each e,
+// of 2K + 1 columns, one for each p - d from -K to K: 45 bits at most, for K = 4.
+//
+// Reading one more code unit moves the columns along with d. A match (p + 1, e) stays in its
+// column; an extra code unit (p, e + 1) goes one column down and one row up; a replaced one (p + 1,
+// e + 1) only one row up; a missing one (p + 1, e + 1, without reading) goes one column and one row
+// up.
+//
+// The method of rows is that of Wu and Manber, "Fast text searching allowing errors" (1992); moving
+// the columns along with the text is that of Ukkonen's band (1985).
+
+#include <bit>
+#include <cstddef>
+#include <cstdint>
+#include <span>
+#include <vector>
+
+#include "wordcatcher/storage/SearchImageFormat.h"
+
+namespace wordcatcher {
+
+/// A code unit of a query: the label that it has in an image (0: no word holds it), or any one.
+struct QueryUnit {
+  std::uint16_t label = 0;
+  bool any = false;
+
+  bool matches(std::uint16_t other) const noexcept { return any || (label == other && other != 0); }
+};
+
+template <unsigned K>
+struct Band {
+  static constexpr unsigned kColumns = 2 * K + 1;
+  static constexpr std::uint64_t kRow = (std::uint64_t{1} << kColumns) - 1;
+
+  /// One bit at the beginning of each row from `first` to `last`.
+  static constexpr std::uint64_t rowStarts(unsigned first, unsigned last) {
+    std::uint64_t bits = 0;
+    for (unsigned e = first; e <= last && e <= K; ++e) {
+      bits |= std::uint64_t{1} << (e * kColumns);
+    }
+    return bits;
+  }
+
+  static constexpr std::uint64_t kStarts = rowStarts(0, K);
+  static constexpr std::uint64_t kAll = kStarts * kRow;
+  static constexpr std::uint64_t kNotFirstColumn = kAll & ~kStarts;
+  static constexpr std::uint64_t kNotLastColumn = kAll & ~(kStarts << (kColumns - 1));
+
+  /// Adds what missing code units lead to.
+  static constexpr std::uint64_t closed(std::uint64_t states) {
+    for (unsigned i = 0; i < K; ++i) {
+      states |= ((states << 1) & kNotFirstColumn) << kColumns;
+    }
+    return states & kAll;
+  }
+
+  /// Reads one code unit; bit c of `matching` says that the query's code unit behind column c is
+  /// that one.
+  static constexpr std::uint64_t step(std::uint64_t states, std::uint64_t matching) {
+    const std::uint64_t matched = states & (matching * kStarts);
+    const std::uint64_t edited = (states | ((states >> 1) & kNotLastColumn)) << kColumns;
+    return closed(matched | edited);
+  }
+
+  /// The columns in use in any row.
+  static constexpr std::uint64_t columnsOf(std::uint64_t states) {
+    std::uint64_t columns = states;
+    for (unsigned e = 1; e <= K; ++e) {
+      columns |= states >> (e * kColumns);
+    }
+    return columns & kRow;
+  }
+
+  /// The states from which words of a given rest can still be accepted. `ahead` is the query's rest
+  /// less the word's: a state of e edits in column c needs |ahead - (c - K)| further edits.
+  static constexpr unsigned kAheadCap = 2 * K + 1;
+  struct Reach {
+    std::uint64_t notTooFarBehind[2 * kAheadCap + 1];
+    std::uint64_t notTooFarAhead[2 * kAheadCap + 1];
+  };
+  static constexpr Reach makeReach() {
+    Reach reach = {};
+    for (int ahead = -static_cast<int>(kAheadCap); ahead <= static_cast<int>(kAheadCap); ++ahead) {
+      const auto entry = static_cast<std::size_t>(ahead + static_cast<int>(kAheadCap));
+      for (unsigned e = 0; e <= K; ++e) {
+        for (unsigned c = 0; c < kColumns; ++c) {
+          const int lead = static_cast<int>(c) - static_cast<int>(K);
+          const int spare = static_cast<int>(K - e);
+          const std::uint64_t bit = std::uint64_t{1} << (e * kColumns + c);
+          reach.notTooFarBehind[entry] |= lead >= ahead - spare ? bit : 0;
+          reach.notTooFarAhead[entry] |= lead <= ahead + spare ? bit : 0;
+        }
+      }
+    }
+    return reach;
+  }
+  static constexpr Reach kReach = makeReach();
+
+  static constexpr std::size_t reachEntry(std::int64_t ahead) {
+    constexpr auto cap = static_cast<std::int64_t>(kAheadCap);
+    return static_cast<std::size_t>((ahead < -cap ? -cap : (ahead > cap ? cap : ahead)) + cap);
+  }
+};
+
+/// A query prepared for simulation at up to K edits.
+template <unsigned K>
+class BandedPattern {
+ public:
+  using B = Band<K>;
+
+  /// `restricted` code units at the head may only be passed with at most `edits` edits.
+  BandedPattern(std::span<const QueryUnit> units, std::size_t restricted, unsigned edits)
+      : _units(units), _states(units.size() + K + 2) {
+    const auto length = static_cast<std::int64_t>(units.size());
+    for (std::size_t depth = 0; depth < _states.size(); ++depth) {
+      const auto shift = static_cast<std::int64_t>(depth) - static_cast<std::int64_t>(K);
+      // Column c stands for p = shift + c.
+      const std::uint64_t inside = below(length + 1 - shift) & ~below(-shift);
+      const std::uint64_t head = inside & below(static_cast<std::int64_t>(restricted) - shift);
+      _states[depth].valid = (inside * B::kStarts) & ~(head * B::rowStarts(edits + 1, K));
+      const std::uint64_t end = below(length + 1 - shift) & ~below(length - shift);
+      _states[depth].accepting = end * B::kStarts;
+    }
+    if (units.size() + B::kColumns <= 64) {
+      for (std::size_t p = 0; p < units.size(); ++p) {
+        addToTable(units[p], std::uint64_t{1} << (p + K));
+      }
+      _hasTable = true;
+    }
+  }
+
+  std::size_t length() const noexcept { return _units.size(); }
+  std::uint64_t validAt(std::size_t depth) const noexcept { return _states[depth].valid; }
+  std::uint64_t acceptingAt(std::size_t depth) const noexcept { return _states[depth].accepting; }
+
+  /// The states before anything is read: nothing is accounted for, and leaving out the head of the
+  /// query is not allowed yet.
+  std::uint64_t start() const noexcept { return std::uint64_t{1} << K; }
+
+  /// The same, with the head left out as well.
+  std::uint64_t closedStart() const noexcept { return B::closed(start()) & validAt(0); }
+
+  std::uint64_t step(std::uint64_t states, std::size_t depth, std::uint16_t label) const noexcept {
+    return B::step(states, matching(depth, label)) & _states[depth + 1].valid;
+  }
+
+  /// The same for a code unit that the query does not hold.
+  std::uint64_t stepOther(std::uint64_t states, std::size_t depth) const noexcept {
+    return B::step(states, 0) & _states[depth + 1].valid;
+  }
+
+  /// The bits, in a tree's sets of children, of the labels that match from these states.
+  std::uint64_t wantedChildren(std::uint64_t states, std::size_t depth) const noexcept {
+    std::uint64_t wanted = 0;
+    for (std::uint64_t columns = B::columnsOf(states); columns != 0; columns &= columns - 1) {
+      const std::size_t p = depth + static_cast<std::size_t>(std::countr_zero(columns)) - K;
+      if (p < _units.size()) {
+        wanted |= childBits(_units[p]);
+      }
+    }
+    return wanted;
+  }
+
+ private:
+  /// Per depth: the states that may be, and those at the end of the query.
+  struct AtDepth {
+    std::uint64_t valid;
+    std::uint64_t accepting;
+  };
+
+  static std::uint64_t below(std::int64_t column) noexcept {
+    if (column <= 0) {
+      return 0;
+    }
+    return column >= B::kColumns ? B::kRow : (std::uint64_t{1} << column) - 1;
+  }
+
+  static std::uint64_t childBits(const QueryUnit& unit) noexcept {
+    if (unit.any) {
+      return ~(std::uint64_t{1} << image::kEndBit);
+    }
+    return unit.label == 0 ? 0 : std::uint64_t{1} << image::labelBit(unit.label);
+  }
+
+  void addToTable(const QueryUnit& unit, std::uint64_t bit) noexcept {
+    if (unit.any) {
+      for (auto& row : _table) {
+        row |= bit;
+      }
+    } else if (unit.label != 0 && unit.label < image::kRareBit) {
+      _table[unit.label] |= bit;
+    }
+  }
+
+  std::uint64_t matching(std::size_t depth, std::uint16_t label) const noexcept {
+    if (_hasTable && label < image::kRareBit) {
+      return (_table[label] >> depth) & B::kRow;
+    }
+    std::uint64_t bits = 0;
+    for (unsigned c = 0; c < B::kColumns; ++c) {
+      const std::size_t p = depth + c - K;
+      if (p < _units.size() && _units[p].matches(label)) {
+        bits |= std::uint64_t{1} << c;
+      }
+    }
+    return bits;
+  }
+
+  std::span<const QueryUnit> _units;
+  std::vector<AtDepth> _states;
+  // For queries that fit: bit p + K of a label's row says that it is the query's code unit p.
+  std::uint64_t _table[image::kRareBit] = {};
+  bool _hasTable = false;
+};
+
+}  // namespace wordcatcher
+
+#endif

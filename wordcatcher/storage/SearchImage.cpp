@@ -1,0 +1,411 @@
+#include "wordcatcher/storage/SearchImage.h"
+
+#include <fcntl.h>
+#include <sys/mman.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <cstring>
+#include <optional>
+#include <system_error>
+
+#define XXH_INLINE_ALL
+#include <xxhash.h>
+
+#include "wordcatcher/Error.h"
+#include "wordcatcher/text/CodeUnitOrder.h"
+#include "wordcatcher/text/Unicode.h"
+
+namespace wordcatcher {
+
+namespace {
+
+using image::SectionKind;
+using image::TreeSlot;
+
+/// A descriptor that closes itself.
+class Descriptor {
+ public:
+  explicit Descriptor(int number) : _number(number) {}
+  ~Descriptor() {
+    if (_number >= 0) {
+      close(_number);
+    }
+  }
+  Descriptor(const Descriptor&) = delete;
+  Descriptor& operator=(const Descriptor&) = delete;
+  int number() const noexcept { return _number; }
+
+ private:
+  int _number;
+};
+
+[[noreturn]] void throwUnreadable(const std::string& path, int code) {
+  const std::string reason = std::generic_category().message(code);
+  if (code == ENOENT || code == ENOTDIR) {
+    throw Error(ErrorCode::notFound, "There is no index at " + path + " (" + reason +
+                                         "); check the path, or build one there.");
+  }
+  throw Error(ErrorCode::notReadable, "The index " + path + " cannot be read (" + reason + ").");
+}
+
+std::vector<std::byte> readAll(int descriptor, std::size_t bytes, const std::string& path) {
+  std::vector<std::byte> content(bytes);
+  std::size_t done = 0;
+  while (done < bytes) {
+    const ssize_t got = read(descriptor, content.data() + done, bytes - done);
+    if (got < 0 && errno == EINTR) {
+      continue;
+    }
+    if (got < 0) {
+      throwUnreadable(path, errno);
+    }
+    if (got == 0) {
+      break;
+    }
+    done += static_cast<std::size_t>(got);
+  }
+  content.resize(done);
+  return content;
+}
+
+}  // namespace
+
+std::shared_ptr<const SearchImage> SearchImage::open(const std::string& path, Load load) {
+  const Descriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC));
+  struct stat status = {};
+  if (file.number() < 0 || fstat(file.number(), &status) != 0) {
+    throwUnreadable(path, errno);
+  }
+  if (!S_ISREG(status.st_mode)) {
+    throw Error(ErrorCode::notAnIndex, path + " is not a file; name a search image (.wci).");
+  }
+  const auto bytes = static_cast<std::size_t>(status.st_size);
+  std::shared_ptr<SearchImage> opened(new SearchImage);
+  if (load == Load::copy || bytes == 0) {
+    opened->_copy = readAll(file.number(), bytes, path);
+    opened->_bytes = opened->_copy;
+  } else {
+    void* mapping = mmap(nullptr, bytes, PROT_READ, MAP_SHARED, file.number(), 0);
+    if (mapping == MAP_FAILED) {
+      throwUnreadable(path, errno);
+    }
+    opened->_mapping = mapping;
+    opened->_mappedBytes = bytes;
+    opened->_bytes = {static_cast<const std::byte*>(mapping), bytes};
+  }
+  opened->bind(path);
+  return opened;
+}
+
+std::shared_ptr<const SearchImage> SearchImage::fromBytes(std::vector<std::byte> bytes) {
+  std::shared_ptr<SearchImage> opened(new SearchImage);
+  opened->_copy = std::move(bytes);
+  opened->_bytes = opened->_copy;
+  opened->bind("in memory");
+  return opened;
+}
+
+void SearchImage::throwDamaged(const std::string& what) const {
+  throw Error(ErrorCode::damaged, "The index " + _name + " is damaged (" + what +
+                                      "); build it again from its phrases.");
+}
+
+SearchImage::~SearchImage() {
+  if (_mapping != nullptr) {
+    munmap(_mapping, _mappedBytes);
+  }
+}
+
+std::span<const std::byte> SearchImage::sectionBytes(SectionKind kind) const {
+  for (const auto& section : _sections) {
+    if (section.kind == kind) {
+      return _bytes.subspan(section.offset, section.bytes);
+    }
+  }
+  throwDamaged("a section is missing");
+}
+
+template <typename Element>
+std::span<const Element> SearchImage::sectionOf(SectionKind kind) const {
+  const auto bytes = sectionBytes(kind);
+  if (bytes.size() % sizeof(Element) != 0) {
+    throwDamaged("a section has an odd length");
+  }
+  return {reinterpret_cast<const Element*>(bytes.data()), bytes.size() / sizeof(Element)};
+}
+
+/// Checks all that the accessors rely on without looking again: the sections' places and sizes.
+void SearchImage::bind(const std::string& name) {
+  _name = name;
+  if (_bytes.size() < sizeof(image::Header) ||
+      std::memcmp(_bytes.data(), image::kMagic.data(), image::kMagic.size()) != 0) {
+    throw Error(
+        ErrorCode::notAnIndex,
+        name + " is not a search image; build one with IndexBuilder or `wordcatcher index`.");
+  }
+  _header = reinterpret_cast<const image::Header*>(_bytes.data());
+  if (_header->byteOrder != image::kByteOrderMark || _header->version != image::kVersion) {
+    throw Error(ErrorCode::notAnIndex,
+                "The search image " + name +
+                    " was written by another version or kind of machine; build it again.");
+  }
+  if (_header->fileBytes != _bytes.size()) {
+    throwDamaged("its length is not what its header says");
+  }
+  if (_header->sectionCount > image::kSectionKinds ||
+      image::headerBytes(_header->sectionCount) > _bytes.size()) {
+    throwDamaged("its section table is too long");
+  }
+  const std::size_t covered = image::headerBytes(_header->sectionCount) - sizeof(std::uint64_t);
+  std::uint64_t checksum = 0;
+  std::memcpy(&checksum, _bytes.data() + covered, sizeof checksum);
+  if (XXH3_64bits(_bytes.data(), covered) != checksum) {
+    throwDamaged("its header does not have its checksum");
+  }
+  _sections = {reinterpret_cast<const image::Section*>(_bytes.data() + sizeof(image::Header)),
+               _header->sectionCount};
+  for (const auto& section : _sections) {
+    if (section.offset > _bytes.size() || section.bytes > _bytes.size() - section.offset ||
+        section.offset % image::kSectionAlignment != 0) {
+      throwDamaged("a section lies outside the file");
+    }
+  }
+  if (_header->wordCount > TreeSlot::kIndex || _header->valueCount > TreeSlot::kIndex) {
+    throwDamaged("its counts are too large");
+  }
+  _wordCount = static_cast<std::uint32_t>(_header->wordCount);
+  _valueCount = static_cast<std::uint32_t>(_header->valueCount);
+
+  _labels = sectionOf<std::uint16_t>(SectionKind::labels);
+  _wordOffsets = sectionOf<std::uint32_t>(SectionKind::wordOffsets);
+  _wordText = sectionOf<std::uint16_t>(SectionKind::wordText);
+  _forward.slots = sectionOf<TreeSlot>(SectionKind::forwardTree);
+  _forward.order = sectionOf<std::uint32_t>(SectionKind::forwardOrder);
+  _backward.slots = sectionOf<TreeSlot>(SectionKind::backwardTree);
+  _backward.order = sectionOf<std::uint32_t>(SectionKind::backwardOrder);
+  _postingOffsets = sectionOf<std::uint64_t>(SectionKind::postingOffsets);
+  _postings = sectionOf<std::uint32_t>(SectionKind::postings);
+  _valueOffsets = sectionOf<std::uint64_t>(SectionKind::valueOffsets);
+  _valueText = sectionOf<char>(SectionKind::valueText);
+  _countedWords = sectionOf<std::uint32_t>(SectionKind::countedWords);
+  const std::size_t words = _wordCount;
+  const std::size_t values = _valueCount;
+  if (_labels.empty() || _wordOffsets.size() != words + 1 || _postingOffsets.size() != words + 1 ||
+      (!_forward.order.empty() && _forward.order.size() != words) ||
+      _backward.order.size() != words || _forward.slots.empty() || _backward.slots.empty() ||
+      _valueOffsets.size() != values + 1 || _countedWords.size() != values) {
+    throwDamaged("its sections do not have the lengths that its counts ask for");
+  }
+}
+
+std::uint16_t SearchImage::labelOf(char16_t unit) const noexcept {
+  const auto common =
+      _labels.subspan(1, std::min<std::size_t>(_labels.size(), image::kRareBit) - 1);
+  const auto rare = _labels.subspan(1 + common.size());
+  for (const auto group : {common, rare}) {
+    const auto found = std::lower_bound(group.begin(), group.end(), unit);
+    if (found != group.end() && *found == unit) {
+      return static_cast<std::uint16_t>(&*found - _labels.data());
+    }
+  }
+  return 0;
+}
+
+std::span<const std::uint16_t> SearchImage::labelsOf(std::uint32_t word) const {
+  if (word >= _wordCount) {
+    throwDamaged("it refers to a word that is not there");
+  }
+  const std::uint32_t begin = _wordOffsets[word];
+  const std::uint32_t end = _wordOffsets[word + 1];
+  if (begin > end || end > _wordText.size()) {
+    throwDamaged("a word lies outside its section");
+  }
+  return _wordText.subspan(begin, end - begin);
+}
+
+std::u16string SearchImage::textOf(std::uint32_t word) const {
+  std::u16string text;
+  for (const std::uint16_t label : labelsOf(word)) {
+    if (label >= _labels.size()) {
+      throwDamaged("a word holds a label that is not there");
+    }
+    text += static_cast<char16_t>(_labels[label]);
+  }
+  return text;
+}
+
+std::span<const std::uint32_t> SearchImage::postingsOf(std::uint32_t word) const {
+  if (word >= _wordCount) {
+    throwDamaged("it refers to a word that is not there");
+  }
+  const std::uint64_t begin = _postingOffsets[word];
+  const std::uint64_t end = _postingOffsets[word + 1];
+  if (begin > end || end > _postings.size()) {
+    throwDamaged("a posting list lies outside its section");
+  }
+  return _postings.subspan(begin, end - begin);
+}
+
+std::string_view SearchImage::valueText(std::uint32_t value) const {
+  if (value >= _valueCount) {
+    throwDamaged("it refers to a data string that is not there");
+  }
+  const std::uint64_t begin = _valueOffsets[value];
+  const std::uint64_t end = _valueOffsets[value + 1];
+  if (begin > end || end > _valueText.size()) {
+    throwDamaged("a data string lies outside its section");
+  }
+  return {_valueText.data() + begin, end - begin};
+}
+
+std::uint32_t SearchImage::countedWordsOf(std::uint32_t value) const {
+  if (value >= _valueCount) {
+    throwDamaged("it refers to a data string that is not there");
+  }
+  return _countedWords[value];
+}
+
+void SearchImage::verify() const {
+  verifyChecksums();
+  verifyWords();
+  verifyTree(_forward, false);
+  verifyTree(_backward, true);
+  verifyValues();
+}
+
+void SearchImage::verifyChecksums() const {
+  for (const auto& section : _sections) {
+    if (XXH3_64bits(_bytes.data() + section.offset, section.bytes) != section.checksum) {
+      throwDamaged("section " + std::to_string(static_cast<unsigned>(section.kind)) +
+                   " does not have its checksum");
+    }
+  }
+}
+
+void SearchImage::verifyWords() const {
+  const auto ascending = [](std::span<const std::uint16_t> units) {
+    return std::adjacent_find(units.begin(), units.end(), std::greater_equal<>()) == units.end();
+  };
+  const std::size_t common = std::min<std::size_t>(_labels.size(), image::kRareBit);
+  if (!ascending(_labels.subspan(1, common - 1)) || !ascending(_labels.subspan(common))) {
+    throwDamaged("its labels are out of order");
+  }
+  if (_wordOffsets.front() != 0 || _wordOffsets.back() != _wordText.size() ||
+      _postingOffsets.front() != 0 || _postingOffsets.back() != _postings.size()) {
+    throwDamaged("its words do not fill their section");
+  }
+  std::u16string previous;
+  for (std::uint32_t word = 0; word < _wordCount; ++word) {
+    std::u16string text = textOf(word);
+    if (text <= previous) {
+      throwDamaged("its words are out of order");
+    }
+    previous = std::move(text);
+    const auto postings = postingsOf(word);
+    if (std::adjacent_find(postings.begin(), postings.end(), std::greater_equal<>()) !=
+            postings.end() ||
+        (!postings.empty() && postings.back() >= _valueCount)) {
+      throwDamaged("a posting list is out of order");
+    }
+  }
+}
+
+/// Walks a whole tree in the order of labels: the words must come one after the other, each behind
+/// the edges that spell it.
+void SearchImage::verifyTree(const Tree& tree, bool backward) const {
+  struct Item {
+    std::size_t slot;
+    std::size_t depth;
+  };
+  const auto wrong = [this] { throwDamaged("a tree does not spell the words"); };
+  std::vector<Item> pending = {{0, 0}};
+  std::vector<std::uint16_t> path;
+  std::size_t nextPlace = 0;
+  std::size_t seenSlots = 0;
+  while (!pending.empty()) {
+    const auto [index, depth] = pending.back();
+    pending.pop_back();
+    const TreeSlot& slot = tree.slots[index];
+    ++seenSlots;
+    const bool isEnd = index != 0 && slot.label == 0;
+    path.resize(depth == 0 ? 0 : depth - 1);
+    if (index != 0 && !isEnd) {
+      path.push_back(slot.label);
+    }
+    if (slot.isLeaf() && index != 0) {
+      if (slot.index() != nextPlace || slot.children == 0 ||
+          slot.children > _wordCount - nextPlace || (isEnd && slot.children != 1)) {
+        wrong();
+      }
+      std::size_t shortest = SIZE_MAX;
+      std::size_t longest = 0;
+      for (std::uint64_t i = 0; i < slot.children; ++i, ++nextPlace) {
+        const std::uint32_t word =
+            tree.order.empty() ? static_cast<std::uint32_t>(nextPlace) : tree.order[nextPlace];
+        const auto span = labelsOf(word);
+        std::vector<std::uint16_t> labels(span.begin(), span.end());
+        if (backward) {
+          std::reverse(labels.begin(), labels.end());
+        }
+        if (labels.size() < path.size() || (isEnd && labels.size() != path.size()) ||
+            !std::equal(path.begin(), path.end(), labels.begin())) {
+          wrong();
+        }
+        shortest = std::min(shortest, labels.size() - path.size());
+        longest = std::max(longest, labels.size() - path.size());
+      }
+      if (slot.shortest != std::min<std::size_t>(shortest, image::kLengthCap) ||
+          slot.longest != std::min<std::size_t>(longest, image::kLengthCap)) {
+        wrong();
+      }
+      continue;
+    }
+    if (isEnd) {
+      wrong();
+    }
+    // The children in reverse, so that the first is taken first.
+    const std::size_t first = slot.index();
+    std::size_t last = first;
+    std::uint64_t bits = 0;
+    if (slot.children != 0) {
+      for (;; ++last) {
+        if (last <= index || last >= tree.slots.size() ||
+            (last > first && tree.slots[last].label <= tree.slots[last - 1].label)) {
+          wrong();
+        }
+        bits |= std::uint64_t{1} << image::labelBit(tree.slots[last].label);
+        if (tree.slots[last].isLastChild()) {
+          break;
+        }
+      }
+      for (std::size_t child = last + 1; child-- > first;) {
+        pending.push_back({child, path.size() + 1});
+      }
+    }
+    if (bits != slot.children) {
+      wrong();
+    }
+  }
+  if (nextPlace != _wordCount || seenSlots != tree.slots.size()) {
+    wrong();
+  }
+}
+
+void SearchImage::verifyValues() const {
+  if (_valueOffsets.front() != 0 || _valueOffsets.back() != _valueText.size()) {
+    throwDamaged("its data strings do not fill their section");
+  }
+  std::optional<std::string_view> previous;
+  for (std::uint32_t value = 0; value < _valueCount; ++value) {
+    const std::string_view text = valueText(value);
+    if (!fromUtf8(text) || (previous && !utf16Less(*previous, text))) {
+      throwDamaged("its data strings are out of order or not UTF-8");
+    }
+    previous = text;
+  }
+}
+
+}  // namespace wordcatcher

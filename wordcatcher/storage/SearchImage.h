@@ -1,0 +1,109 @@
+#ifndef WORDCATCHER_STORAGE_SEARCHIMAGE_H
+#define WORDCATCHER_STORAGE_SEARCHIMAGE_H
+
+#include <cstdint>
+#include <memory>
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "wordcatcher/storage/SearchImageFormat.h"
+
+namespace wordcatcher {
+
+/// A search image opened for reading: a prefix tree of words, forward and backward, with the values
+/// (data strings) that each word carries. Immutable; any number of threads read it at once.
+///
+/// Opening checks the header and the bounds of the sections, in constant time. What is followed
+/// later is checked where it is followed: an image that is hostile but has the right checksums
+/// gives an Error (damaged) or wrong answers, and nothing worse.
+class SearchImage {
+ public:
+  /// How the bytes come into memory: mapped, or copied, for files that may shrink while they are
+  /// read (a mapped file that shrinks ends its reader with a bus error).
+  enum class Load { map, copy };
+
+  /// Opens a file. Throws Error: notFound, notReadable, notAnIndex or damaged.
+  static std::shared_ptr<const SearchImage> open(const std::string& path, Load load);
+
+  /// Takes over the bytes of an image. Throws Error: notAnIndex or damaged.
+  static std::shared_ptr<const SearchImage> fromBytes(std::vector<std::byte> bytes);
+
+  ~SearchImage();
+  SearchImage(const SearchImage&) = delete;
+  SearchImage& operator=(const SearchImage&) = delete;
+
+  const image::Header& header() const noexcept { return *_header; }
+  std::uint32_t wordCount() const noexcept { return _wordCount; }
+  std::uint32_t valueCount() const noexcept { return _valueCount; }
+
+  /// The label of a code unit; 0 when no word holds it. Logarithmic in the number of labels.
+  std::uint16_t labelOf(char16_t unit) const noexcept;
+
+  /// The labels of a word, and its code units. The word must be below wordCount().
+  std::span<const std::uint16_t> labelsOf(std::uint32_t word) const;
+  std::u16string textOf(std::uint32_t word) const;
+
+  /// One of the two trees, and the word that stands at each of its places.
+  struct Tree {
+    std::span<const image::TreeSlot> slots;
+    std::span<const std::uint32_t> order;  // empty: place and word are the same
+  };
+  const Tree& forward() const noexcept { return _forward; }
+  const Tree& backward() const noexcept { return _backward; }
+
+  /// The values of a word, ascending; each is below valueCount() or the image is damaged.
+  std::span<const std::uint32_t> postingsOf(std::uint32_t word) const;
+
+  /// A value as UTF-8, and the number of counted words of its phrase. Throws Error (damaged) for a
+  /// value that is not there.
+  std::string_view valueText(std::uint32_t value) const;
+  std::uint32_t countedWordsOf(std::uint32_t value) const;
+
+  /// Checks everything: checksums, orders, ranges, that both trees hold exactly the words. Throws
+  /// Error (damaged) that names the section. Linear in the file.
+  void verify() const;
+
+  /// Throws the Error (damaged) of a reader that met something impossible in this image.
+  [[noreturn]] void throwDamaged(const std::string& what) const;
+
+  /// The whole file.
+  std::span<const std::byte> bytes() const noexcept { return _bytes; }
+
+ private:
+  SearchImage() = default;
+  void bind(const std::string& name);
+  std::span<const std::byte> sectionBytes(image::SectionKind kind) const;
+  template <typename Element>
+  std::span<const Element> sectionOf(image::SectionKind kind) const;
+  void verifyChecksums() const;
+  void verifyWords() const;
+  void verifyTree(const Tree& tree, bool backward) const;
+  void verifyValues() const;
+
+  std::vector<std::byte> _copy;
+  void* _mapping = nullptr;
+  std::size_t _mappedBytes = 0;
+  std::span<const std::byte> _bytes;
+  std::string _name;
+
+  const image::Header* _header = nullptr;
+  std::span<const image::Section> _sections;
+  std::uint32_t _wordCount = 0;
+  std::uint32_t _valueCount = 0;
+  std::span<const std::uint16_t> _labels;
+  std::span<const std::uint32_t> _wordOffsets;
+  std::span<const std::uint16_t> _wordText;
+  Tree _forward;
+  Tree _backward;
+  std::span<const std::uint64_t> _postingOffsets;
+  std::span<const std::uint32_t> _postings;
+  std::span<const std::uint64_t> _valueOffsets;
+  std::span<const char> _valueText;
+  std::span<const std::uint32_t> _countedWords;
+};
+
+}  // namespace wordcatcher
+
+#endif
