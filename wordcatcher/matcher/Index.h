@@ -1,0 +1,112 @@
+#ifndef WORDCATCHER_MATCHER_INDEX_H
+#define WORDCATCHER_MATCHER_INDEX_H
+
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "wordcatcher/Export.h"
+#include "wordcatcher/matcher/IndexBuilder.h"
+
+namespace wordcatcher {
+
+/// An index opened for reading: a search image, or a classic index directory.
+///
+///     const Index index = Index::open("names.wci");
+///     for (const auto& match : index.query("trinidat and tobbago").matches) ...
+///
+/// An Index is immutable and cheap to copy; any number of threads use one at once, without locks.
+/// No lock file is needed: any number of processes read one image, also from read-only media, while
+/// a builder publishes a new one, which those who open the path from then on see.
+///
+/// Strings are UTF-8; each ill-formed byte sequence of a text separates words, like a space. Errors
+/// are Error; every call may throw Error (damaged) when the file turns out to be damaged, and does
+/// nothing worse, whatever the file holds.
+///
+/// Budgets: a query looks at no more than the options allow and says when it left something out, so
+/// that texts of strangers cannot make it run away. Beside its result a query needs at most 64 bytes
+/// for each code unit of a word, 32 for each byte of the text and 64 for each posting of the words
+/// that it finds.
+class WORDCATCHER_EXPORT Index {
+ public:
+  enum class Load {
+    map,   ///< map the file: opens in constant time, whatever its size
+    copy,  ///< copy it into memory: for files on storage that may shrink while they are read
+  };
+
+  struct Options {
+    Load load = Load::map;
+    std::size_t maxQueryWords = 4096;  ///< words of a text that are looked at
+    std::size_t maxWordUnits = 1024;   ///< code units of a word (or whole text) that is looked up
+  };
+
+  /// Opens a search image (a file), or a classic index (a directory, or a prefix of its files'
+  /// names), of which an image is built in memory; its tables are locked only while they are read.
+  /// `mode` says how a classic index is to be queried, and is not looked at for an image, which
+  /// remembers. Throws Error: notFound, notReadable, notAnIndex, damaged.
+  static Index open(const std::string& path);
+  static Index open(const std::string& path, const Options& options,
+                    MatchingMode mode = MatchingMode::words);
+
+  /// One phrase that a query found.
+  struct Match {
+    std::string value;      ///< the data string; in whole-text mode the stored text
+    std::int64_t distance;  ///< as KXWordcatcher::query scores it; edits in whole-text mode
+    std::vector<std::string> data;  ///< in whole-text mode: the data strings; else empty
+  };
+
+  struct QueryResult {
+    /// Whether any word of the text was found with data; always true in whole-text mode.
+    bool found = false;
+    std::vector<Match> matches;  ///< ascending by distance, then value by UTF-16 code units
+    bool truncated = false;      ///< whether a budget cut something off
+  };
+
+  /// The matches of a fresh classic matcher in the same mode (see KXWordcatcher::query), where its
+  /// first result, nothing, is `found` being false.
+  QueryResult query(std::string_view text) const;
+
+  /// One stored word (or whole text, or code) near another.
+  struct WordMatch {
+    std::string value;
+    std::int64_t distance;
+    std::vector<std::string> data;  ///< ascending by UTF-16 code units
+  };
+
+  struct SearchResult {
+    std::vector<WordMatch> matches;
+    bool truncated = false;  ///< the word is longer than maxWordUnits and was not looked up
+  };
+
+  /// As LXFuzzyIndex::search_withMaxDistance, in its order; strings with characters outside the
+  /// Basic Multilingual Plane are found as well, each such character counting as two code units.
+  /// Throws Error (badInput) for a word that is not UTF-8 or a distance above 16.
+  SearchResult search(std::string_view word, std::int64_t maxDistance) const;
+
+  struct Info {
+    MatchingMode mode;
+    std::uint64_t phrases;     ///< phrases added; 0 for a classic index, which does not count them
+    std::uint64_t words;       ///< distinct stored words
+    std::uint64_t values;      ///< distinct data strings
+    std::uint64_t bytes;       ///< of the image
+    std::string generation;    ///< 32 hexadecimal digits, random for each build
+    std::uint32_t version;     ///< of the format
+  };
+  Info info() const;
+
+  /// Checks the whole image. Throws Error (damaged) that names what is wrong. Linear in its size.
+  void verify() const;
+
+ private:
+  struct State;
+  explicit Index(std::shared_ptr<const State> state);
+  std::shared_ptr<const State> _state;
+};
+
+}  // namespace wordcatcher
+
+#endif
