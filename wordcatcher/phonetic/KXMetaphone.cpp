@@ -3,8 +3,8 @@
 #include <unicode/uchar.h>
 #include <unicode/utf16.h>
 
+#include <algorithm>
 #include <cstdint>
-#include <utility>
 
 #include "wordcatcher/phonetic/LetterRules.h"
 #include "wordcatcher/text/Unicode.h"
@@ -28,8 +28,27 @@ std::u16string withoutPunctuation(std::u16string_view word) {
   return letters;
 }
 
-std::u16string paddedWord(std::u16string_view word) {
-  return u' ' + toUpper(withoutPunctuation(word)) + u' ';
+/// Upper-cases a word between the two spaces that `padded` begins and ends with, if it is all made
+/// of the letters A to Z, as most words are: these need no tables of Unicode.
+bool upperCaseBasicLetters(std::u16string_view word, std::u16string& padded) {
+  constexpr unsigned kCaseBit = u'a' ^ u'A';
+  bool basic = true;
+  std::transform(word.begin(), word.end(), padded.begin() + 1, [&basic](char16_t unit) {
+    const unsigned letter = unit & ~kCaseBit;
+    basic &= letter - u'A' <= u'Z' - u'A';
+    return static_cast<char16_t>(letter);
+  });
+  return basic;
+}
+
+/// The word as the letter rules see it: without punctuation, upper-cased, a space on either side.
+void prepare(std::u16string_view word, std::u16string& padded) {
+  padded.resize(word.size() + 2);
+  padded.front() = u' ';
+  padded.back() = u' ';
+  if (!upperCaseBasicLetters(word, padded)) {
+    padded = u' ' + toUpper(withoutPunctuation(word)) + u' ';
+  }
 }
 
 }  // namespace
@@ -40,31 +59,37 @@ KXMetaphone::~KXMetaphone() = default;
 
 std::u16string KXMetaphone::translate(std::u16string_view text) {
   std::u16string codes;
+  codes.reserve(text.size());
   _segmenter->start(text);
   while (const auto word = _segmenter->next()) {
-    codes += _translateWord(*word);
+    if (encode(*word)) {
+      codes += code();
+      reset();
+    }
     codes += u' ';
   }
   return codes;
 }
 
 std::u16string KXMetaphone::_translateWord(std::u16string_view word) {
-  const std::u16string padded = paddedWord(word);
-  const auto length = static_cast<std::uint16_t>(padded.size());
-  if (length == 0) {
+  if (!encode(word)) {
     return {};
   }
-  LetterRules(*this, padded, length).run();
-  std::u16string code = std::move(_isAlternate ? _secondary : _primary);
+  std::u16string result = code();
   reset();
-  return code;
+  return result;
 }
 
-void KXMetaphone::_append(std::u16string_view code) { _append_alt(code, code); }
-
-void KXMetaphone::_append_alt(std::u16string_view primary, std::u16string_view alternate) {
-  _primary += primary;
-  _secondary += alternate;
+/// Leaves the word's code in the buffers; false if its padded length counts as 0, which leaves the
+/// buffers alone.
+bool KXMetaphone::encode(std::u16string_view word) {
+  prepare(word, _padded);
+  const auto length = static_cast<std::uint16_t>(_padded.size());
+  if (length == 0) {
+    return false;
+  }
+  LetterRules(*this, _padded, length).run();
+  return true;
 }
 
 void KXMetaphone::reset() {

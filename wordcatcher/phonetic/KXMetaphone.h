@@ -16,8 +16,8 @@ class WordSegmenter;
 /// page docs/phonetics.md tells what its codes mean.
 ///
 /// A code holds the letters A, F, H, J, K, L, M, N, P, R, S, T and X, the digit 0 for the sound of
-/// TH, and spaces; at most two letters for each letter of the upper-cased word. A code is as long as
-/// its word needs. Characters that no rule knows add nothing; digits neither.
+/// TH, and spaces; at most two letters for each letter of the upper-cased word. A code is as long
+/// as its word needs. Characters that no rule knows add nothing; digits neither.
 ///
 /// While it runs the encoder keeps a second code, of another way to say the word; it is thrown away
 /// at the end of each word and never returned.
@@ -50,20 +50,33 @@ class WORDCATCHER_EXPORT KXMetaphone {
   std::u16string _translateWord(std::u16string_view word);
 
   /// Adds to the code of the word that is being encoded, and to its alternate code.
-  void _append(std::u16string_view code);
+  void _append(std::u16string_view code) { _append_alt(code, code); }
 
   /// Adds `primary` to the code of the word that is being encoded, `alternate` to its alternate
   /// code.
-  void _append_alt(std::u16string_view primary, std::u16string_view alternate);
+  void _append_alt(std::u16string_view primary, std::u16string_view alternate) {
+    // Letter by letter: a rule adds one or two, for which appending a string takes twice as long.
+    for (const char16_t letter : primary) {
+      _primary.push_back(letter);
+    }
+    for (const char16_t letter : alternate) {
+      _secondary.push_back(letter);
+    }
+  }
 
   /// Empties both buffers.
   void reset();
 
  private:
+  bool encode(std::u16string_view word);
+  const std::u16string& code() const noexcept { return _isAlternate ? _secondary : _primary; }
+
   std::u16string _primary;
   std::u16string _secondary;
   // Which buffer a word's code is taken from. Nothing sets it: callers compare primary codes only.
   bool _isAlternate = false;
+  // The word that is being encoded, kept so that its memory serves the next one.
+  std::u16string _padded;
   std::unique_ptr<WordSegmenter> _segmenter;
 };
 

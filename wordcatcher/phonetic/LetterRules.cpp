@@ -11,7 +11,7 @@ void LetterRules::run() {
 std::int32_t LetterRules::startPosition() {
   // Both checks look at the padding before the word and never hold: silent first letters are
   // encoded like any other, and a first X is left to its own rule.
-  std::int32_t start = at(0, 2, anyOf<u"GN", u"KN", u"PN", u"WR", u"PS">) ? 1 : 0;
+  std::int32_t start = at(0, anyOf<u"GN", u"KN", u"PN", u"WR", u"PS">) ? 1 : 0;
   if (unitAt(0) == u'X') {
     start += append(u"S", 1);
   }

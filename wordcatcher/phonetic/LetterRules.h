@@ -2,7 +2,6 @@
 #define WORDCATCHER_PHONETIC_LETTERRULES_H
 
 #include <algorithm>
-#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <optional>
@@ -18,14 +17,28 @@ template <std::size_t Size>
 struct Literal {
   // Implicit, so that anyOf takes plain string literals.
   consteval Literal(const char16_t (&literal)[Size]) { std::copy_n(literal, Size, text); }
-  constexpr std::u16string_view view() const { return {text, Size - 1}; }
 
+  static constexpr std::size_t length = Size - 1;
   char16_t text[Size] = {};
 };
 
-/// A list of strings that is a table in the binary, written where it is used.
+/// Strings of one length, written where they are used and known to the compiler there, so that
+/// comparing with them is comparing with constants.
+template <Literal first, Literal... others>
+struct AnyOf {
+  static constexpr std::size_t length = first.length;
+  static_assert(((others.length == length) && ...));
+
+  static constexpr bool contains(std::u16string_view piece) noexcept {
+    const auto equals = [piece](const auto& member) {
+      return std::equal(piece.begin(), piece.end(), member.text);
+    };
+    return piece.size() == length && (equals(first) || ... || equals(others));
+  }
+};
+
 template <Literal... members>
-inline constexpr std::array<std::u16string_view, sizeof...(members)> anyOf = {members.view()...};
+inline constexpr AnyOf<members...> anyOf;
 
 /// The letter rules, run over one word. The word is padded with a space before and one after, so
 /// that its first letter stands at position 1, its last at length - 2, and every position outside
@@ -86,8 +99,10 @@ class LetterRules {
     return nth(_word, static_cast<std::size_t>(position));
   }
   char16_t next(std::int32_t distance) const noexcept { return unitAt(_pos + distance); }
-  bool at(std::int32_t start, std::size_t length, StringList list) const noexcept {
-    return ssa(_word, start, length, list);
+  /// ssa() for the length that the members have.
+  template <Literal... members>
+  bool at(std::int32_t start, AnyOf<members...> list) const noexcept {
+    return list.contains(substring(_word, start, list.length));
   }
   bool vowelAt(std::int32_t position) const noexcept { return _isVowel(_word, position); }
   bool slavoGermanic();

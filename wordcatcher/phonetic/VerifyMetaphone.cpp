@@ -40,7 +40,7 @@ void verify(KXMetaphone& encoder, const Expectation& expectation) {
   const std::u16string_view code = trimmed(codes);
   const bool contained = code.find(expectation.code) != std::u16string_view::npos;
   logLine("%@: \"%@\" -> \"%@\" == \"%@\"", {std::string_view(contained ? "pass" : "FAIL"),
-                                            expectation.word, code, expectation.code});
+                                             expectation.word, code, expectation.code});
 }
 
 void verifyLine(KXMetaphone& encoder, std::FILE* expectations) {

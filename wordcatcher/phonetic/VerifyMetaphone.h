@@ -15,8 +15,8 @@ namespace wordcatcher {
 ///
 /// Each line of the file is a word, a comma and the code expected of it; further fields are
 /// ignored. The verdict is "pass" when the word's code, without the spaces around it, contains the
-/// expected one, so that an empty expectation always passes, and "FAIL" otherwise. The word may be a
-/// text of several words.
+/// expected one, so that an empty expectation always passes, and "FAIL" otherwise. The word may be
+/// a text of several words.
 ///
 /// `expectations` is open for reading, read from where it stands to its end, and not closed. The
 /// last line must not end with a newline: the empty line that would follow has no expectation.
