@@ -60,8 +60,8 @@ int LetterRules::ch() {
       !at(_pos, anyOf<u"CHORE">)) {
     return append(u"K", 2);
   }
-  // The checks at position 0 see padding, and no word keeps the bars of the first of the six-letter
-  // pieces: these never hold.
+  // The checks at position 0 see padding, and no word token holds the bars of the first of the
+  // six-letter pieces: these never hold.
   if (at(0, anyOf<u"VAN ", u"VON ">) || at(0, anyOf<u"SCH">) ||
       at(_pos - 2, anyOf<u"||CHES", u"ARCHIT", u"ORCHID">) || at(_pos + 2, anyOf<u"T", u"S">) ||
       ((isFirstLetter() || at(_pos - 1, anyOf<u"A", u"O", u"U", u"E">)) &&
