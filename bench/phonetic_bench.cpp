@@ -89,24 +89,32 @@ void cutAndUpperCase(benchmark::State& state, std::size_t length) {
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * length));
 }
 
-/// Prints the usual table and keeps the median processor time of each benchmark.
-class MedianReporter : public benchmark::ConsoleReporter {
+/// Prints the usual table and keeps the least processor time of each benchmark: what else runs on
+/// the machine can only add to it.
+class LeastTimeReporter : public benchmark::ConsoleReporter {
  public:
   void ReportRuns(const std::vector<Run>& runs) override {
+    std::vector<Run> aggregates;
     for (const Run& run : runs) {
-      if (run.aggregate_name == "median") {
-        _medians[run.run_name.function_name] = run.GetAdjustedCPUTime();
+      if (run.run_type == Run::RT_Aggregate) {
+        aggregates.push_back(run);
+        continue;
+      }
+      const auto [least, isNew] =
+          _leastTimes.try_emplace(run.run_name.function_name, run.GetAdjustedCPUTime());
+      if (!isNew) {
+        least->second = std::min(least->second, run.GetAdjustedCPUTime());
       }
     }
-    ConsoleReporter::ReportRuns(runs);
+    ConsoleReporter::ReportRuns(aggregates);
   }
 
   double ratio(const char* name, const char* to) const {
-    return _medians.at(name) / _medians.at(to);
+    return _leastTimes.at(name) / _leastTimes.at(to);
   }
 
  private:
-  std::map<std::string, double> _medians;
+  std::map<std::string, double> _leastTimes;
 };
 
 bool within(double bound, double ratio, const char* what) {
@@ -115,10 +123,7 @@ bool within(double bound, double ratio, const char* what) {
 }
 
 void add(const char* name, void (*run)(benchmark::State&, std::size_t), std::size_t length) {
-  benchmark::RegisterBenchmark(name, run, length)
-      ->Unit(benchmark::kMillisecond)
-      ->Repetitions(9)
-      ->ReportAggregatesOnly();
+  benchmark::RegisterBenchmark(name, run, length)->Unit(benchmark::kMillisecond)->Repetitions(9);
 }
 
 }  // namespace
@@ -128,7 +133,7 @@ int main(int argc, char** argv) {
   add(kEncode1, encode, kMegabyte);
   add(kEncode2, encode, 2 * kMegabyte);
   add(kIcu, cutAndUpperCase, kMegabyte);
-  MedianReporter reporter;
+  LeastTimeReporter reporter;
   benchmark::RunSpecifiedBenchmarks(&reporter);
   const bool linear =
       within(kLinearBound, reporter.ratio(kEncode2, kEncode1), "2 MB against 1 MB of English:");

@@ -69,6 +69,7 @@ LETTER(C,                              //
        Case{u"fuchs", u"FKS"},         // F1 F, U2 -, C3 K (2; before S), S5 S
        Case{u"chlor", u"KLR"},         // C1 K (2; first, before L), L3 L, O4 -, R5 R
        Case{u"technik", u"TKNK"},      // T1 T, E2 -, C3 K (2; E before, N after), N5 N, I6 -, K7 K
+       Case{u"teach", u"TK"},          // T1 T, E2 -, A3 -, C4 K (2; A before, the end after)
        Case{u"loch", u"LK"},           // L1 L, O2 -, C3 K (2; O before, the end after)
        Case{u"milch", u"MLX"},         // M1 M, I2 -, L3 L, C4 X (2)
        Case{u"child", u"XLT"},         // C1 X (2), I3 -, L4 L, D5 T

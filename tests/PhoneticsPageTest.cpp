@@ -37,7 +37,7 @@ constexpr Example kExamples[] = {
     {u"bordeaux", "at the end too: silent French endings are heard"},
     {u"laugh", "GH is F after U in words such as this"},
     {u"danger", "a G before ER is K"},
-    {u"magic", "before E, I and Y it is J otherwise"},
+    {u"magic", "elsewhere before E, I and Y it is mostly J"},
     {u"dumb", "a final B is heard"},
     {u"school", "SCH is SK in words such as this"},
     {u"nation", "TION, TIA and TCH are X"},

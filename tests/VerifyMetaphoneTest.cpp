@@ -14,13 +14,13 @@ using testing::LogCapture;
 using Lines = std::vector<std::string>;
 
 struct CloseFile {
-  void operator()(std::FILE* file) const { std::fclose(file); }
+  void operator()(std::FILE* file) const { static_cast<void>(std::fclose(file)); }
 };
 using File = std::unique_ptr<std::FILE, CloseFile>;
 
 File fileOf(std::string_view bytes) {
   File file(std::tmpfile());
-  std::fwrite(bytes.data(), 1, bytes.size(), file.get());
+  EXPECT_EQ(std::fwrite(bytes.data(), 1, bytes.size(), file.get()), bytes.size());
   std::rewind(file.get());
   return file;
 }

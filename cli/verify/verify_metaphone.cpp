@@ -6,6 +6,7 @@
 #include <cstdio>
 #include <exception>
 #include <memory>
+#include <string>
 #include <string_view>
 #include <system_error>
 
@@ -19,11 +20,12 @@ constexpr int kSuccess = 0;
 constexpr int kFailure = 2;
 
 struct CloseFile {
-  void operator()(std::FILE* file) const noexcept { std::fclose(file); }
+  void operator()(std::FILE* file) const noexcept { static_cast<void>(std::fclose(file)); }
 };
 
 void printError(std::string_view line) noexcept {
-  std::fprintf(stderr, "%.*s\n", static_cast<int>(line.size()), line.data());
+  // Nobody is left to tell when the error stream itself fails.
+  static_cast<void>(std::fprintf(stderr, "%.*s\n", static_cast<int>(line.size()), line.data()));
 }
 
 /// Shows the library's lines to the caller, beside the log that they go to anyway.

@@ -39,8 +39,8 @@ void verify(KXMetaphone& encoder, const Expectation& expectation) {
   const std::u16string codes = encoder.translate(expectation.word);
   const std::u16string_view code = trimmed(codes);
   const bool contained = code.find(expectation.code) != std::u16string_view::npos;
-  logLine("%@: \"%@\" -> \"%@\" == \"%@\"", {std::string_view(contained ? "pass" : "FAIL"),
-                                             expectation.word, code, expectation.code});
+  logLine(R"(%@: "%@" -> "%@" == "%@")", {std::string_view(contained ? "pass" : "FAIL"),
+                                          expectation.word, code, expectation.code});
 }
 
 void verifyLine(KXMetaphone& encoder, std::FILE* expectations) {
