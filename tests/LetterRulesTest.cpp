@@ -77,21 +77,25 @@ LETTER(C,                              //
        Case{u"scwicz", u"SKKS"},       // S1 SK (3, with the W), I4 -, C5 K (CZ, but WICZ), Z6 S
        Case{u"muscwicz", u"MSKKS"},    // M1 M, U2 -, S3 SK (3), I6 -, C7 K (WICZ), Z8 S
        Case{u"breccia", u"PRX"},       // B1 P, R2 R, E3 -, C4 X (3; CIA after it), A7 -
-       Case{u"accept", u"AKSPT"},      // A1 A, C2 KS (3; first A, CCE), P5 P, T6 T
-       Case{u"succeed", u"SKST"},      // S1 S, U2 -, C3 KS (3; UCCEE), E6 -, D7 T
-       Case{u"success", u"SKSS"},      // S1 S, U2 -, C3 KS (3; UCCES), S6 S (2)
-       Case{u"vaccine", u"FXN"},       // V1 F, A2 -, C3 X (3; CCI), N6 N, E7 -
-       Case{u"zucchini", u"SXN"},      // Z1 S, U2 -, C3 X (3; CCH), I6 -, N7 N, I8 -
-       Case{u"bacchus", u"PKS"},       // B1 P, A2 -, C3 K (2; CCHU), H5 -, U6 -, S7 S
-       Case{u"accord", u"AKRT"},       // A1 A, C2 K (2; CCO), O4 -, R5 R, D6 T
-       Case{u"mcgee", u"MK"},          // M1 M, C2 K (2; CG), E4 -, E5 -
-       Case{u"black", u"PLK"},         // B1 P, L2 L, A3 -, C4 K (2; CK)
-       Case{u"acquit", u"AKT"},        // A1 A, C2 K (2; CQ), U4 -, I5 -, T6 T
-       Case{u"social", u"SSL"},        // S1 S, O2 -, C3 S (2; CIA), A5 -, L6 L
-       Case{u"city", u"ST"},           // C1 S (2; CI), T3 T, Y4 -
-       Case{u"cent", u"SNT"},          // C1 S (2; CE), N3 N, T4 T
-       Case{u"cyclone", u"SKLN"},      // C1 S (2; CY), C3 K, L4 L, O5 -, N6 N, E7 -
-       Case{u"crown", u"KRN"},         // C1 K, R2 R, O3 -, W4 -, N5 N
+       Case{u"acciaio",
+            u"AX"},  // A1 A, C2 X (3; CIA after it comes before the first A), A5 -, I6 -, O7 -
+       Case{u"accept", u"AKSPT"},       // A1 A, C2 KS (3; first A, CCE), P5 P, T6 T
+       Case{u"succeed", u"SKST"},       // S1 S, U2 -, C3 KS (3; UCCEE), E6 -, D7 T
+       Case{u"success", u"SKSS"},       // S1 S, U2 -, C3 KS (3; UCCES), S6 S (2)
+       Case{u"vaccine", u"FXN"},        // V1 F, A2 -, C3 X (3; CCI), N6 N, E7 -
+       Case{u"zucchini", u"SXN"},       // Z1 S, U2 -, C3 X (3; CCH), I6 -, N7 N, I8 -
+       Case{u"bacchus", u"PKS"},        // B1 P, A2 -, C3 K (2; CCHU), H5 -, U6 -, S7 S
+       Case{u"accord", u"AKRT"},        // A1 A, C2 K (2; CCO), O4 -, R5 R, D6 T
+       Case{u"acclaim", u"AKLM"},       // A1 A, C2 K (2), L4 L, A5 -, I6 -, M7 M
+       Case{u"mcgee", u"MK"},           // M1 M, C2 K (2; CG), E4 -, E5 -
+       Case{u"black", u"PLK"},          // B1 P, L2 L, A3 -, C4 K (2; CK)
+       Case{u"acquit", u"AKT"},         // A1 A, C2 K (2; CQ), U4 -, I5 -, T6 T
+       Case{u"social", u"SSL"},         // S1 S, O2 -, C3 S (2; CIA), A5 -, L6 L
+       Case{u"city", u"ST"},            // C1 S (2; CI), T3 T, Y4 -
+       Case{u"cent", u"SNT"},           // C1 S (2; CE), N3 N, T4 T
+       Case{u"cyclone", u"SKLN"},       // C1 S (2; CY), C3 K, L4 L, O5 -, N6 N, E7 -
+       Case{u"crown", u"KRN"},          // C1 K, R2 R, O3 -, W4 -, N5 N
+       Case{u"mac queen", u"MKN"},      // M1 M, A2 -, C3 K (3; " Q"), U6 -, E7 -, E8 -, N9 N
        Case{u"mac gregor", u"MKRKR"});  // M1 M, A2 -, C3 K (3; " G"), R6 R, E7 -, G8 K, O9 -, R10 R
 
 LETTER(D,                        //
@@ -107,31 +111,35 @@ LETTER(F,                       //
        Case{u"effen", u"AFN"},  // E1 A, F2 F (2), E4 -, N5 N
        Case{u"ofen", u"AFN"});  // O1 A, F2 F, E3 -, N4 N
 
-LETTER(GBeforeH,                   //
-       Case{u"ghent", u"KNT"},     // G1 K (2; no vowel before), E3 -, N4 N, T5 T
-       Case{u"ghi", u"K"},         // G1 K (2; first, though an I follows), I3 -
-       Case{u"burgher", u"PRKR"},  // B1 P, U2 -, R3 R, G4 K (2), E6 -, R7 R
-       Case{u"hugh", u"H"},        // H1 H (2), G3 - (2; H two places before)
-       Case{u"daghap", u"TP"},     // D1 T, A2 -, G3 - (2; D two places before), A5 -, P6 P
-       Case{u"bighellone",
-            u"PLN"},               // B1 P, I2 -, G3 - (2; B two before), E5 -, L6 L (2), O8 -, N9 N
-       Case{u"ightham", u"ATM"},   // I1 A, G2 - (2; I before), T4 T (2; before AM), A6 -, M7 M
-       Case{u"aghast", u"AKST"},   // A1 A, G2 K (2), A4 -, S5 S, T6 T
-       Case{u"daughter", u"TTR"},  // D1 T, A2 -, U3 -, G4 - (2; D three before), T6 T, E7 -, R8 R
-       Case{u"brought", u"PRT"},   // B1 P, R2 R, O3 -, U4 -, G5 - (2; B four before), T7 T
-       Case{u"through", u"0R"},    // T1 0 (2), R3 R, O4 -, U5 -, G6 - (2; H four before)
-       Case{u"laugh", u"LF"},      // L1 L, A2 -, U3 -, G4 F (2; U before, L three before)
-       Case{u"cough", u"KF"},      // C1 K, O2 -, U3 -, G4 F (2; C three before)
-       Case{u"gough", u"KF"},      // G1 K, O2 -, U3 -, G4 F (2; G three before)
-       Case{u"rough", u"RF"},      // R1 R, O2 -, U3 -, G4 F (2; R three before)
-       Case{u"tough", u"TF"},      // T1 T, O2 -, U3 -, G4 F (2; T three before)
-       Case{u"night", u"NT"},      // N1 N, I2 -, G3 - (2; I before), T5 T
-       Case{u"enough", u"ANK"});   // E1 A, N2 N, O3 -, U4 -, G5 K (2; N three before)
+LETTER(GBeforeH,                    //
+       Case{u"ghent", u"KNT"},      // G1 K (2; no vowel before), E3 -, N4 N, T5 T
+       Case{u"ghi", u"K"},          // G1 K (2; first, though an I follows), I3 -
+       Case{u"burgher", u"PRKR"},   // B1 P, U2 -, R3 R, G4 K (2), E6 -, R7 R
+       Case{u"burghley", u"PRKL"},  // B1 P, U2 -, R3 R, G4 K (2), L6 L, E7 -, Y8 -
+       Case{u"hugh", u"H"},         // H1 H (2), G3 - (2; H two places before)
+       Case{u"daghap", u"TP"},      // D1 T, A2 -, G3 - (2; D two places before), A5 -, P6 P
+       Case{u"baghdad", u"PTT"},    // B1 P, A2 -, G3 - (2; B two before), D5 T, A6 -, D7 T
+       Case{u"bighe", u"P"},        // B1 P, I2 -, G3 - (2; B two before), E5 -
+       Case{u"ightham", u"ATM"},    // I1 A, G2 - (2; I before), T4 T (2; before AM), A6 -, M7 M
+       Case{u"aghast", u"AKST"},    // A1 A, G2 K (2), A4 -, S5 S, T6 T
+       Case{u"daughter", u"TTR"},   // D1 T, A2 -, U3 -, G4 - (2; D three before), T6 T, E7 -, R8 R
+       Case{u"brought", u"PRT"},    // B1 P, R2 R, O3 -, U4 -, G5 - (2; B four before), T7 T
+       Case{u"through", u"0R"},     // T1 0 (2), R3 R, O4 -, U5 -, G6 - (2; H four before)
+       Case{u"laugh", u"LF"},       // L1 L, A2 -, U3 -, G4 F (2; U before, L three before)
+       Case{u"cough", u"KF"},       // C1 K, O2 -, U3 -, G4 F (2; C three before)
+       Case{u"gough", u"KF"},       // G1 K, O2 -, U3 -, G4 F (2; G three before)
+       Case{u"rough", u"RF"},       // R1 R, O2 -, U3 -, G4 F (2; R three before)
+       Case{u"tough", u"TF"},       // T1 T, O2 -, U3 -, G4 F (2; T three before)
+       Case{u"night", u"NT"},       // N1 N, I2 -, G3 - (2; I before), T5 T
+       Case{u"enough", u"ANK"});    // E1 A, N2 N, O3 -, U4 -, G5 K (2; N three before)
 
-LETTER(GBeforeNOrLi,               //
-       Case{u"sign", u"SN"},       // S1 S, I2 -, G3 N (2)
-       Case{u"gnat", u"NT"},       // G1 N (2), A3 -, T4 T
-       Case{u"rigney", u"RKN"},    // R1 R, I2 -, G3 KN (2; before EY), E5 -, Y6 -
+LETTER(GBeforeNOrLi,                  //
+       Case{u"sign", u"SN"},          // S1 S, I2 -, G3 N (2)
+       Case{u"signboard", u"SNPRT"},  // S1 S, I2 -, G3 N (2), B5 P, O6 -, A7 -, R8 R, D9 T
+       Case{u"gnat", u"NT"},          // G1 N (2), A3 -, T4 T
+       Case{u"rigney", u"RKN"},       // R1 R, I2 -, G3 KN (2; before EY), E5 -, Y6 -
+       Case{u"signbook",
+            u"SKNPK"},             // S1 S, I2 -, G3 KN (2; a K in the word), B5 P, O6 -, O7 -, K8 K
        Case{u"wagner", u"AKNR"},   // W1 A, A2 -, G3 KN (2; a W in the word), E5 -, R6 R
        Case{u"glide", u"KLT"},     // G1 KL (2), I3 -, D4 T, E5 -
        Case{u"gliwice", u"KLS"});  // G1 K (a W in the word), L2 L, I3 -, W4 -, I5 -, C6 S (2)
@@ -190,10 +198,11 @@ LETTER(K,                        //
        Case{u"lekko", u"LK"},    // L1 L, E2 -, K3 K (2), O5 -
        Case{u"knife", u"KNF"});  // K1 K, N2 N, I3 -, F4 F, E5 -
 
-LETTER(L,                           //
-       Case{u"llama", u"LM"},       // L1 L (2), A3 -, M4 M, A5 -
-       Case{u"tortilla", u"TRTL"},  // T1 T, O2 -, R3 R, T4 T, I5 -, L6 L (2), A8 -
-       Case{u"ulm", u"ALM"});       // U1 A, L2 L, M3 M
+LETTER(L,                            //
+       Case{u"llama", u"LM"},        // L1 L (2), A3 -, M4 M, A5 -
+       Case{u"allspice", u"ALSPS"},  // A1 A, L2 L (2), S4 S, P5 P, I6 -, C7 S (2)
+       Case{u"tortilla", u"TRTL"},   // T1 T, O2 -, R3 R, T4 T, I5 -, L6 L (2), A8 -
+       Case{u"ulm", u"ALM"});        // U1 A, L2 L, M3 M
 
 LETTER(M,                       //
        Case{u"umber", u"AMR"},  // U1 A, M2 M (2; UMB before ER), E4 -, R5 R
@@ -207,6 +216,7 @@ LETTER(N,                      //
 
 LETTER(P,                           //
        Case{u"philip", u"FLP"},     // P1 F (2), I3 -, L4 L, I5 -, P6 P
+       Case{u"phrase", u"FRS"},     // P1 F (2), R3 R, A4 -, S5 S, E6 -
        Case{u"appel", u"APL"},      // A1 A, P2 P (2), E4 -, L5 L
        Case{u"campbell", u"KMPL"},  // C1 K, A2 -, M3 M, P4 P (2; before B), E6 -, L7 L (2)
        Case{u"page", u"PJ"});       // P1 P, A2 -, G3 J (2)
@@ -228,6 +238,7 @@ LETTER(S,                           //
        Case{u"rusholme", u"RSLM"},  // R1 R, U2 -, S3 S (2; HOLM), O5 -, L6 L, M7 M, E8 -
        Case{u"reisholz", u"RSLS"},  // R1 R, E2 -, I3 -, S4 S (2; HOLZ), O6 -, L7 L, Z8 S
        Case{u"sushi", u"SX"},       // S1 S, U2 -, S3 X (2), I5 -
+       Case{u"shrimp", u"XRMP"},    // S1 X (2), R3 R, I4 -, M5 M, P6 P
        Case{u"vision", u"FSN"},     // V1 F, I2 -, S3 S (3; SIO), N6 N
        Case{u"asian", u"ASN"},      // A1 A, S2 S (3; SIA), N5 N
        Case{u"kasia", u"KS"},       // K1 K, A2 -, S3 S (3; SIA, a K in the word)
@@ -250,6 +261,8 @@ LETTER(Sc,                          //
        Case{u"schmidt", u"XMT"},    // S1 X (3; first), M4 M, I5 -, D6 T (2)
        Case{u"schiff", u"XF"},      // S1 X (3; first), I4 -, F5 F (2)
        Case{u"mosche", u"MX"},      // M1 M, O2 -, S3 X (3), E6 -
+       Case{u"deutschland",
+            u"TTXLNT"},             // D1 T, E2 -, U3 -, T4 T, S5 X (3), L8 L, A9 -, N10 N, D11 T
        Case{u"scene", u"SN"},       // S1 S (3; SCE), N4 N, E5 -
        Case{u"science", u"SNS"},    // S1 S (3; SCI), E4 -, N5 N, C6 S (2)
        Case{u"scyzoryk", u"SSRK"},  // S1 S (3; SCY), Z4 S, O5 -, R6 R, Y7 -, K8 K
@@ -274,6 +287,7 @@ LETTER(V,                        //
 
 LETTER(W,                             //
        Case{u"wrack", u"RK"},         // W1 R (2), A3 -, C4 K (2)
+       Case{u"wrrong", u"RRNK"},      // W1 R (2), R3 R, O4 -, N5 N, G6 K
        Case{u"playwright", u"PLRT"},  // P1 P, L2 L, A3 -, Y4 -, W5 R (2), I7 -, G8 - (2), T10 T
        Case{u"weert", u"ART"},        // W1 A (before E), E2 -, E3 -, R4 R, T5 T
        Case{u"where", u"AR"},         // W1 A (WH), H2 -, E3 -, R4 R, E5 -
@@ -284,6 +298,7 @@ LETTER(W,                             //
        Case{u"mickiewicz", u"MKTS"},  // M1 M, I2 -, C3 K (2), I5 -, E6 -, W7 TS (4)
        Case{u"horowitz", u"HRTS"},    // H1 H (2), R3 R, O4 -, W5 TS (4)
        Case{u"witzel", u"ATSL"},      // W1 A (before I), then TS (4), E5 -, L6 L
+       Case{u"witzbold", u"ATSPLT"},  // W1 A (before I), then TS (4), B5 P, O6 -, L7 L, D8 T
        Case{u"owl", u"AL"});          // O1 A, W2 -, L3 L
 
 LETTER(X,                            //
@@ -302,9 +317,11 @@ LETTER(Z,                          //
        Case{u"zorn", u"SRN"},      // Z1 S, O2 -, R3 R, N4 N
        Case{u"nozze", u"NS"});     // N1 N, O2 -, Z3 S (2), E5 -
 
-LETTER(CedillaAndTilde,          //
-       Case{u"ça", u"S"},        // Ç1 S, A2 -
-       Case{u"ñandú", u"NNT"});  // Ñ1 N, A2 -, N3 N, D4 T, Ú5 -
+LETTER(CedillaAndTilde,            //
+       Case{u"ça", u"S"},          // Ç1 S, A2 -
+       Case{u"çlirim", u"SLRM"},   // Ç1 S, L2 L, I3 -, R4 R, I5 -, M6 M
+       Case{u"señrita", u"SNRT"},  // S1 S, E2 -, Ñ3 N, R4 R, I5 -, T6 T, A7 -
+       Case{u"ñandú", u"NNT"});    // Ñ1 N, A2 -, N3 N, D4 T, Ú5 -
 
 }  // namespace
 }  // namespace wordcatcher

@@ -42,9 +42,11 @@ int LetterRules::letterC() {
   if (at(_pos, anyOf<u"CI", u"CE", u"CY">)) {
     return at(_pos, anyOf<u"CIO", u"CIE", u"CIA">) ? append(u"S", u"X", 2) : append(u"S", 2);
   }
+  // Only a word with a space in it, which no text gives, fits.
   if (at(_pos + 1, anyOf<u" C", u" Q", u" G">)) {
     return append(u"K", 3);
   }
+  // Never so: the rules of CC, CK and CQ come first.
   const bool swallowsNext =
       at(_pos + 1, anyOf<u"C", u"K", u"Q">) && !at(_pos + 1, anyOf<u"CE", u"CI">);
   return append(u"K", swallowsNext ? 2 : 1);
