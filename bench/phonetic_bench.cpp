@@ -93,6 +93,8 @@ void cutAndUpperCase(benchmark::State& state, std::size_t length) {
 /// the machine can only add to it.
 class LeastTimeReporter : public benchmark::ConsoleReporter {
  public:
+  LeastTimeReporter() : ConsoleReporter(OO_None) {}
+
   void ReportRuns(const std::vector<Run>& runs) override {
     std::vector<Run> aggregates;
     for (const Run& run : runs) {

@@ -3,7 +3,7 @@
 #include <unicode/uchar.h>
 #include <unicode/utf16.h>
 
-#include <algorithm>
+#include <cstddef>
 #include <cstdint>
 
 #include "wordcatcher/phonetic/LetterRules.h"
@@ -28,27 +28,32 @@ std::u16string withoutPunctuation(std::u16string_view word) {
   return letters;
 }
 
-/// Upper-cases a word between the two spaces that `padded` begins and ends with, if it is all made
-/// of the letters A to Z, as most words are: these need no tables of Unicode.
-bool upperCaseBasicLetters(std::u16string_view word, std::u16string& padded) {
+/// Upper-cases a word into `letters`, which has room for it, if it is all made of the letters A to
+/// Z, as most words are: these need no tables of Unicode.
+bool upperCaseBasicLetters(std::u16string_view word, char16_t* letters) {
   constexpr unsigned kCaseBit = u'a' ^ u'A';
   bool basic = true;
-  std::transform(word.begin(), word.end(), padded.begin() + 1, [&basic](char16_t unit) {
+  for (const char16_t unit : word) {
     const unsigned letter = unit & ~kCaseBit;
     basic &= letter - u'A' <= u'Z' - u'A';
-    return static_cast<char16_t>(letter);
-  });
+    *letters++ = static_cast<char16_t>(letter);
+  }
   return basic;
 }
 
 /// The word as the letter rules see it: without punctuation, upper-cased, a space on either side.
-void prepare(std::u16string_view word, std::u16string& padded) {
-  padded.resize(word.size() + 2);
-  padded.front() = u' ';
-  padded.back() = u' ';
-  if (!upperCaseBasicLetters(word, padded)) {
-    padded = u' ' + toUpper(withoutPunctuation(word)) + u' ';
+/// It stands at the start of `memory`.
+std::u16string_view paddedWord(std::u16string_view word, std::u16string& memory) {
+  const std::size_t length = word.size() + 2;
+  if (memory.size() < length) {
+    memory.resize(length);
   }
+  if (!upperCaseBasicLetters(word, memory.data() + 1)) {
+    return memory = u' ' + toUpper(withoutPunctuation(word)) + u' ';
+  }
+  memory[0] = u' ';
+  memory[length - 1] = u' ';
+  return std::u16string_view(memory).substr(0, length);
 }
 
 }  // namespace
@@ -83,12 +88,12 @@ std::u16string KXMetaphone::_translateWord(std::u16string_view word) {
 /// Leaves the word's code in the buffers; false if its padded length counts as 0, which leaves the
 /// buffers alone.
 bool KXMetaphone::encode(std::u16string_view word) {
-  prepare(word, _padded);
-  const auto length = static_cast<std::uint16_t>(_padded.size());
+  const std::u16string_view padded = paddedWord(word, _memory);
+  const auto length = static_cast<std::uint16_t>(padded.size());
   if (length == 0) {
     return false;
   }
-  LetterRules(*this, _padded, length).run();
+  LetterRules(*this, padded, length).run();
   return true;
 }
 

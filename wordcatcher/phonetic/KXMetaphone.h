@@ -75,8 +75,8 @@ class WORDCATCHER_EXPORT KXMetaphone {
   std::u16string _secondary;
   // Which buffer a word's code is taken from. Nothing sets it: callers compare primary codes only.
   bool _isAlternate = false;
-  // The word that is being encoded, kept so that its memory serves the next one.
-  std::u16string _padded;
+  // Where the word that is being encoded stands, kept for the next one.
+  std::u16string _memory;
   std::unique_ptr<WordSegmenter> _segmenter;
 };
 
