@@ -31,7 +31,7 @@ constexpr double kIcuBound = 1.5;
 
 constexpr const char* kEncode1 = "encode/1MB";
 constexpr const char* kEncode2 = "encode/2MB";
-constexpr const char* kIcu = "icu_words_and_upper_case/1MB";
+constexpr const char* kIcu = "icuWords/1MB";
 
 std::u16string licences() {
   std::u16string text;
@@ -66,7 +66,7 @@ void encode(benchmark::State& state, std::size_t length) {
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * length));
 }
 
-void cutAndUpperCase(benchmark::State& state, std::size_t length) {
+void icuWords(benchmark::State& state, std::size_t length) {
   const std::u16string text = englishText(length);
   UErrorCode status = U_ZERO_ERROR;
   UBreakIterator* words = ubrk_open(UBRK_WORD, "", nullptr, 0, &status);
@@ -124,19 +124,14 @@ bool within(double bound, double ratio, const char* what) {
   return ratio <= bound;
 }
 
-void add(const char* name, void (*run)(benchmark::State&, std::size_t), std::size_t length) {
-  // The registry owns what is registered.
-  // NOLINTNEXTLINE(clang-analyzer-cplusplus.NewDeleteLeaks)
-  benchmark::RegisterBenchmark(name, run, length)->Unit(benchmark::kMillisecond)->Repetitions(9);
-}
+BENCHMARK_CAPTURE(encode, 1MB, kMegabyte)->Unit(benchmark::kMillisecond)->Repetitions(9);
+BENCHMARK_CAPTURE(encode, 2MB, 2 * kMegabyte)->Unit(benchmark::kMillisecond)->Repetitions(9);
+BENCHMARK_CAPTURE(icuWords, 1MB, kMegabyte)->Unit(benchmark::kMillisecond)->Repetitions(9);
 
 }  // namespace
 
 int main(int argc, char** argv) {
   benchmark::Initialize(&argc, argv);
-  add(kEncode1, encode, kMegabyte);
-  add(kEncode2, encode, 2 * kMegabyte);
-  add(kIcu, cutAndUpperCase, kMegabyte);
   LeastTimeReporter reporter;
   benchmark::RunSpecifiedBenchmarks(&reporter);
   const bool linear =
