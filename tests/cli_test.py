@@ -455,6 +455,28 @@ class SearchTest(CommandTest):
             self.assertEqual(json.loads(self.line_of(process.stdout))["word"], word)
 
 
+class EncodeTest(CommandTest):
+    def test_codes_stand_one_space_apart(self):
+        self.assertEqual(self.succeed("encode", "Catherine  Schmidt", "Kathryn Shmit"),
+                         "K0RN XMT\nK0RN XMT\n")
+
+    def test_lines_of_standard_input(self):
+        self.assertEqual(self.succeed("encode", stdin="Knight, Night!\n\n?\n"), "KNT NT\n\n\n")
+
+    def test_json(self):
+        self.assertEqual(self.succeed("encode", "--json", "Peña Łódź", "..."),
+                         '{"text":"Peña Łódź","codes":["PN","T"]}\n{"text":"...","codes":[]}\n')
+
+    def test_invalid_utf8(self):
+        self.fail_with("UTF-8", of=["encode", b"caf\xe9"])
+
+    def test_phonetic_mode_finds_what_sounds_alike(self):
+        self.index("Catherine Schmidt\nKonrad Zuse\n", None, "--mode", "phonetic")
+        self.assertEqual(self.succeed("query", "--mode", "phonetic", self.dogs, "Kathryn Shmit"),
+                         "0\tCatherine Schmidt\n")
+        self.assertEqual(self.run_it("query", "--mode", "phonetic", self.dogs, "Konrad Shmit"), 1)
+
+
 class DamagedIndexTest(CommandTest):
     def check(self, *words):
         for verb in ("query", "search"):
