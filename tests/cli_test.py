@@ -293,10 +293,8 @@ class IndexTest(CommandTest):
     def test_verbose_shows_the_storage_log(self):
         self.succeed("index", "--verbose", self.dogs, stdin=DOGS)
         self.assertIn(f"-[TinyCDB setMode:] Finalizing {self.dogs}/{EDGES}\n", self.err)
-        self.succeed("query", "--verbose", self.dogs, "golden gate bridge")
-        self.assertIn("-[TinyCDB valuesFor:] Could not init query", self.err)
-        self.succeed("query", self.dogs, "golden gate bridge")
-        self.assertEqual(self.err, "")
+        self.succeed("index", self.dogs, stdin=DOGS)
+        self.assertNotIn("TinyCDB", self.err)
 
 
 class QueryTest(CommandTest):
@@ -414,10 +412,10 @@ class SearchTest(CommandTest):
 
     def test_plain_output(self):
         self.assertEqual(self.succeed("search", self.dogs, "Goldan"),
-                         f"1\tgolden\t{BRIDGE} | {PUPPY}\n")
+                         f"golden\t1\t{BRIDGE} | {PUPPY}\n")
 
     def test_several_words_have_headings(self):
-        expected = f"gold\n2\tgolden\t{BRIDGE} | {PUPPY}\nxyzzy\npupy\n1\tpuppy\t{PUPPY}\n"
+        expected = f"gold\ngolden\t2\t{BRIDGE} | {PUPPY}\nxyzzy\npupy\npuppy\t1\t{PUPPY}\n"
         self.assertEqual(self.succeed("search", self.dogs, "gold", "xyzzy", "pupy"), expected)
         self.assertEqual(self.succeed("search", self.dogs, stdin="gold\nxyzzy\r\npupy"), expected)
 
@@ -437,8 +435,8 @@ class SearchTest(CommandTest):
         def found(distance):
             return self.run_it("search", "--max-distance", str(distance), self.dogs, "gilden gite")
         self.index("golden gate\n", None, "--mode", "text")
-        self.assertEqual([found(distance) for distance in range(7)], [1, 1, 0, 0, 0, 0, 0])
-        for distance in ("7", "-1", "many", "1.5"):
+        self.assertEqual([found(distance) for distance in (0, 1, 2, 3, 16)], [1, 1, 0, 0, 0])
+        for distance in ("17", "-1", "many", "1.5"):
             self.fail_with("--max-distance",
                            of=["search", "--max-distance", distance, self.dogs, "golden"])
 

@@ -20,6 +20,7 @@
 
 namespace wordcatcher {
 
+class SearchImage;
 class WordSegmenter;
 
 /// The automaton of all strings within a distance of a word.
@@ -41,6 +42,9 @@ using LevenshteinDFA = LXDFA<LXIntTupleSet>;
 ///
 /// Growth: the tables hold one record an adding call, so finishing a table and every walk from the
 /// root grow with the number of words added (finishing grows with its square).
+///
+/// Errors: the constructors throw std::runtime_error when ICU's data is not installed. A string of
+/// more than 2^31 - 1 code units is refused with std::length_error.
 ///
 /// Thread safety: one thread at a time.
 class WORDCATCHER_EXPORT LXFuzzyIndex {
@@ -112,10 +116,18 @@ class WORDCATCHER_EXPORT LXFuzzyIndex {
                                                                     std::u16string_view symbol);
 
  private:
+  friend class Index;
+  friend class KXWordcatcher;
+
+  /// What searches answer from: an image of the tables as they were last opened for reading, made
+  /// at the first search after they were opened, for reading or for writing.
+  const SearchImage& image();
+
   PLXDFA _LXindex;
   // Looked up by nothing and filled by nothing: always empty.
   std::unordered_map<std::u16string, std::vector<std::u16string>> _LXdata;
   std::unique_ptr<WordSegmenter> _segmenter;
+  std::shared_ptr<const SearchImage> _image;
 };
 
 WORDCATCHER_EXPORT std::ostream& operator<<(std::ostream& stream, const LXFuzzyIndex& index);
