@@ -76,11 +76,11 @@ std::vector<LXFuzzyMatch> LXFuzzyIndex::search_withMaxDistance(
   return matches;
 }
 
-const SearchImage& LXFuzzyIndex::image() {
+const std::shared_ptr<const SearchImage>& LXFuzzyIndex::sharedImage() {
   if (!_image) {
     _image = makeTableImage(_LXindex);
   }
-  return *_image;
+  return _image;
 }
 
 std::u16string LXFuzzyIndex::description() const { return _LXindex.description(); }

@@ -84,6 +84,20 @@ std::optional<std::u16string> fromUtf8(std::string_view bytes) {
   return text;
 }
 
+std::u16string decodeUtf8(std::string_view bytes) {
+  if (bytes.empty()) {
+    return {};
+  }
+  const std::int32_t length = icuLength(bytes.size());
+  std::u16string text(bytes.size(), u'\0');
+  std::int32_t used = 0;
+  UErrorCode status = U_ZERO_ERROR;
+  u_strFromUTF8WithSub(text.data(), length, &used, bytes.data(), length, kReplacement, nullptr,
+                       &status);
+  text.resize(static_cast<std::size_t>(used));
+  return text;
+}
+
 std::string displayUtf8(std::u16string_view text) {
   if (text.empty()) {
     return {};
