@@ -4,12 +4,11 @@
 #include <cstdlib>
 #include <utility>
 
+#include "wordcatcher/matcher/PhraseLength.h"
+
 namespace wordcatcher {
 
 namespace {
-
-// Ends the phrase at the head of a data string and begins the host's own fields.
-constexpr std::u16string_view kFieldSeparator = u"{ ";
 
 std::int64_t lengthOf(std::u16string_view text) { return static_cast<std::int64_t>(text.size()); }
 
@@ -126,20 +125,11 @@ void SpanQuery::intersect(CandidateSet& phrases, const CandidateSet& others) {
 
 void SpanQuery::penaliseLength(CandidateSet& phrases) {
   for (auto& [value, distance] : phrases) {
-    const std::int64_t difference = countedWordsOf(value) - _countedWords;
+    const std::int64_t length = countedWords(_segmenter, phraseOf(std::u16string_view(value)),
+                                             _limits.ignoredWordLengthForEditDistance);
+    const std::int64_t difference = length - _countedWords;
     distance = wrappingAdd(distance, _limits.editDistance * std::abs(difference));
   }
-}
-
-std::int64_t SpanQuery::countedWordsOf(std::u16string_view value) {
-  std::int64_t count = 0;
-  _segmenter.start(value.substr(0, value.find(kFieldSeparator)));
-  while (const auto word = _segmenter.next()) {
-    if (lengthOf(*word) > _limits.ignoredWordLengthForEditDistance) {
-      ++count;
-    }
-  }
-  return count;
 }
 
 std::vector<KXWordcatch> SpanQuery::withinBound(CandidateSet&& phrases) const {

@@ -48,7 +48,6 @@ class SpanQuery {
   void intersect(CandidateSet& phrases, const CandidateSet& others);
   void penaliseLength(CandidateSet& phrases);
   std::vector<KXWordcatch> withinBound(CandidateSet&& phrases) const;
-  std::int64_t countedWordsOf(std::u16string_view value);
 
   LXFuzzyIndex& _index;
   WordSegmenter& _segmenter;
