@@ -13,6 +13,7 @@
 #include "wordcatcher/matcher/SpanQuery.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
 #include "wordcatcher/storage/SearchImage.h"
+#include "wordcatcher/text/PhraseLength.h"
 #include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher {
@@ -25,7 +26,6 @@ constexpr std::int32_t kReading = 1;
 constexpr std::int64_t kWordDistance = 2;
 constexpr std::int64_t kWholeTextDistance = 3;
 constexpr std::int64_t kIgnoredWordLength = 2;
-constexpr std::int64_t kUncountedWordLengthOfQueries = 3;
 
 constexpr std::int64_t kMaxSearchDistance = 16;
 
@@ -149,7 +149,7 @@ Index::QueryResult Index::State::queryWords(std::u16string_view text,
   std::int64_t wordsMatched = 0;
   WordSegmenter words(segmenter);
   SpanQuery query(*image, words,
-                  {editDistance, kIgnoredWordLength, kUncountedWordLengthOfQueries,
+                  {editDistance, kIgnoredWordLength, kUncountedWordLength,
                    options.maxQueryWords, options.maxWordUnits},
                   wordsMatched);
   const auto scored = query.run(text);
