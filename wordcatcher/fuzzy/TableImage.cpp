@@ -89,8 +89,8 @@ std::shared_ptr<const SearchImage> makeTableImage(const PLXDFA& automaton) {
       if (!text) {
         continue;
       }
-      const auto counted = static_cast<std::uint32_t>(
-          countedWords(segmenter, phraseOf(std::u16string_view(*text))));
+      const auto counted =
+          static_cast<std::uint32_t>(countedWords(segmenter, phraseOf(std::u16string_view(*text))));
       value = values.emplace(record->value, writer.addValue(record->value, counted)).first;
     }
     writer.addPosting(word->second, value->second);

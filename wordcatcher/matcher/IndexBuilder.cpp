@@ -5,11 +5,11 @@
 #include <vector>
 
 #include "wordcatcher/Error.h"
-#include "wordcatcher/text/PhraseLength.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
 #include "wordcatcher/storage/CommitImage.h"
 #include "wordcatcher/storage/SearchImageWriter.h"
 #include "wordcatcher/storage/TableExport.h"
+#include "wordcatcher/text/PhraseLength.h"
 #include "wordcatcher/text/Unicode.h"
 #include "wordcatcher/text/WordSegmenter.h"
 

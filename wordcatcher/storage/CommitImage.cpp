@@ -136,7 +136,8 @@ class Replacement {
   void checkTarget() const {
     const SplitPath target(_path);
     if (target.name.empty() || _path.find('\0') != std::string::npos) {
-      throw Error(ErrorCode::notWritable, "\"" + _path + "\" does not name a file; name the index.");
+      throw Error(ErrorCode::notWritable,
+                  "\"" + _path + "\" does not name a file; name the index.");
     }
     struct stat status = {};
     if (_files.status(_path, status) == 0 && !S_ISREG(status.st_mode)) {
