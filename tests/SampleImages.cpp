@@ -76,16 +76,17 @@ ImageBytes manyLettersImage() {
   return finished(writer);
 }
 
-ImageBytes islandImage() {
+ImageBytes exampleImage() {
   SearchImageWriter writer(0);
-  const auto island = writer.addValue("Ré{ 85 km² }", 1);
-  const auto note = writer.addValue("Re", 1);
-  writer.addPosting(u"ré", island);
-  writer.addPosting(u"re", note);
-  writer.addPosting(u"aré", island);
-  writer.addPosting(u"aré", note);
-  writer.countPhrase();
-  writer.countPhrase();
+  const auto add = [&writer](std::u16string_view word, std::string_view value,
+                             std::uint32_t countedWords) {
+    writer.addPosting(word, writer.addValue(value, countedWords));
+    writer.countPhrase();
+  };
+  add(u"ré", "Ré{ 85 km² }", 1);
+  add(u"réole", "La Réole", 1);
+  add(u"réunion", "La Réunion", 1);
+  add(u"aisne", "Aisne", 1);
   return finished(writer);
 }
 
@@ -97,7 +98,7 @@ ImageBytes emptyImage() {
 std::vector<SampleImage> sampleImages() {
   return {{"rivers", riverImage()},
           {"many-letters", manyLettersImage()},
-          {"island", islandImage()},
+          {"example", exampleImage()},
           {"deep", deepImage()},
           {"empty", emptyImage()}};
 }

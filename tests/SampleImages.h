@@ -23,9 +23,8 @@ ImageBytes riverImage();
 /// More letters than have a bit of their own, so that the order of labels is not that of letters.
 ImageBytes manyLettersImage();
 
-/// The words "aré", "ré" and "re" with the data strings of an island: the worked example of
-/// docs/search-image.md.
-ImageBytes islandImage();
+/// The worked example of docs/search-image.md.
+ImageBytes exampleImage();
 
 /// Words of nothing but two letters, all heads of one another: the deepest tree of its size.
 ImageBytes deepImage();

@@ -352,7 +352,7 @@ void mutate(ImageBytes& bytes, const image::Section& section, std::mt19937_64& r
 TEST(HostileImageTest, ManyMutationsWithTheRightChecksums) {
   constexpr int kMutations = 100000;
   const ImageBytes large = testing::manyLettersImage();
-  const std::vector<ImageBytes> small = {testing::riverImage(), testing::islandImage(),
+  const std::vector<ImageBytes> small = {testing::riverImage(), testing::exampleImage(),
                                          testing::deepImage()};
   std::mt19937_64 random(20261121);  // NOLINT(cert-msc32-c,cert-msc51-cpp): the same every time
   int opened = 0;
