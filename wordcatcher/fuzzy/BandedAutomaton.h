@@ -61,12 +61,16 @@ struct Band {
     return states & kAll;
   }
 
-  /// Reads one code unit; bit c of `matching` says that the query's code unit behind column c is
-  /// that one.
-  static constexpr std::uint64_t step(std::uint64_t states, std::uint64_t matching) {
-    const std::uint64_t matched = states & (matching * kStarts);
-    const std::uint64_t edited = (states | ((states >> 1) & kNotLastColumn)) << kColumns;
-    return closed(matched | edited);
+  /// What reading any one code unit leads to by an edit.
+  static constexpr std::uint64_t edited(std::uint64_t states) {
+    return closed((states | ((states >> 1) & kNotLastColumn)) << kColumns);
+  }
+
+  /// What reading a code unit leads to without an edit; bit c of `matching` says that the query's
+  /// code unit behind column c is that one. Together with edited() this is the whole step: missing
+  /// code units behind either are those behind both.
+  static constexpr std::uint64_t matched(std::uint64_t states, std::uint64_t matching) {
+    return closed(states & (matching * kStarts));
   }
 
   /// The columns in use in any row.
@@ -148,12 +152,17 @@ class BandedPattern {
   std::uint64_t closedStart() const noexcept { return B::closed(start()) & validAt(0); }
 
   std::uint64_t step(std::uint64_t states, std::size_t depth, std::uint16_t label) const noexcept {
-    return B::step(states, matching(depth, label)) & _states[depth + 1].valid;
+    return (B::edited(states) | B::matched(states, matching(depth, label))) &
+           _states[depth + 1].valid;
   }
 
-  /// The same for a code unit that the query does not hold.
-  std::uint64_t stepOther(std::uint64_t states, std::size_t depth) const noexcept {
-    return B::step(states, 0) & _states[depth + 1].valid;
+  /// The two parts of a step apart, for a place whose children share the first.
+  std::uint64_t stepByEdit(std::uint64_t states, std::size_t depth) const noexcept {
+    return B::edited(states) & _states[depth + 1].valid;
+  }
+  std::uint64_t stepByMatch(std::uint64_t states, std::size_t depth,
+                            std::uint16_t label) const noexcept {
+    return B::matched(states, matching(depth, label)) & _states[depth + 1].valid;
   }
 
   /// The bits, in a tree's sets of children, of the labels that match from these states.
@@ -200,9 +209,11 @@ class BandedPattern {
   }
 
   std::uint64_t matching(std::size_t depth, std::uint16_t label) const noexcept {
-    if (_hasTable && label < image::kRareBit) {
-      return (_table[label] >> depth) & B::kRow;
-    }
+    return _hasTable && label < image::kRareBit ? (_table[label] >> depth) & B::kRow
+                                                : compared(depth, label);
+  }
+
+  std::uint64_t compared(std::size_t depth, std::uint16_t label) const noexcept {
     std::uint64_t bits = 0;
     for (unsigned c = 0; c < B::kColumns; ++c) {
       const std::size_t p = depth + c - K;

@@ -133,10 +133,13 @@ class BandedWalk {
   template <typename Visit>
   void forEachChild(const TreeSlot& parent, std::uint64_t wanted, Visit visit) {
     const std::uint64_t common = parent.children & ~(std::uint64_t{1} << image::kRareBit);
-    for (std::uint64_t bits = common & wanted; bits != 0; bits &= bits - 1) {
+    // Counting along costs less than counting the bits before each wanted one.
+    std::size_t child = parent.index();
+    for (std::uint64_t bits = common; (bits & wanted) != 0; bits &= bits - 1, ++child) {
       const auto label = static_cast<unsigned>(std::countr_zero(bits));
-      const std::uint64_t before = common & ((std::uint64_t{1} << label) - 1);
-      const std::size_t child = parent.index() + static_cast<unsigned>(std::popcount(before));
+      if ((wanted >> label & 1U) == 0) {
+        continue;
+      }
       if (child >= _tree.slots.size()) {
         _image.throwDamaged("a tree leads out of its section");
       }
@@ -146,8 +149,7 @@ class BandedWalk {
     if ((parent.children & wanted & ~common) == 0) {
       return;
     }
-    for (std::size_t child = parent.index() + static_cast<unsigned>(std::popcount(common));;
-         ++child) {
+    for (child = parent.index() + static_cast<unsigned>(std::popcount(common));; ++child) {
       if (child >= _tree.slots.size() || _tree.slots[child].label < image::kRareBit) {
         _image.throwDamaged("a tree leads out of its section");
       }
@@ -163,8 +165,8 @@ class BandedWalk {
   void expand(const TreeSlot& place, std::uint64_t states, std::size_t depth, Accept& accept) {
     constexpr std::uint64_t kEnd = std::uint64_t{1} << image::kEndBit;
     // When only matches keep the automaton alive, no other child is looked at.
-    std::uint64_t wanted =
-        _pattern.stepOther(states, depth) != 0 ? ~kEnd : _pattern.wantedChildren(states, depth);
+    const std::uint64_t byEdit = _pattern.stepByEdit(states, depth);
+    std::uint64_t wanted = byEdit != 0 ? ~kEnd : _pattern.wantedChildren(states, depth);
     if ((states & _pattern.acceptingAt(depth)) != 0) {
       wanted |= kEnd;
     }
@@ -179,7 +181,7 @@ class BandedWalk {
         accept(word, states & _pattern.acceptingAt(depth));
         return;
       }
-      std::uint64_t next = _pattern.step(states, depth, label);
+      std::uint64_t next = byEdit | _pattern.stepByMatch(states, depth, label);
       next &= Band<K>::kReach.notTooFarAhead[Band<K>::reachEntry(ahead - slot.shortest)];
       if (slot.longest < image::kLengthCap) {
         next &= Band<K>::kReach.notTooFarBehind[Band<K>::reachEntry(ahead - slot.longest)];
