@@ -56,9 +56,7 @@ class SearchImageWriter {
     std::size_t postings;
     std::uint64_t phrases;
   };
-  Mark mark() const noexcept {
-    return {_words.size(), _values.size(), _postings.size(), _phrases};
-  }
+  Mark mark() const noexcept { return {_words.size(), _values.size(), _postings.size(), _phrases}; }
   void rollBack(const Mark& mark) noexcept;
 
   /// Everything that was added, in the order of the image.

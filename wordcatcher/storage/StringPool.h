@@ -11,8 +11,9 @@
 namespace wordcatcher {
 
 /// Distinct strings, numbered from 0 in the order in which they came. The characters stand in one
-/// block, so that a string costs its characters and about 20 bytes. Adding and finding take constant
-/// time beside reading the string. Views end with the next change. At most 2^32 - 2 strings.
+/// block, so that a string costs its characters and about 20 bytes. Adding and finding take
+/// constant time beside reading the string. Views end with the next change. At most 2^32 - 2
+/// strings.
 ///
 /// For char and char16_t. One thread at a time.
 template <typename Char>

@@ -7,10 +7,11 @@
 
 namespace wordcatcher {
 
-/// The rank of a UTF-8 byte among the bytes that may stand in its place, in the order of UTF-16 code
-/// units. That is the order of the bytes but for one thing: surrogate pairs (lead bytes F0 to F4)
-/// come before U+E000 to U+FFFF (lead bytes EE and EF), whose ranks therefore are FE and FF. The
-/// source of the exchange is Unicode's "UTF-8 in UTF-16 order" (The Unicode Standard, section 5.17).
+/// The rank of a UTF-8 byte among the bytes that may stand in its place, in the order of UTF-16
+/// code units. That is the order of the bytes but for one thing: surrogate pairs (lead bytes F0 to
+/// F4) come before U+E000 to U+FFFF (lead bytes EE and EF), whose ranks therefore are FE and FF.
+/// The source of the exchange is Unicode's "UTF-8 in UTF-16 order" (The Unicode Standard,
+/// section 5.17).
 inline std::uint8_t utf16Rank(char byte) noexcept {
   constexpr unsigned kPrivateUse = 0xEE;
   constexpr unsigned kSupplementary = 0xF0;
