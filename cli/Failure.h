@@ -10,7 +10,7 @@ namespace wordcatcher::cli {
 
 /// What the command tells its caller.
 enum ExitCode : int {
-  kMatched = 0,  ///< also: an index was written
+  kMatched = 0,  ///< also: an index was written, or is whole
   kNoMatch = 1,  ///< queries ran, and none of them matched
   kFailed = 2,   ///< wrong usage, or a failure that was reported on standard error
 };

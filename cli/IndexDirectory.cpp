@@ -12,6 +12,7 @@
 #include "cli/Failure.h"
 #include "cli/LockWatcher.h"
 #include "cli/TableLog.h"
+#include "wordcatcher/Error.h"
 
 namespace wordcatcher::cli {
 
@@ -68,7 +69,7 @@ std::optional<std::uint64_t> tableSize(const std::string& path) {
 }
 
 std::string tryIndexing(const std::string& directory) {
-  return "index the phrases again with " + quoted("wordcatcher index " + directory) + ".";
+  return "index the phrases again with " + quoted("wordcatcher index --tables " + directory) + ".";
 }
 
 bool sameFile(const struct stat& a, const struct stat& b) {
@@ -89,19 +90,18 @@ void IndexDirectory::openForReading(const TableLog& log, const std::function<voi
   checkReadable();
   {
     const LockWatcher watcher(*this);
-    open();
+    try {
+      open();
+    } catch (const Error&) {
+      tableBytes();
+      throw;
+    }
   }
   // Only now is no other process still writing them.
   tableBytes();
   if (log.failed()) {
     throw Failure("Cannot open the index in " + quoted(_name) + " (" + errorText(log.errorCode()) +
                   "): check the directory's permissions, or " + tryIndexing(_name));
-  }
-}
-
-void IndexDirectory::checkLookups(const TableLog& log) const {
-  if (log.failed()) {
-    throw Failure("The index in " + quoted(_name) + " is damaged: " + tryIndexing(_name));
   }
 }
 

@@ -12,7 +12,7 @@ namespace wordcatcher::cli {
 
 class TableLog;
 
-/// The directory of an index and its three table files.
+/// The directory of a classic index and its three table files.
 class IndexDirectory {
  public:
   static constexpr std::size_t kTables = 3;
@@ -33,9 +33,6 @@ class IndexDirectory {
   /// checks what was opened. Failure if the directory or a table is missing, cannot be read, or is
   /// no finished table.
   void openForReading(const TableLog& log, const std::function<void()>& open) const;
-
-  /// Failure if a look-up so far could not read what a table holds.
-  void checkLookups(const TableLog& log) const;
 
   /// Bytes of the three tables; a longer file's tail that an earlier index left does not count.
   /// Failure if one of them is no finished table.

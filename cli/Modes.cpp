@@ -12,14 +12,16 @@ namespace {
 
 struct Mode {
   const char* name;
-  std::uint64_t option;
+  MatchingMode mode;
   const char* summary;
 };
 
 constexpr std::array kModes{
-    Mode{"words", 0, "a phrase is indexed and found by its words"},
-    Mode{"text", 1, "a phrase is one string, spaces and punctuation included"},
-    Mode{"phonetic", 2, "a phrase is indexed and found by how its words sound"},
+    Mode{"words", MatchingMode::words, "a phrase is indexed and found by its words"},
+    Mode{"text", MatchingMode::wholeText,
+         "a phrase is one string, spaces and punctuation included"},
+    Mode{"phonetic", MatchingMode::phoneticWords,
+         "a phrase is indexed and found by how its words sound"},
 };
 
 std::vector<std::string> names() {
@@ -29,28 +31,35 @@ std::vector<std::string> names() {
   return all;
 }
 
-std::string description() {
-  std::string text = "What is matched; the same for indexing and for querying.";
+std::string description(const std::string& withoutIt) {
+  std::string text = "How phrases are stored and found.";
   for (const auto& mode : kModes) {
     text += std::string("\n") + mode.name + ": " + mode.summary;
   }
-  return text + "\nDefault: " + kModes.front().name;
+  return text + "\nDefault: " + withoutIt;
 }
 
-std::uint64_t optionOf(const std::string& name) {
+MatchingMode modeNamed(const std::string& name) {
   const auto* const mode = std::find_if(kModes.begin(), kModes.end(),
                                         [&name](const Mode& each) { return each.name == name; });
-  return mode->option;
+  return mode->mode;
 }
 
 }  // namespace
 
-void addModeOption(CLI::App& verb, std::uint64_t& option) {
-  option = kModes.front().option;
+void addModeOption(CLI::App& verb, std::optional<MatchingMode>& mode,
+                   const std::string& withoutIt) {
   verb.add_option_function<std::string>(
-          "--mode", [&option](const std::string& name) { option = optionOf(name); }, description())
+          "--mode", [&mode](const std::string& name) { mode = modeNamed(name); },
+          description(withoutIt))
       ->check(CLI::IsMember(names()))
       ->type_name("MODE");
+}
+
+std::string nameOf(MatchingMode mode) {
+  const auto* const found = std::find_if(kModes.begin(), kModes.end(),
+                                         [mode](const Mode& each) { return each.mode == mode; });
+  return found->name;
 }
 
 }  // namespace wordcatcher::cli

@@ -1,7 +1,10 @@
 #ifndef WORDCATCHER_CLI_MODES_H
 #define WORDCATCHER_CLI_MODES_H
 
-#include <cstdint>
+#include <optional>
+#include <string>
+
+#include "wordcatcher/matcher/IndexBuilder.h"
 
 namespace CLI {
 class App;
@@ -9,9 +12,15 @@ class App;
 
 namespace wordcatcher::cli {
 
-/// Adds --mode to a verb. `option` receives the matcher's options value (see KXWordcatcher) and
-/// must live until the command line was parsed; without --mode it becomes the one of words.
-void addModeOption(CLI::App& verb, std::uint64_t& option);
+/// The mode of classic tables and of new indexes unless --mode names another.
+constexpr MatchingMode kDefaultMode = MatchingMode::words;
+
+/// Adds --mode to a verb. `mode` must live until the command line was parsed; without --mode it
+/// stays empty. `withoutIt` says in the help what happens then.
+void addModeOption(CLI::App& verb, std::optional<MatchingMode>& mode, const std::string& withoutIt);
+
+/// The name that --mode takes.
+std::string nameOf(MatchingMode mode);
 
 }  // namespace wordcatcher::cli
 

@@ -17,8 +17,8 @@ constexpr const char* kWipe = "\r\x1b[K";
 
 }  // namespace
 
-ProgressBar::ProgressBar(std::size_t total)
-    : _total(std::max<std::size_t>(total, 1)),
+ProgressBar::ProgressBar(std::optional<std::size_t> total)
+    : _total(total),
       _terminal(isatty(STDERR_FILENO) == 1),
       _next(std::chrono::steady_clock::now()) {}
 
@@ -37,9 +37,14 @@ void ProgressBar::show(std::size_t done) {
     return;
   }
   _next = now + kRedrawEvery;
-  const std::size_t filled = done * kWidth / _total;
+  if (!_total) {
+    draw(std::to_string(done) + " phrases read");
+    return;
+  }
+  const std::size_t total = std::max<std::size_t>(*_total, 1);
+  const std::size_t filled = done * kWidth / total;
   draw('[' + std::string(filled, '#') + std::string(kWidth - filled, ' ') + "] " +
-       std::to_string(done * kPercent / _total) + " % of " + std::to_string(_total) + " phrases");
+       std::to_string(done * kPercent / total) + " % of " + std::to_string(total) + " phrases");
 }
 
 void ProgressBar::say(const std::string& text) {

@@ -3,6 +3,7 @@
 
 #include <chrono>
 #include <cstddef>
+#include <optional>
 #include <string>
 
 namespace wordcatcher::cli {
@@ -12,8 +13,8 @@ namespace wordcatcher::cli {
 /// error is no terminal.
 class ProgressBar {
  public:
-  /// `total` is what show() will come to.
-  explicit ProgressBar(std::size_t total);
+  /// `total` is what show() will come to; without it only a count is shown.
+  explicit ProgressBar(std::optional<std::size_t> total = std::nullopt);
   ~ProgressBar();
   ProgressBar(const ProgressBar&) = delete;
   ProgressBar& operator=(const ProgressBar&) = delete;
@@ -27,7 +28,7 @@ class ProgressBar {
  private:
   void draw(const std::string& line);
 
-  std::size_t _total;
+  std::optional<std::size_t> _total;
   bool _terminal;
   bool _drawn = false;
   std::chrono::steady_clock::time_point _next;

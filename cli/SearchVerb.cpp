@@ -2,18 +2,16 @@
 #include <cstdint>
 #include <memory>
 #include <nlohmann/json.hpp>
+#include <optional>
 #include <string>
 #include <vector>
 
 #include "cli/Arguments.h"
 #include "cli/Failure.h"
-#include "cli/IndexDirectory.h"
+#include "cli/OpenIndex.h"
 #include "cli/Output.h"
 #include "cli/Questions.h"
-#include "cli/TableLog.h"
-#include "cli/Utf8.h"
 #include "cli/Verbs.h"
-#include "wordcatcher/fuzzy/LXFuzzyIndex.h"
 
 namespace wordcatcher::cli {
 
@@ -21,10 +19,9 @@ namespace {
 
 using Json = nlohmann::ordered_json;
 
-constexpr std::int32_t kReading = 1;
 constexpr std::int64_t kDefaultDistance = 2;
 
-// What the newer interface takes as well: more edits than that make any word near any other.
+// What the library takes: more edits than that make any word near any other.
 constexpr std::int64_t kLargestDistance = 16;
 
 constexpr const char* kDataSeparator = " | ";
@@ -37,57 +34,58 @@ WORDs, and the lines of standard input, each stand as a heading above their matc
 
 --json prints one object a WORD instead:
   {"word": "...", "matches": [{"value": "...", "distance": 1, "data": ["..."]}]}
+"truncated": true comes last when the WORD is too long to be looked up; without
+--json a note on standard error says so.
 
 Examples:
-  wordcatcher search dogs goldan
-  wordcatcher search --max-distance 1 --json dogs goldan retriver
-  wordcatcher search dogs < words.txt)";
+  wordcatcher search dogs.wci goldan
+  wordcatcher search --max-distance 1 --json dogs.wci goldan retriver
+  wordcatcher search dogs.wci < words.txt)";
 
 struct Arguments {
   std::int64_t maxDistance = kDefaultDistance;
   bool json = false;
   bool verbose = false;
-  std::string directory;
+  std::string index;
   std::vector<std::string> words;
 };
 
-std::vector<std::string> dataOf(const LXFuzzyMatch& match) {
-  std::vector<std::string> data;
-  for (const auto& each : match.data()) {
-    data.push_back(toUtf8(each));
-  }
-  return data;
-}
-
-std::string jsonLine(const std::string& word, const std::vector<LXFuzzyMatch>& matches) {
+std::string jsonLine(const std::string& word, const Index::SearchResult& result) {
   Json list = Json::array();
-  for (const auto& match : matches) {
-    list.push_back(Json{
-        {"value", toUtf8(match.value())}, {"distance", match.distance()}, {"data", dataOf(match)}});
+  for (const auto& match : result.matches) {
+    list.push_back(
+        Json{{"value", match.value}, {"distance", match.distance}, {"data", match.data}});
   }
-  return Json{{"word", word}, {"matches", list}}.dump() + '\n';
+  Json object = {{"word", word}, {"matches", list}};
+  if (result.truncated) {
+    object["truncated"] = true;
+  }
+  return object.dump() + '\n';
 }
 
-std::string plainLines(const std::vector<LXFuzzyMatch>& matches) {
+std::string plainLines(const Index::SearchResult& result) {
   std::string lines;
-  for (const auto& match : matches) {
-    lines += toUtf8(match.value()) + '\t' + std::to_string(match.distance()) + '\t' +
-             CLI::detail::join(dataOf(match), kDataSeparator) + '\n';
+  for (const auto& match : result.matches) {
+    lines += match.value + '\t' + std::to_string(match.distance) + '\t' +
+             CLI::detail::join(match.data, kDataSeparator) + '\n';
   }
   return lines;
 }
 
 ExitCode runSearch(const Arguments& arguments) {
-  const IndexDirectory directory(arguments.directory);
   const Questions questions(arguments.words, !arguments.json);
-  const TableLog log(arguments.verbose);
-  LXFuzzyIndex index(directory.path());
-  directory.openForReading(log, [&index] { index.setMode(kReading); });
+  const Index index = openIndex(arguments.index, std::nullopt, arguments.verbose);
   return questions.answerEach([&](const InputLine& question, Output& output) {
-    const auto matches = index.search_withMaxDistance(question.text, arguments.maxDistance);
-    directory.checkLookups(log);
-    output.write(arguments.json ? jsonLine(question.utf8, matches) : plainLines(matches));
-    return !matches.empty();
+    const auto result = index.search(question.utf8, arguments.maxDistance);
+    if (arguments.json) {
+      output.write(jsonLine(question.utf8, result));
+    } else {
+      output.write(plainLines(result));
+      if (result.truncated) {
+        noteTruncated();
+      }
+    }
+    return !result.matches.empty();
   });
 }
 
@@ -101,8 +99,9 @@ void addSearchVerb(CLI::App& program, ChosenVerb& chosen) {
       ->type_name("K in [0 - " + std::to_string(kLargestDistance) + "]")
       ->capture_default_str();
   verb->add_flag("--json", arguments->json, "Print a JSON object a word");
-  verb->add_flag("--verbose", arguments->verbose, "Show the storage log on standard error");
-  addArgument(*verb, "DIR", arguments->directory, "The index directory");
+  verb->add_flag("--verbose", arguments->verbose, "Show the tables' storage log on standard error");
+  addArgument(*verb, "INDEX", arguments->index,
+              "A search image, or the directory of a classic index");
   addArguments(*verb, "WORD", arguments->words, "Words; without any, the lines of standard input");
   verb->footer(kFooter);
   verb->callback([arguments, &chosen] { chosen = [arguments] { return runSearch(*arguments); }; });

@@ -11,15 +11,18 @@ class App;
 
 namespace wordcatcher::cli {
 
-/// The verb that the command line chose, ready to run. It ends with an exit code or throws Failure.
+/// The verb that the command line chose, ready to run. It ends with an exit code or throws Failure
+/// or another exception whose text is a sentence for the user.
 using ChosenVerb = std::function<ExitCode()>;
 
 // Each adds one verb to the program; parsing a command line that names it sets `chosen`. Both must
 // live until the command line was parsed.
 void addEncodeVerb(CLI::App& program, ChosenVerb& chosen);
 void addIndexVerb(CLI::App& program, ChosenVerb& chosen);
+void addInfoVerb(CLI::App& program, ChosenVerb& chosen);
 void addQueryVerb(CLI::App& program, ChosenVerb& chosen);
 void addSearchVerb(CLI::App& program, ChosenVerb& chosen);
+void addVerifyVerb(CLI::App& program, ChosenVerb& chosen);
 
 }  // namespace wordcatcher::cli
 

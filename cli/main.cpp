@@ -22,13 +22,14 @@ constexpr const char* kSummary =
     "Finds stored phrases in free text, tolerating spelling mistakes.\n";
 
 constexpr const char* kFooter = R"(
-Exit codes: 0 matches were found (or the index was written, or codes were printed),
-1 nothing matched, 2 wrong usage or a failure.
+Exit codes: 0 matches were found (or the index was written or is whole, or codes were
+printed), 1 nothing matched, 2 wrong usage or a failure.
 
 Examples:
-  printf 'golden retriever\ngolden gate bridge\n' | wordcatcher index dogs
-  wordcatcher query dogs 'a goldan retriver'
-  wordcatcher search --max-distance 1 dogs bridg
+  printf 'golden retriever\ngolden gate bridge\n' | wordcatcher index dogs.wci
+  wordcatcher query dogs.wci 'a goldan retriver'
+  wordcatcher search --max-distance 1 dogs.wci bridg
+  wordcatcher info dogs.wci
   wordcatcher encode 'Catherine Schmidt'
 "wordcatcher VERB --help" tells more about a verb.)";
 
@@ -80,6 +81,8 @@ ExitCode run(int argc, char** argv) {
   addIndexVerb(program, chosen);
   addQueryVerb(program, chosen);
   addSearchVerb(program, chosen);
+  addInfoVerb(program, chosen);
+  addVerifyVerb(program, chosen);
   addEncodeVerb(program, chosen);
   if (argc <= 1) {
     std::cerr << program.help();

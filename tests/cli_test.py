@@ -46,10 +46,14 @@ def locked(path):
 
 
 class CommandTest(unittest.TestCase):
+    """Tests index into images; those with `tables` set, into the tables of classic indexes."""
+    tables = False
+
     def setUp(self):
         self.root = tempfile.mkdtemp(prefix="wordcatcher-cli-")
         self.addCleanup(shutil.rmtree, self.root)
-        self.dogs = self.path("dogs")
+        self.dogs = self.path("dogs" if self.tables else "dogs.wci")
+        self.index_verb = ["index", "--tables"] if self.tables else ["index"]
 
     def path(self, *names):
         return os.path.join(self.root, *names)
@@ -81,7 +85,7 @@ class CommandTest(unittest.TestCase):
             self.assertIn(word, self.err)
 
     def index(self, phrases=DOGS, directory=None, *options):
-        self.succeed("index", *options, directory or self.dogs, stdin=phrases)
+        self.succeed(*self.index_verb, *options, directory or self.dogs, stdin=phrases)
 
     def start(self, *arguments, **options):
         process = subprocess.Popen([PROGRAM, *arguments], stdin=subprocess.PIPE,
@@ -112,9 +116,11 @@ class CommandTest(unittest.TestCase):
 
     def snapshot(self, directory):
         content = {}
-        for name in sorted(os.listdir(directory)):
-            with open(os.path.join(directory, name), "rb") as file:
-                content[name] = file.read()
+        for parent, _, names in os.walk(directory):
+            for name in names:
+                path = os.path.join(parent, name)
+                with open(path, "rb") as file:
+                    content[os.path.relpath(path, directory)] = file.read()
         return content
 
 
@@ -122,7 +128,7 @@ class ProgramTest(CommandTest):
     def test_without_arguments_shows_help_on_standard_error(self):
         self.assertEqual(self.run_it(), 2)
         self.assertEqual(self.out, "")
-        for verb in ("index", "query", "search"):
+        for verb in ("index", "query", "search", "info", "verify"):
             self.assertIn(verb, self.err)
 
     def test_version(self):
@@ -130,7 +136,7 @@ class ProgramTest(CommandTest):
 
     def test_help_has_examples(self):
         self.assertIn("Examples:", self.succeed("--help"))
-        for verb in ("index", "query", "search"):
+        for verb in ("index", "query", "search", "info", "verify"):
             help_text = self.succeed(verb, "--help")
             self.assertIn(f"Usage: wordcatcher {verb}", help_text)
             self.assertIn(f"  wordcatcher {verb} ", help_text.split("Examples:")[1])
@@ -141,7 +147,7 @@ class ProgramTest(CommandTest):
         self.fail_with("wordcatcher query --help", of=["query"])
         self.fail_with("--nonsense", of=["query", "--nonsense", self.dogs])
         self.fail_with("sounds", "words", "text", of=["query", "--mode", "sounds", self.dogs])
-        self.fail_with("sounds", of=["index", "--mode", "sounds", self.dogs])
+        self.fail_with("sounds", of=[*self.index_verb, "--mode", "sounds", self.dogs])
         self.assertFalse(os.path.exists(self.dogs))
 
     def test_help_that_cannot_be_written(self):
@@ -154,6 +160,171 @@ class IndexTest(CommandTest):
     def values(self, *texts, options=()):
         lines = self.succeed("query", "--json", *options, self.dogs, *texts).splitlines()
         return [[match["value"] for match in json.loads(line)["matches"] or []] for line in lines]
+
+    def content(self):
+        """The index's bytes, of all its files."""
+        if self.tables:
+            return self.snapshot(self.dogs)
+        with open(self.dogs, "rb") as file:
+            return file.read()
+
+
+class InputTest(IndexTest):
+    def test_data_is_the_phrase_with_its_fields_in_braces(self):
+        self.index("golden retriever\t7, gold\nborder collie\ngreat dane\t\n")
+        self.assertEqual(self.values("golden retriever", "border collie", "great dane"),
+                         [["golden retriever{ 7, gold }"], ["border collie"], ["great dane"]])
+
+    def test_reads_files_and_standard_input(self):
+        names = self.write("names.txt", "border collie\n")
+        more = self.write("more.txt", "great dane")
+        self.succeed(*self.index_verb, self.dogs, names, "-", more, stdin="golden retriever\n")
+        self.assertIn("Indexed 3 phrases (6 words)", self.err)
+        self.assertEqual(self.values("border collie", "great dane", "golden retriever"),
+                         [["border collie"], ["great dane"], ["golden retriever"]])
+
+    def test_files_of_other_systems(self):
+        self.index(b"\xef\xbb\xbfborder collie\r\n\r\n  \t \r\ngreat dane\t3\r\n")
+        self.assertIn("Indexed 2 phrases", self.err)
+        self.assertEqual(self.values("border collie", "great dane"),
+                         [["border collie"], ["great dane{ 3 }"]])
+
+    def test_text_mode(self):
+        self.index("The Great Gatsby\t1925\n", None, "--mode", "text")
+        self.assertEqual(self.values("the grate gatsby", options=["--mode", "text"]),
+                         [["the great gatsby"]])
+        self.assertEqual(self.run_it("query", "--mode", "text", self.dogs, "gatsby"), 1)
+
+    def test_no_phrases_make_an_empty_index(self):
+        self.index("\n")
+        self.assertIn("Indexed 0 phrases (0 words)", self.err)
+        self.assertEqual(self.run_it("query", self.dogs, "golden"), 1)
+
+    def test_invalid_utf8_leaves_everything_as_it_was(self):
+        self.index()
+        before = self.content()
+        bad = self.write("names.txt", b"border collie\ngr\xf6\xdfe\n")
+        self.fail_with(f"{bad}, line 2", "UTF-8", of=[*self.index_verb, self.dogs, bad])
+        self.fail_with("standard input, line 1", of=[*self.index_verb, self.dogs], stdin=b"\xff\n")
+        self.assertEqual(self.content(), before)
+        self.fail_with("line 2", of=[*self.index_verb, self.path("new"), bad])
+        self.assertFalse(os.path.exists(self.path("new")))
+        self.assertEqual(sorted(os.listdir(self.root)), [os.path.basename(self.dogs), "names.txt"])
+
+    def test_input_that_cannot_be_stored(self):
+        self.fail_with("line 2", "zero byte", of=[*self.index_verb, self.dogs], stdin="collie\nda\0ne\n")
+        self.fail_with("line 1", "no phrase", of=[*self.index_verb, self.dogs], stdin="\t7\n")
+        self.fail_with("absent.txt", of=[*self.index_verb, self.dogs, self.path("absent.txt")])
+        self.fail_with(self.root, of=[*self.index_verb, self.dogs, self.root])
+        self.fail_with("empty", of=[*self.index_verb, ""])
+        self.assertFalse(os.path.exists(self.dogs))
+
+    def test_progress_only_on_a_terminal(self):
+        names = self.write("names.txt", DOGS)
+        master, terminal = pty.openpty()
+        with open(master, "rb", buffering=0) as screen:
+            done = subprocess.run([PROGRAM, *self.index_verb, self.dogs, names], stderr=terminal,
+                                  timeout=PATIENCE)
+            os.close(terminal)
+            shown = b""
+            with contextlib.suppress(OSError):
+                while chunk := screen.read(4096):
+                    shown += chunk
+        self.assertEqual(done.returncode, 0)
+        self.assertIn(b"% of 2 phrases" if self.tables else b"0 phrases read", shown)
+        self.assertIn(b"\r\x1b[KIndexed 2 phrases", shown)
+        self.succeed(*self.index_verb, self.dogs, names)
+        self.assertNotIn("\r", self.err)
+
+
+class TablesInputTest(InputTest):
+    tables = True
+
+
+class ImageIndexTest(IndexTest):
+    def stood(self):
+        """Indexes, so that an image stands there, and returns its bytes."""
+        self.index()
+        return self.content()
+
+    def check_whole(self, before):
+        self.assertEqual(self.content(), before)
+        self.assertEqual(self.others(), [])
+        self.assertEqual(self.values("golden gate bridge"), [[BRIDGE]])
+
+    def others(self):
+        return [name for name in os.listdir(self.root) if name not in ("dogs.wci", "names.txt")]
+
+    def test_reports_phrases_words_bytes_and_time(self):
+        self.index()
+        size = os.path.getsize(self.dogs)
+        self.assertRegex(self.err,
+                         rf"^Indexed 2 phrases \(6 words\) into {size} bytes in \d+\.\d\d s\.\n$")
+        self.assertEqual(self.out, "")
+        self.assertEqual(os.listdir(self.root), ["dogs.wci"])
+
+    def test_directory_needs_tables(self):
+        os.mkdir(self.path("kennel"))
+        self.fail_with("is a directory", "names.wci", "--tables",
+                       of=["index", self.path("kennel")], stdin=DOGS)
+        self.fail_with("--tables", of=["index", self.path("new/")], stdin=DOGS)
+        self.assertEqual(os.listdir(self.path("kennel")), [])
+        self.succeed("index", "--tables", self.path("kennel"), stdin=DOGS)
+        self.assertEqual(sorted(os.listdir(self.path("kennel"))), sorted(TABLES))
+
+    def test_place_that_cannot_be_written(self):
+        self.fail_with("its directory", of=["index", self.path("no", "dogs.wci")], stdin=DOGS)
+        os.mkfifo(self.path("pipe"))
+        self.fail_with("regular file", of=["index", self.path("pipe")], stdin=DOGS)
+
+    def test_full_disk_leaves_the_old_image_whole(self):
+        before = self.stood()
+        self.fail_with("cannot be written", "File too large", "room",
+                       of=["index", self.dogs], stdin=many_phrases(300),
+                       preexec_fn=limit_file_size(4096))
+        self.check_whole(before)
+
+    def test_readers_of_the_old_image_are_not_disturbed(self):
+        self.index()
+        reader = self.start("query", "--json", self.dogs)
+        for phrases in ("golden gate bridge\n", "great dane\n"):
+            self.index(phrases)
+            reader.stdin.write(b"golden gate bridge\n")
+            reader.stdin.flush()
+            self.assertEqual(json.loads(self.line_of(reader.stdout))["query"], "golden gate bridge")
+        self.assertEqual(self.values("great dane"), [["great dane"]])
+
+    def test_interrupt_leaves_the_old_image_whole(self):
+        before = self.stood()
+        for number in (signal.SIGINT, signal.SIGTERM, signal.SIGHUP):
+            process = self.start("index", self.dogs)
+            process.stdin.write(many_phrases(1000).encode())
+            process.stdin.flush()
+            time.sleep(0.1)
+            process.send_signal(number)
+            self.assertEqual(process.wait(5), -number)
+            self.check_whole(before)
+
+    def test_interrupt_while_writing_leaves_nothing_behind(self):
+        before = self.stood()
+        names = self.write("names.txt", many_phrases(40000))
+        interrupted = 0
+        for _ in range(10):
+            process = self.start("index", self.dogs, names)
+            self.wait_until(lambda: self.others() or process.poll() is not None)
+            process.send_signal(signal.SIGTERM)
+            process.wait(PATIENCE)
+            self.assertEqual(self.others(), [])
+            self.assertIn("is whole", self.succeed("verify", self.dogs))
+            if process.returncode == -signal.SIGTERM:
+                interrupted += 1
+            if self.content() != before:
+                before = self.stood()
+        self.assertGreater(interrupted, 0)
+
+
+class TablesIndexTest(IndexTest):
+    tables = True
 
     def test_reports_phrases_words_bytes_and_time(self):
         self.index()
@@ -171,95 +342,47 @@ class IndexTest(CommandTest):
         self.assertEqual(self.err.split(" in ")[0], small)
         self.assertEqual(self.values("retriever", "poodle"), [[], ["poodle"]])
 
-    def test_data_is_the_phrase_with_its_fields_in_braces(self):
-        self.index("golden retriever\t7, gold\nborder collie\ngreat dane\t\n")
-        self.assertEqual(self.values("golden retriever", "border collie", "great dane"),
-                         [["golden retriever{ 7, gold }"], ["border collie"], ["great dane"]])
-
-    def test_reads_files_and_standard_input(self):
-        names = self.write("names.txt", "border collie\n")
-        more = self.write("more.txt", "great dane")
-        self.succeed("index", self.dogs, names, "-", more, stdin="golden retriever\n")
-        self.assertIn("Indexed 3 phrases (6 words)", self.err)
-        self.assertEqual(self.values("border collie", "great dane", "golden retriever"),
-                         [["border collie"], ["great dane"], ["golden retriever"]])
-
-    def test_files_of_other_systems(self):
-        self.index(b"\xef\xbb\xbfborder collie\r\n\r\n  \t \r\ngreat dane\t3\r\n")
-        self.assertIn("Indexed 2 phrases", self.err)
-        self.assertEqual(self.values("border collie", "great dane"),
-                         [["border collie"], ["great dane{ 3 }"]])
-
-    def test_text_mode(self):
-        self.index("The Great Gatsby\t1925\n", None, "--mode", "text")
-        self.assertEqual(self.values("the grate gatsby", options=["--mode", "text"]),
-                         [["the great gatsby"]])
-        self.assertEqual(self.run_it("query", self.dogs, "gatsby"), 1)
-
-    def test_no_phrases_make_an_empty_index(self):
-        self.index("\n")
-        self.assertIn("Indexed 0 phrases (0 words)", self.err)
-        self.assertEqual(self.run_it("query", self.dogs, "golden"), 1)
-
     def test_directory_with_a_slash_and_without(self):
         self.index(DOGS, self.dogs + "/")
         self.succeed("query", self.dogs, "golden gate bridge")
         self.succeed("search", self.dogs + "/", "golden")
         self.assertEqual(os.listdir(self.root), ["dogs"])
 
-    def test_invalid_utf8_leaves_everything_as_it_was(self):
-        self.index()
-        before = self.snapshot(self.dogs)
-        bad = self.write("names.txt", b"border collie\ngr\xf6\xdfe\n")
-        self.fail_with(f"{bad}, line 2", "UTF-8", of=["index", self.dogs, bad])
-        self.fail_with("standard input, line 1", of=["index", self.dogs], stdin=b"\xff\n")
-        self.assertEqual(self.snapshot(self.dogs), before)
-        self.fail_with("line 2", of=["index", self.path("new"), bad])
-        self.assertFalse(os.path.exists(self.path("new")))
-
-    def test_input_that_cannot_be_stored(self):
-        self.fail_with("line 2", "zero byte", of=["index", self.dogs], stdin="collie\nda\0ne\n")
-        self.fail_with("line 1", "no phrase", of=["index", self.dogs], stdin="\t7\n")
-        self.fail_with("absent.txt", of=["index", self.dogs, self.path("absent.txt")])
-        self.fail_with(self.root, of=["index", self.dogs, self.root])
-        self.fail_with("empty", of=["index", ""])
-        self.assertFalse(os.path.exists(self.dogs))
-
     def test_directory_that_cannot_be_written(self):
         file = self.write("names.txt", "")
-        self.fail_with("not a directory", of=["index", file], stdin=DOGS)
-        self.fail_with("parent", of=["index", self.path("names.txt", "dogs")], stdin=DOGS)
-        self.fail_with("parent", of=["index", self.path("no", "dogs")], stdin=DOGS)
-        self.fail_with("/proc/self", "writable", of=["index", "/proc/self"], stdin=DOGS)
+        self.fail_with("not a directory", of=[*self.index_verb, file], stdin=DOGS)
+        self.fail_with("parent", of=[*self.index_verb, self.path("names.txt", "dogs")], stdin=DOGS)
+        self.fail_with("parent", of=[*self.index_verb, self.path("no", "dogs")], stdin=DOGS)
+        self.fail_with("/proc/self", "writable", of=[*self.index_verb, "/proc/self"], stdin=DOGS)
 
     def test_table_that_cannot_be_written(self):
         os.mkdir(self.dogs)
         os.symlink(self.path("elsewhere"), self.path("dogs", DATA))
-        self.fail_with(DATA, of=["index", self.dogs], stdin=DOGS)
+        self.fail_with(DATA, of=[*self.index_verb, self.dogs], stdin=DOGS)
         self.assertEqual(os.listdir(self.dogs), [DATA])
         self.assertFalse(os.path.exists(self.path("elsewhere")))
         os.remove(self.path("dogs", DATA))
         os.mkfifo(self.path("dogs", FINALS))
-        self.fail_with(FINALS, "regular file", of=["index", self.dogs], stdin=DOGS)
+        self.fail_with(FINALS, "regular file", of=[*self.index_verb, self.dogs], stdin=DOGS)
         self.assertEqual(os.listdir(self.dogs), [FINALS])
 
     def test_full_disk_leaves_no_directory_behind(self):
         for limit in (1024, 4096, 20000):
             self.fail_with("Cannot write the index", "File too large", "room",
-                           of=["index", self.dogs], stdin=many_phrases(300),
+                           of=[*self.index_verb, self.dogs], stdin=many_phrases(300),
                            preexec_fn=limit_file_size(limit))
             self.assertFalse(os.path.exists(self.dogs), limit)
 
     def test_full_disk_leaves_no_new_tables_behind(self):
         os.mkdir(self.dogs)
         self.write("dogs/notes.txt", "mine")
-        self.fail_with("Cannot write the index", of=["index", self.dogs],
+        self.fail_with("Cannot write the index", of=[*self.index_verb, self.dogs],
                        stdin=DOGS, preexec_fn=limit_file_size(1024))
         self.assertEqual(os.listdir(self.dogs), ["notes.txt"])
 
     def test_full_disk_leaves_no_half_made_index_in_place_of_the_old_one(self):
         self.index()
-        self.fail_with("Cannot write the index", of=["index", self.dogs],
+        self.fail_with("Cannot write the index", of=[*self.index_verb, self.dogs],
                        stdin=many_phrases(300), preexec_fn=limit_file_size(20000))
         self.fail_with("unfinished", "wordcatcher index", of=["query", self.dogs, "golden"])
         self.index()
@@ -268,32 +391,15 @@ class IndexTest(CommandTest):
     def test_failed_run_marks_the_tables_that_it_had_not_reached(self):
         """Only edges grow before the failure; the other tables would still pass for the old ones."""
         self.index("poodle\n", None, "--mode", "text")
-        self.fail_with("Cannot write the index", of=["index", "--mode", "text", self.dogs],
+        self.fail_with("Cannot write the index", of=[*self.index_verb, "--mode", "text", self.dogs],
                        stdin="retriever " * 120, preexec_fn=limit_file_size(100000))
         for table, content in self.snapshot(self.dogs).items():
             self.assertEqual(content[:2048], b"\0" * 2048, table)
 
-    def test_progress_only_on_a_terminal(self):
-        names = self.write("names.txt", DOGS)
-        master, terminal = pty.openpty()
-        with open(master, "rb", buffering=0) as screen:
-            done = subprocess.run([PROGRAM, "index", self.dogs, names], stderr=terminal,
-                                  timeout=PATIENCE)
-            os.close(terminal)
-            shown = b""
-            with contextlib.suppress(OSError):
-                while chunk := screen.read(4096):
-                    shown += chunk
-        self.assertEqual(done.returncode, 0)
-        self.assertIn(b"% of 2 phrases", shown)
-        self.assertIn(b"\r\x1b[KIndexed 2 phrases", shown)
-        self.succeed("index", self.dogs, names)
-        self.assertNotIn("\r", self.err)
-
     def test_verbose_shows_the_storage_log(self):
-        self.succeed("index", "--verbose", self.dogs, stdin=DOGS)
+        self.succeed(*self.index_verb, "--verbose", self.dogs, stdin=DOGS)
         self.assertIn(f"-[TinyCDB setMode:] Finalizing {self.dogs}/{EDGES}\n", self.err)
-        self.succeed("index", self.dogs, stdin=DOGS)
+        self.succeed(*self.index_verb, self.dogs, stdin=DOGS)
         self.assertNotIn("TinyCDB", self.err)
 
 
@@ -405,6 +511,122 @@ class QueryTest(CommandTest):
         self.assertIn(b"standard input", done.stderr)
 
 
+class TablesQueryTest(QueryTest):
+    tables = True
+
+
+class ModeTest(CommandTest):
+    def setUp(self):
+        super().setUp()
+        self.titles = self.path("titles.wci")
+        self.index("The Great Gatsby\t1925\n", self.titles, "--mode", "text")
+
+    def test_images_remember_their_mode(self):
+        self.assertEqual(self.succeed("query", self.titles, "the grate gatsby"),
+                         self.succeed("query", "--mode", "text", self.titles, "the grate gatsby"))
+        self.assertIn("the great gatsby", self.out)
+        names = self.path("names.wci")
+        self.index("Catherine Schmidt\n", names, "--mode", "phonetic")
+        self.assertEqual(self.succeed("query", names, "Kathryn Shmit"), "0\tCatherine Schmidt\n")
+
+    def test_another_mode_than_the_image_s(self):
+        for mode in ("words", "phonetic"):
+            self.fail_with("text", mode, "--mode",
+                           of=["query", "--mode", mode, self.titles, "gatsby"])
+        self.index()
+        self.fail_with("words", "text", of=["query", "--mode", "text", self.dogs, "golden"])
+
+    def test_tables_are_read_in_words_mode_unless_told(self):
+        titles = self.path("titles")
+        self.succeed("index", "--tables", "--mode", "text", titles, stdin="The Great Gatsby\n")
+        self.assertEqual(self.run_it("query", titles, "the grate gatsby"), 1)
+        self.succeed("query", "--mode", "text", titles, "the grate gatsby")
+
+
+class BudgetTest(CommandTest):
+    def setUp(self):
+        super().setUp()
+        self.index()
+
+    def test_long_texts_are_cut_and_it_says_so(self):
+        text = "golden gate bridge " + "xyzzy " * 5000
+        short = "golden gate bridge"
+        self.run_it("query", self.dogs, stdin=text)
+        self.assertIn("limits", self.err)
+        self.assertEqual(self.err.count("\n"), 1)
+        self.run_it("query", "--json", self.dogs, stdin=f"{text}\n{short}")
+        self.assertEqual(self.err, "")
+        long, plain = (json.loads(line) for line in self.out.splitlines())
+        self.assertEqual(list(long), ["query", "matches", "truncated"])
+        self.assertIs(long["truncated"], True)
+        self.assertNotIn("truncated", plain)
+
+    def test_long_words_are_not_looked_up_and_it_says_so(self):
+        word = "golden" * 1000
+        self.assertEqual(self.run_it("search", self.dogs, word), 1)
+        self.assertIn("limits", self.err)
+        self.assertEqual(self.run_it("search", "--json", self.dogs, word), 1)
+        self.assertEqual(json.loads(self.out), {"word": word, "matches": [], "truncated": True})
+        self.assertEqual(self.err, "")
+
+
+class InfoTest(CommandTest):
+    def test_image(self):
+        self.index()
+        told = json.loads(self.succeed("info", "--json", self.dogs))
+        self.assertRegex(told.pop("generation"), "^[0-9a-f]{32}$")
+        self.assertEqual(told, {"mode": "words", "phrases": 2, "words": 5, "data": 2,
+                                "bytes": os.path.getsize(self.dogs), "version": 1})
+        lines = self.succeed("info", self.dogs).splitlines()
+        self.assertEqual(lines[:4], ["mode\twords", "phrases\t2", "words\t5", "data\t2"])
+        self.assertEqual(len(lines), 7)
+
+    def test_tables(self):
+        dogs = self.path("dogs")
+        self.succeed("index", "--tables", dogs, stdin=DOGS)
+        size = sum(len(content) for content in self.snapshot(dogs).values())
+        self.assertEqual(self.succeed("info", dogs), f"words\t5\ndata\t2\nbytes\t{size}\n")
+        told = json.loads(self.succeed("info", "--json", dogs))
+        self.assertEqual(told, {"mode": None, "phrases": None, "words": 5, "data": 2,
+                                "bytes": size, "generation": None, "version": None})
+
+
+class VerifyTest(CommandTest):
+    def test_whole(self):
+        self.index()
+        self.assertEqual(self.succeed("verify", self.dogs),
+                         f"{self.dogs} is whole: 2 phrases, 5 words, 2 data strings.\n")
+        dogs = self.path("dogs")
+        self.succeed("index", "--tables", dogs, stdin=DOGS)
+        self.assertEqual(self.succeed("verify", dogs),
+                         f"{dogs} is whole: 5 words, 2 data strings.\n")
+
+    def test_any_altered_byte_of_the_content_is_found(self):
+        self.index()
+        with open(self.dogs, "rb") as file:
+            image = file.read()
+        for place in (9, 70, len(image) // 2, len(image) - 1):
+            altered = bytearray(image)
+            altered[place] ^= 0x10
+            self.write("dogs.wci", bytes(altered))
+            self.fail_with("dogs.wci", of=["verify", self.dogs])
+
+    def test_truncated_missing_and_foreign_files(self):
+        verbs = (["verify"], ["info"], ["query"], ["search"])
+        self.index()
+        os.truncate(self.dogs, os.path.getsize(self.dogs) - 1)
+        for verb in verbs:
+            self.fail_with("damaged", "dogs.wci", of=[*verb, self.dogs], stdin="golden\n")
+        self.write("dogs.wci", b"golden retriever\n" * 100)
+        for verb in verbs:
+            self.fail_with("not a search image", of=[*verb, self.dogs], stdin="golden\n")
+        os.remove(self.dogs)
+        for verb in verbs:
+            self.fail_with("There is no index", of=[*verb, self.dogs], stdin="golden\n")
+            self.fail_with("name of the index is empty", of=[*verb, ""], stdin="golden\n")
+        self.assertEqual(os.listdir(self.root), [])
+
+
 class SearchTest(CommandTest):
     def setUp(self):
         super().setUp()
@@ -453,6 +675,10 @@ class SearchTest(CommandTest):
             self.assertEqual(json.loads(self.line_of(process.stdout))["word"], word)
 
 
+class TablesSearchTest(SearchTest):
+    tables = True
+
+
 class EncodeTest(CommandTest):
     def test_codes_stand_one_space_apart(self):
         self.assertEqual(self.succeed("encode", "Catherine  Schmidt", "Kathryn Shmit"),
@@ -484,15 +710,19 @@ class EncodeTest(CommandTest):
 
 
 class DamagedIndexTest(CommandTest):
+    tables = True
+
     def check(self, *words):
         for verb in ("query", "search"):
             self.fail_with(*words, of=[verb, self.dogs, "golden"])
 
     def test_missing_directory(self):
-        self.check("dogs", "wordcatcher index")
+        for verb in ("query", "search"):
+            self.fail_with("dogs/", "wordcatcher index --tables", of=[verb, self.dogs + "/", "x"])
         self.assertFalse(os.path.exists(self.dogs))
         self.write("dogs", "a file")
-        self.check("Not a directory")
+        for verb in ("query", "search"):
+            self.fail_with("Not a directory", of=[verb, self.dogs + "/", "x"])
 
     def test_missing_table(self):
         os.mkdir(self.dogs)
@@ -526,6 +756,8 @@ class DamagedIndexTest(CommandTest):
 
 
 class LockTest(CommandTest):
+    tables = True
+
     def said(self, process):
         start = time.monotonic()
         line = self.line_of(process.stderr)
@@ -537,7 +769,7 @@ class LockTest(CommandTest):
         for table in TABLES[1:]:
             with locked(self.path("dogs", table)), locked(self.path("other", table)):
                 waiting = [self.start("query", self.dogs, "golden gate bridge"),
-                           self.start("index", self.path("other"))]
+                           self.start(*self.index_verb, self.path("other"))]
                 waiting[1].stdin.write(b"great dane\n")
                 waiting[1].stdin.close()
                 line, seconds = self.said(waiting[0])
@@ -598,7 +830,7 @@ class LockTest(CommandTest):
         before = self.snapshot(self.dogs)
         with locked(self.path("dogs", DATA)):
             for number in (signal.SIGINT, signal.SIGTERM, signal.SIGHUP):
-                self.interrupt_waiting(number, "index", self.dogs)
+                self.interrupt_waiting(number, *self.index_verb, self.dogs)
             self.interrupt_waiting(signal.SIGINT, "query", self.dogs, "golden")
             self.interrupt_waiting(signal.SIGINT, "search", self.dogs, "golden")
         self.assertEqual(self.snapshot(self.dogs), before)
@@ -607,11 +839,13 @@ class LockTest(CommandTest):
         os.mkdir(self.dogs)
         self.write(f"dogs/{DATA}", b"")
         with locked(self.path("dogs", DATA)):
-            self.interrupt_waiting(signal.SIGINT, "index", self.dogs)
+            self.interrupt_waiting(signal.SIGINT, *self.index_verb, self.dogs)
         self.assertEqual(os.listdir(self.dogs), [DATA])
 
 
 class InterruptTest(CommandTest):
+    tables = True
+
     def interrupt_indexing(self):
         """Interrupts while table files are growing: the edges under one prefix make finishing slow."""
         names = self.write("names.txt", many_phrases(40000))
@@ -622,7 +856,7 @@ class InterruptTest(CommandTest):
             return (os.path.exists(edges) and os.path.getsize(edges) > 0
                     and os.stat(edges).st_mtime_ns != before)
 
-        process = self.start("index", self.dogs, names)
+        process = self.start(*self.index_verb, self.dogs, names)
         self.wait_until(growing)
         process.send_signal(signal.SIGINT)
         self.assertEqual(process.wait(5), -signal.SIGINT)
@@ -640,7 +874,7 @@ class InterruptTest(CommandTest):
     def test_ignored_signals_stay_ignored(self):
         self.index()
         with locked(self.path("dogs", EDGES)):
-            process = self.start("index", self.dogs,
+            process = self.start(*self.index_verb, self.dogs,
                                  preexec_fn=lambda: signal.signal(signal.SIGHUP, signal.SIG_IGN))
             process.stdin.write(b"great dane\n")
             process.stdin.close()

@@ -45,8 +45,7 @@ bool exists(const std::string& path) {
 }
 
 /// The tables' own failures are only lines in the log, so what can be told beforehand is told here.
-void checkTables(const std::string& prefix) {
-  constexpr off_t kHeaderBytes = 2048;
+void checkThere(const std::string& prefix) {
   for (const auto& table : tablesAt(prefix)) {
     struct stat status = {};
     if (stat(table.c_str(), &status) != 0) {
@@ -54,7 +53,18 @@ void checkTables(const std::string& prefix) {
       throw Error(code, "There is no classic index at " + prefix + ": " + table +
                             " cannot be read (" + std::generic_category().message(errno) + ").");
     }
-    if (!S_ISREG(status.st_mode) || status.st_size < kHeaderBytes) {
+    if (!S_ISREG(status.st_mode)) {
+      throw Error(ErrorCode::notAnIndex, table + " is no file; index again.");
+    }
+  }
+}
+
+/// Only the locks tell that no other process is still writing, so this waits until they were taken.
+void checkFinished(const std::string& prefix) {
+  constexpr off_t kHeaderBytes = 2048;
+  for (const auto& table : tablesAt(prefix)) {
+    struct stat status = {};
+    if (stat(table.c_str(), &status) != 0 || status.st_size < kHeaderBytes) {
       throw Error(ErrorCode::notAnIndex, table + " is no finished table; index again.");
     }
   }
@@ -94,9 +104,10 @@ Index Index::open(const std::string& path, const Options& options, MatchingMode 
   const bool directory = isDirectory(path);
   const std::string prefix = directory && !path.ends_with('/') ? path + '/' : path;
   if (directory || (!exists(path) && exists(tablesAt(path).front()))) {
-    checkTables(prefix);
+    checkThere(prefix);
     LXFuzzyIndex tables(prefix);
     tables.setMode(kReading);
+    checkFinished(prefix);
     if (tables.getMode() != kReading) {
       throw Error(ErrorCode::notReadable,
                   "The classic index at " + prefix + " cannot be opened; the log says why.");

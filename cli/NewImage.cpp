@@ -1,0 +1,85 @@
+#include "cli/NewImage.h"
+
+#include <unistd.h>
+
+#include <filesystem>
+#include <system_error>
+#include <utility>
+
+namespace wordcatcher::cli {
+
+namespace {
+
+namespace fs = std::filesystem;
+
+// Longer names are cut in the name of a temporary file.
+constexpr std::size_t kCommonNameBytes = 100;
+
+// Links to the files that this process has open.
+constexpr const char* kDescriptors = "/proc/self/fd";
+
+bool sameFile(const struct stat& a, const struct stat& b) {
+  return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
+}
+
+/// Files that come and go meanwhile are no errors.
+template <typename Visit>
+void visitFiles(const fs::path& directory, const Visit& visit) {
+  std::error_code error;
+  for (fs::directory_iterator files(directory, error), end; !error && files != end;
+       files.increment(error)) {
+    visit(files->path());
+  }
+}
+
+bool isOpen(const struct stat& status) {
+  bool found = false;
+  visitFiles(kDescriptors, [&](const fs::path& descriptor) {
+    struct stat open {};
+    found |= stat(descriptor.c_str(), &open) == 0 && sameFile(open, status);
+  });
+  return found;
+}
+
+}  // namespace
+
+NewImage::NewImage(std::string target) : _target(std::move(target)) {
+  struct stat status {};
+  if (stat(_target.c_str(), &status) == 0) {
+    _old = status;
+  }
+}
+
+std::uint64_t NewImage::write(IndexBuilder& builder) {
+  try {
+    const std::uint64_t bytes = builder.commit();
+    const std::lock_guard waitForTheEnd(_returning);
+    return bytes;
+  } catch (...) {
+    // The failure may come from what discardForGood() took away.
+    const std::lock_guard waitForTheEnd(_returning);
+    throw;
+  }
+}
+
+void NewImage::discardForGood() {
+  std::unique_lock lock(_returning);
+  const fs::path target(_target);
+  const std::string stem = '.' + target.filename().string().substr(0, kCommonNameBytes);
+  visitFiles(target.has_parent_path() ? target.parent_path() : ".", [&](const fs::path& path) {
+    const std::string extension = path.extension();
+    struct stat status {};
+    if ((extension == ".tmp" || extension == ".old") &&
+        path.filename().string().starts_with(stem) && lstat(path.c_str(), &status) == 0 &&
+        S_ISREG(status.st_mode) && isOurs(status)) {
+      unlink(path.c_str());
+    }
+  });
+  lock.release();
+}
+
+bool NewImage::isOurs(const struct stat& status) const {
+  return (_old && sameFile(*_old, status)) || isOpen(status);
+}
+
+}  // namespace wordcatcher::cli

@@ -1,0 +1,58 @@
+#include "cli/OpenIndex.h"
+
+#include <sys/stat.h>
+
+#include <iostream>
+
+#include "cli/Failure.h"
+#include "cli/IndexDirectory.h"
+#include "cli/Modes.h"
+#include "cli/TableLog.h"
+
+namespace wordcatcher::cli {
+
+namespace {
+
+Index openTables(const std::string& name, MatchingMode mode, bool verbose) {
+  const IndexDirectory directory(name);
+  const TableLog log(verbose);
+  std::optional<Index> index;
+  directory.openForReading(log, [&] { index = Index::open(directory.path(), {}, mode); });
+  return *index;
+}
+
+Index openImage(const std::string& name, std::optional<MatchingMode> mode) {
+  auto index = Index::open(name);
+  const MatchingMode remembered = index.info().mode;
+  if (mode && *mode != remembered) {
+    throw Failure(quoted(name) + " was indexed in the mode " + nameOf(remembered) + ", not " +
+                  nameOf(*mode) + ": leave --mode out, or index the phrases again in that mode.");
+  }
+  return index;
+}
+
+}  // namespace
+
+bool namesDirectory(const std::string& name) {
+  struct stat status {};
+  return name.ends_with('/') || (stat(name.c_str(), &status) == 0 && S_ISDIR(status.st_mode));
+}
+
+Index openIndex(const std::string& name, std::optional<MatchingMode> mode, bool verbose) {
+  if (name.empty()) {
+    throw Failure("The name of the index is empty: give a file or a directory.");
+  }
+  return namesDirectory(name) ? openTables(name, mode.value_or(kDefaultMode), verbose)
+                              : openImage(name, mode);
+}
+
+void noteTruncated() {
+  const Index::Options limits;
+  std::cerr << "wordcatcher: a text was not looked at in full, being beyond the limits of " +
+                   std::to_string(limits.maxQueryWords) + " words and " +
+                   std::to_string(limits.maxWordUnits) +
+                   " letters a word: give it in shorter pieces.\n"
+            << std::flush;
+}
+
+}  // namespace wordcatcher::cli
