@@ -23,7 +23,6 @@ namespace {
 
 using testing::readFile;
 using testing::TemporaryDirectory;
-using testing::writeFile;
 using Bytes = std::vector<std::byte>;
 using Names = std::vector<std::string>;
 

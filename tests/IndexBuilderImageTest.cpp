@@ -332,7 +332,7 @@ TEST(KilledBuilderTest, ReadersSeeTheOldIndexOrTheNewOneWhole) {
   constexpr std::int64_t kLongestDelay = 60'000;
   std::uniform_int_distribution<std::int64_t> delay(
       0, std::min<std::int64_t>(commitTime.count() * 4, kLongestDelay));
-  std::mt19937 random(20);  // NOLINT(cert-msc51-cpp): the moments vary by themselves
+  std::mt19937 random{std::random_device()()};
   std::array<int, 2> left{};
   for (int kill = 0; kill < kKills; ++kill) {
     const pid_t builder = startProcess([&path] {

@@ -151,7 +151,7 @@ TEST_F(IndexBuilderTest, AMovedBuilderTakesItsPhrasesAlong) {
 }
 
 TEST_F(IndexBuilderTest, EachModeStoresItsOwnKindOfWords) {
-  const auto words = [this](MatchingMode mode, std::vector<std::string> phrases) {
+  const auto words = [this](MatchingMode mode, const std::vector<std::string>& phrases) {
     IndexBuilder builder(path, {.mode = mode, .tables = {}});
     for (const auto& phrase : phrases) {
       builder.add(phrase, phrase);
