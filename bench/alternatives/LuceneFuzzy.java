@@ -1,6 +1,6 @@
 // Looks up misspelled words, or asks misspelled phrases, with Lucene 8.
 //
-//     java LuceneFuzzy words WORDS QUERIES RESULTS
+//     java LuceneFuzzy words WORDS QUERIES [RESULTS]
 //     java LuceneFuzzy phrases PHRASES QUERIES
 //
 // "words": one document a word; every word within 1 and 2 edits, transpositions counting as two.
@@ -78,7 +78,10 @@ public final class LuceneFuzzy {
     LuceneFuzzy lucene = new LuceneFuzzy(Files.readAllLines(Path.of(arguments[1])));
     List<String> queries = Files.readAllLines(Path.of(arguments[2]));
     if (arguments[0].equals("words")) {
-      lucene.lookUpWords(queries, Path.of(arguments[3]));
+      lucene.lookUpWords(queries);
+      if (arguments.length > 3) {
+        lucene.writeWords(queries, Path.of(arguments[3]));
+      }
     } else {
       lucene.askPhrases(queries);
     }
@@ -108,13 +111,18 @@ public final class LuceneFuzzy {
     output.add("\"indexBytes\": " + bytes);
   }
 
-  private void lookUpWords(List<String> queries, Path results) throws IOException {
+  private void lookUpWords(List<String> queries) throws IOException {
     build(new KeywordAnalyzer(), text -> new StringField(FIELD, text, Field.Store.NO));
+    for (int edits = 1; edits <= 2; ++edits) {
+      int distance = edits;
+      measure("k" + edits, queries, query -> wordsNear(query, distance).size());
+      measure("terms" + edits, queries, query -> termsNear(query, distance).size());
+    }
+  }
+
+  private void writeWords(List<String> queries, Path results) throws IOException {
     try (PrintWriter file = new PrintWriter(Files.newBufferedWriter(results))) {
       for (int edits = 1; edits <= 2; ++edits) {
-        int distance = edits;
-        measure("k" + edits, queries, query -> wordsNear(query, distance).size());
-        measure("terms" + edits, queries, query -> termsNear(query, distance).size());
         for (String query : queries) {
           List<String> words = wordsNear(query, edits);
           if (!sorted(words).equals(sorted(termsNear(query, edits)))) {

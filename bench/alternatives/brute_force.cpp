@@ -1,10 +1,9 @@
 // The yardstick of look-ups: every word of the list is compared, in the band of the table of edit
 // distances that a bound leaves.
 //
-//     brute_force WORDS QUERIES RESULTS SAMPLE
+//     brute_force WORDS QUERIES [RESULTS]
 //
-// looks up SAMPLE of the queries, evenly, and prints one JSON object as search_work does. Into
-// RESULTS it writes lines of the bound, the query and the words with two distances: the plain one,
+// prints one JSON object as search_work does. Into RESULTS it writes lines of the bound, the query and the words with two distances: the plain one,
 // and that of searches that may not leave out the head of the query before a code unit of the word
 // is read.
 
@@ -92,8 +91,10 @@ std::vector<Hit> scan(const std::vector<std::string>& words, const std::string& 
 void run(const std::vector<std::string>& arguments) {
   const auto words = linesOf(arguments.at(0));
   const auto queries = linesOf(arguments.at(1));
-  std::ofstream results(arguments.at(2));
-  const std::size_t sample = std::stoul(arguments.at(3));
+  std::ofstream results;
+  if (arguments.size() > 2) {
+    results.open(arguments[2]);
+  }
   for (const auto& word : words) {
     if (word.size() > kLongest) {
       throw std::runtime_error("A word is longer than the table.");
@@ -103,23 +104,23 @@ void run(const std::vector<std::string>& arguments) {
   for (const auto& [bound, name] : kBounds) {
     std::vector<double> seconds;
     std::size_t found = 0;
-    for (std::size_t i = 0; i < sample; ++i) {
-      const auto& query = queries[i * queries.size() / sample];
+    for (const auto& query : queries) {
       const Stopwatch watch;
       const auto hits = scan(words, query, bound);
       seconds.push_back(watch.seconds());
       found += hits.size();
-      results << bound << '\t' << query << '\t';
-      for (const auto& hit : hits) {
-        results << words[hit.word] << ':' << hit.distance << ':'
-                << readingFirst(query, words[hit.word], bound) << ' ';
+      if (results.is_open()) {
+        results << bound << '\t' << query << '\t';
+        for (const auto& hit : hits) {
+          results << words[hit.word] << ':' << hit.distance << ':'
+                  << readingFirst(query, words[hit.word], bound) << ' ';
+        }
+        results << '\n';
       }
-      results << '\n';
     }
     output[name] = latency(std::move(seconds));
     output[name]["found"] = found;
   }
-  output["queries"] = sample;
   std::cout << output << '\n';
 }
 
