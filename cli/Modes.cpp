@@ -19,6 +19,7 @@ struct Mode {
 constexpr std::array kModes{
     Mode{"words", 0, "a phrase is indexed and found by its words"},
     Mode{"text", 1, "a phrase is one string, spaces and punctuation included"},
+    Mode{"phonetic", 2, "a phrase is indexed and found by how its words sound"},
 };
 
 std::vector<std::string> names() {

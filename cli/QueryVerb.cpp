@@ -37,12 +37,14 @@ input, each stand as a heading above their matches. Empty lines count as texts.
 "matches" is null when no word of the text finds anything, and empty when what
 they find is too far from the text. In text mode a match also has its "data": [...].
 
-In text mode a phrase is found within 3 edits. Give the mode that DIR was indexed in.
+In text mode a phrase is found within 3 edits, in phonetic mode when its words sound
+like the text's. Give the mode that DIR was indexed in.
 
 Examples:
   wordcatcher query dogs 'a goldan retriver'
   wordcatcher query --json dogs < texts.txt
-  wordcatcher query --mode text titles 'the grate gatsby')";
+  wordcatcher query --mode text titles 'the grate gatsby'
+  wordcatcher query --mode phonetic names 'Kathryn Shmit')";
 
 struct Arguments {
   std::uint64_t option = 0;

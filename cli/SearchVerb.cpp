@@ -24,23 +24,19 @@ using Json = nlohmann::ordered_json;
 constexpr std::int32_t kReading = 1;
 constexpr std::int64_t kDefaultDistance = 2;
 
-// Each further edit makes the automaton four to five times as costly: a word of 20 letters takes
-// about 0.2 s and 20 MB at distance 5, 1 s and 80 MB at 6, and 20 s and 900 MB at 8.
-constexpr std::int64_t kLargestDistance = 6;
+// What the newer interface takes as well: more edits than that make any word near any other.
+constexpr std::int64_t kLargestDistance = 16;
 
 constexpr const char* kDataSeparator = " | ";
 
 constexpr const char* kFooter = R"(
 Finds the stored words (in text mode, the whole phrases) that are within K edits of a
 WORD, those with more data first, then the nearer, the shorter. Each match is a line:
-its distance, a TAB, its value, a TAB, its data strings joined by " | ". Several
+its value, a TAB, its distance, a TAB, its data strings joined by " | ". Several
 WORDs, and the lines of standard input, each stand as a heading above their matches.
 
 --json prints one object a WORD instead:
   {"word": "...", "matches": [{"value": "...", "distance": 1, "data": ["..."]}]}
-
-The cost of a look-up grows four- to fivefold with each edit that K allows, and with
-the length of the WORD; a WORD of 20 letters takes about a second at K = 6.
 
 Examples:
   wordcatcher search dogs goldan
@@ -75,7 +71,7 @@ std::string jsonLine(const std::string& word, const std::vector<LXFuzzyMatch>& m
 std::string plainLines(const std::vector<LXFuzzyMatch>& matches) {
   std::string lines;
   for (const auto& match : matches) {
-    lines += std::to_string(match.distance()) + '\t' + toUtf8(match.value()) + '\t' +
+    lines += toUtf8(match.value()) + '\t' + std::to_string(match.distance()) + '\t' +
              CLI::detail::join(dataOf(match), kDataSeparator) + '\n';
   }
   return lines;

@@ -16,6 +16,7 @@ using ChosenVerb = std::function<ExitCode()>;
 
 // Each adds one verb to the program; parsing a command line that names it sets `chosen`. Both must
 // live until the command line was parsed.
+void addEncodeVerb(CLI::App& program, ChosenVerb& chosen);
 void addIndexVerb(CLI::App& program, ChosenVerb& chosen);
 void addQueryVerb(CLI::App& program, ChosenVerb& chosen);
 void addSearchVerb(CLI::App& program, ChosenVerb& chosen);

@@ -29,6 +29,7 @@ Examples:
   printf 'golden retriever\ngolden gate bridge\n' | wordcatcher index dogs
   wordcatcher query dogs 'a goldan retriver'
   wordcatcher search --max-distance 1 dogs bridg
+  wordcatcher encode 'Catherine Schmidt'
 "wordcatcher VERB --help" tells more about a verb.)";
 
 /// Fills the places of standard streams that the caller closed, so that no table file is opened
@@ -79,6 +80,7 @@ ExitCode run(int argc, char** argv) {
   addIndexVerb(program, chosen);
   addQueryVerb(program, chosen);
   addSearchVerb(program, chosen);
+  addEncodeVerb(program, chosen);
   if (argc <= 1) {
     std::cerr << program.help();
     return kFailed;

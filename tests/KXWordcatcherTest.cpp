@@ -112,12 +112,31 @@ TEST_F(KXWordcatcherTest, WholeTextModeReturnsTheIndexsOwnMatches) {
   EXPECT_EQ(matches[0].distance(), 2);
   EXPECT_EQ(matches[0].data(), std::vector<std::u16string>{u"STP"});
   EXPECT_EQ(matcher.wordsMatched(), 41);
+  EXPECT_EQ(std::get<std::vector<LXFuzzyMatch>>(*matcher.query({})).size(), 0U);
   EXPECT_EQ(matcher.*memberOf(testing::EditDistance()), 2);
   EXPECT_TRUE(std::get<std::vector<LXFuzzyMatch>>(*matcher.query(u"")).empty());
   EXPECT_TRUE(std::get<std::vector<LXFuzzyMatch>>(*matcher.query(u"Kiribati")).empty());
   // Three edits are allowed, four are not.
   EXPECT_EQ(std::get<std::vector<LXFuzzyMatch>>(*matcher.query(u"Sao Tomexxx")).size(), 1U);
   EXPECT_EQ(std::get<std::vector<LXFuzzyMatch>>(*matcher.query(u"Sao Tomexxxx")).size(), 0U);
+}
+
+TEST_F(KXWordcatcherTest, WholeTextModeKeepsTheOrderOfTheSearch) {
+  matcher.setOptions(1);
+  matcher.setMode(2);
+  for (const auto* data : {u"1", u"2", u"3"}) {
+    matcher.index_withData(u"linz am rhein", data);
+  }
+  matcher.index_withData(u"linz", u"4");
+  matcher.index_withData(u"Linz am Rhei", u"5");
+  matcher.setMode(1);
+  const auto result = matcher.query(u"Linz am Rhei");
+  std::vector<std::u16string> values;
+  for (const auto& match : std::get<std::vector<LXFuzzyMatch>>(*result)) {
+    values.push_back(match.value());
+  }
+  EXPECT_EQ(values, (std::vector<std::u16string>{u"linz am rhein", u"linz am rhei"}))
+      << "more data before a smaller distance";
 }
 
 TEST_F(KXWordcatcherTest, AMovedFromMatcherIsOneOverNothing) {
@@ -156,11 +175,29 @@ TEST_F(KXWordcatcherTest, WordsThatFindNothingCountAgainstAPhrase) {
   EXPECT_EQ(query(u"goldan xyzzy"), Records{});
 }
 
+TEST_F(KXWordcatcherTest, PhrasesStayInPlayAfterAWordThatSharesNone) {
+  indexTheGoldenOnes();
+  // Three hits; nothing is common to the first two words, but the third meets the first one's
+  // phrases, which counts once more.
+  EXPECT_EQ(query(u"retriever bridge golden"), Records{});
+  EXPECT_EQ(matcher.wordsMatched(), 4);
+}
+
+TEST_F(KXWordcatcherTest, MissingHitsAreCountedBeforePhrasesAreIntersected) {
+  index({{u"golden gate bridge", u"golden gate bridge"}, {u"golden hour", u"golden hour"}});
+  // Two hits for three counted words: (3 - 2) * 2 + 1. The intersection's own count comes too late.
+  matcher.setWordsMatched(0);
+  EXPECT_EQ(recordsOf(matcher.query(u"golden bridge xyzzyx")),
+            (Records{{u"golden gate bridge", 3}}));
+  EXPECT_EQ(matcher.wordsMatched(), 3);
+}
+
 TEST_F(KXWordcatcherTest, ATextWithoutWordsOrHitsAnswersWithNothing) {
   indexTheGoldenOnes();
   EXPECT_EQ(query(u""), std::nullopt);
   EXPECT_EQ(query(u" ... "), std::nullopt);
   EXPECT_EQ(query(u"xyzzy plugh"), std::nullopt);
+  EXPECT_EQ(query(u"an ox"), std::nullopt);
 }
 
 TEST_F(KXWordcatcherTest, ShortWordsAreLookedUpWhenThereIsNoOther) {

@@ -226,8 +226,48 @@ TEST(LevenshteinDFATest, OneStepTakesNoClosureAndNoAnyEdges) {
             LXIntTupleSet());
 }
 
-TEST(LevenshteinDFATest, ALongTextIsBuiltWithoutSearchingAList) {
-  // The length of a whole text's automaton; with a list of visited states this takes minutes.
+TEST(LevenshteinDFATest, ACharacterOutsideTheBmpCostsTwoEdits) {
+  const auto accepts = [](const LevenshteinDFA& dfa, std::u16string_view text) {
+    auto state = dfa.startState();
+    for (std::size_t i = 0; i < text.size() && state; ++i) {
+      const auto exact = dfa.followingStateFrom_withSymbol(*state, text.substr(i, 1));
+      state = exact ? exact : dfa.followingStateFrom_withSymbol(*state, u"*");
+    }
+    return state && dfa.isFinalState(*state);
+  };
+  EXPECT_FALSE(accepts(dfaOf(u"a\U0001F600b", 1), u"ab"));
+  EXPECT_TRUE(accepts(dfaOf(u"a\U0001F600b", 2), u"ab"));
+  EXPECT_FALSE(accepts(dfaOf(u"ab", 1), u"a\U0001F600b"));
+  EXPECT_TRUE(accepts(dfaOf(u"ab", 2), u"a\U0001F600b"));
+}
+
+TEST(LevenshteinDFATest, TheAutomatonOfAWholeText) {
+  // Every code unit another: no two positions share a symbol. The counts are those of this
+  // construction: a change of it shows in them.
+  std::u16string text;
+  for (char16_t unit = 0x4E00; text.size() < 111; ++unit) {
+    text += unit;
+  }
+  const auto dfa = dfaOf(text, 3);
+  std::size_t edges = 0;
+  std::vector<LXIntTupleSet> pending = {*dfa.startState()};
+  std::unordered_set<LXIntTupleSet> seen;
+  while (!pending.empty()) {
+    const auto state = pending.back();
+    pending.pop_back();
+    if (seen.insert(state).second) {
+      const auto symbols = *dfa.edgesFromState(state);
+      edges += symbols.size();
+      for (const auto& symbol : symbols) {
+        pending.push_back(*dfa.followingStateFrom_withSymbol(state, symbol));
+      }
+    }
+  }
+  EXPECT_EQ(dfa.size(), 6888U);
+  EXPECT_EQ(edges, 40901U);
+}
+
+TEST(LevenshteinDFATest, ALongTextIsBuilt) {
   std::u16string text;
   for (int i = 0; text.size() < 1000; ++i) {
     text += u"Donaudampfschifffahrtsgesellschaft ";

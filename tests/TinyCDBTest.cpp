@@ -1,5 +1,6 @@
 #include "wordcatcher/storage/TinyCDB.h"
 
+#include <cdb.h>
 #include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sys/file.h>
@@ -38,6 +39,12 @@ using testing::TemporaryDirectory;
 using testing::writeFile;
 using Values = std::set<std::u16string>;
 using Lines = std::vector<std::string>;
+
+void put32(std::string& bytes, std::size_t at, std::uint32_t value) {
+  for (int i = 0; i < 4; ++i) {
+    bytes[at + static_cast<std::size_t>(i)] = static_cast<char>(value >> (8 * i));
+  }
+}
 
 class TinyCDBTest : public ::testing::Test {
  protected:
@@ -303,11 +310,12 @@ TEST_F(TinyCDBTest, TeardownLeavesAnUnfinishedTableUnfinished) {
       table.setMode(2);
       table.setValue_forKey(u"v", u"k");
     }
-    _exit(0);
+    const int descriptor = open(path.c_str(), O_RDONLY | O_CLOEXEC);
+    _exit(flock(descriptor, LOCK_EX | LOCK_NB) == -1 ? 0 : 1);
   }
   int status = 0;
   ASSERT_EQ(waitpid(child, &status, 0), child);
-  EXPECT_EQ(status, 0);
+  EXPECT_EQ(status, 0) << "the file is not closed, and so locked until the process ends";
   EXPECT_LT(std::filesystem::file_size(path), 2048U);
 }
 
@@ -398,13 +406,8 @@ TEST_F(TinyCDBTest, AValueLongerThanTheBufferCanCountIsUnreadable) {
   constexpr std::uint32_t kLength = 0x80000001U;
   write({{u"k", u"v"}});
   std::string bytes = readFile(path);
-  const auto put32 = [&bytes](std::size_t at, std::uint32_t value) {
-    for (int i = 0; i < 4; ++i) {
-      bytes[at + static_cast<std::size_t>(i)] = static_cast<char>(value >> (8 * i));
-    }
-  };
-  put32(2048 + 4, kLength);
-  put32(0, 0);  // the end of the data is read off the first table's place
+  put32(bytes, 2048 + 4, kLength);
+  put32(bytes, 0, 0);  // the end of the data is read off the first table's place
   writeFile(path, bytes);
   std::filesystem::resize_file(path, std::uintmax_t{kLength} + 4096);
   TinyCDB table(path);
@@ -449,11 +452,91 @@ TEST_F(TinyCDBTest, ATableWithAnyByteDamagedNeverCrashes) {
 }
 
 TEST_F(TinyCDBTest, AKeyLongerThanTheFileIsNotCompared) {
+  // The record's key claims as many bytes as the key that is looked up, and has its hash, so that
+  // only its length against the file's tells that it cannot be there.
+  const std::string longKey(100000, 'k');
   write({{u"k", u"v"}});
+  std::string bytes = readFile(path);
+  const auto hash = cdb_hash(longKey.data(), static_cast<unsigned>(longKey.size()));
+  const std::size_t hashTable = bytes.size() - 16;
+  put32(bytes, 2048, static_cast<std::uint32_t>(longKey.size()));
+  for (const std::size_t slot : {hashTable, hashTable + 8}) {
+    put32(bytes, slot, hash);
+    put32(bytes, slot + 4, 2048);
+  }
+  put32(bytes, (hash & 255U) * 8, static_cast<std::uint32_t>(hashTable));
+  put32(bytes, (hash & 255U) * 8 + 4, 2);
+  writeFile(path, bytes);
   TinyCDB table(path);
   table.setMode(1);
-  EXPECT_EQ(table.valuesFor(std::u16string(100000, u'k')), Values{});
+  EXPECT_EQ(table.valuesFor(std::u16string(longKey.size(), u'k')), Values{});
   table.setMode(0);
+}
+
+TEST_F(TinyCDBTest, AddingOutsideAWritingPassIsALineAndTouchesNothing) {
+  const std::string line =
+      "-[TinyCDB setValue:forKey:] Could not put v into key k because (9) Bad file descriptor";
+  TinyCDB table(path);
+  const LogCapture log;
+  table.setValue_forKey(u"v", u"k");
+  EXPECT_EQ(log.lines(), Lines{line}) << "never opened";
+  table.setMode(2);
+  table.setMode(0);
+  const std::string hosts = directory.file("host");
+  const int descriptor = open(hosts.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600);
+  for (int i = 0; i < 10000; ++i) {
+    table.setValue_forKey(u"v", u"k");
+  }
+  EXPECT_EQ(log.lines().back(), line) << "closed: the descriptor's number is the host's by now";
+  close(descriptor);
+  EXPECT_EQ(std::filesystem::file_size(hosts), 0U);
+  table.setMode(1);
+  table.setValue_forKey(u"v", u"k");
+  EXPECT_EQ(log.lines().back(), line) << "reading";
+  EXPECT_EQ(table.valuesFor(u"k"), Values{});
+  table.setMode(0);
+}
+
+TEST_F(TinyCDBTest, AMissTellsTheErrorCodeAsItStands) {
+  write({});
+  TinyCDB table(path);
+  table.setMode(1);
+  LogCapture log;
+  errno = ENOENT;
+  table.valuesFor(u"Graz");
+  EXPECT_EQ(log.lines(),
+            Lines{"-[TinyCDB valuesFor:] Could not init query for @\"Graz\" because (2)"});
+  table.setMode(0);
+  std::string bytes = readFile(path);
+  bytes.replace(0, 2048, 2048, '\x7F');
+  writeFile(path, bytes);
+  table.setMode(1);
+  log.clear();
+  table.valuesFor(u"Graz");
+  EXPECT_EQ(log.lines(),
+            Lines{"-[TinyCDB valuesFor:] Could not init query for @\"Graz\" because (71)"});
+  table.setMode(0);
+}
+
+TEST_F(TinyCDBTest, OldMappingsAreReleased) {
+  write({{u"Graz", u"Mur"}});
+  const auto mappings = [this] {
+    const std::string maps = readFile("/proc/self/maps");
+    std::size_t count = 0;
+    for (std::size_t at = 0; (at = maps.find("/table.tdb", at)) != std::string::npos; ++at) {
+      ++count;
+    }
+    return count;
+  };
+  {
+    TinyCDB table(path);
+    for (int i = 0; i < 10; ++i) {
+      table.setMode(1);
+      table.setMode(0);
+    }
+    EXPECT_EQ(mappings(), 1U);
+  }
+  EXPECT_EQ(mappings(), 0U);
 }
 
 }  // namespace

@@ -1,8 +1,9 @@
 #include "wordcatcher/fuzzy/LXFuzzyIndex.h"
 
-#include <algorithm>
 #include <utility>
 
+#include "wordcatcher/fuzzy/ImageSearch.h"
+#include "wordcatcher/fuzzy/TableImage.h"
 #include "wordcatcher/text/TextForm.h"
 #include "wordcatcher/text/Unicode.h"
 #include "wordcatcher/text/WordSegmenter.h"
@@ -11,47 +12,9 @@ namespace wordcatcher {
 
 namespace {
 
-constexpr std::u16string_view kAny = u"*";
-
-/// A place in the walk: the state of the query's automaton, and the state of the prefix tree, whose
-/// name is the string read so far.
-struct WalkItem {
-  const LXDFAState<LXIntTupleSet>* query;
-  std::u16string prefix;
-};
-
-/// The state that a stored symbol leads to: the symbol's own edge wins over "*".
-const LXDFAState<LXIntTupleSet>* queryStep(const LXDFAState<LXIntTupleSet>& state,
-                                           std::u16string_view symbol) {
-  const auto* exact = state.followingStateWithSymbol(symbol);
-  return exact != nullptr ? exact : state.followingStateWithSymbol(kAny);
-}
-
-/// The least distance of the state's final labels, and `maxDistance` if none is smaller.
-std::int64_t distanceOf(const LevenshteinNFA& nfa, const LXIntTupleSet& labels,
-                        std::int64_t maxDistance) {
-  std::int64_t distance = maxDistance;
-  for (const auto& label : labels) {
-    if (nfa.isFinalState(label)) {
-      distance = std::min(distance, label.distance());
-    }
-  }
-  return distance;
-}
-
-/// The order of a search's result: many data strings outrank a small distance, on purpose.
-bool ranksBefore(const LXFuzzyMatch& a, const LXFuzzyMatch& b) {
-  if (a.data().size() != b.data().size()) {
-    return a.data().size() > b.data().size();
-  }
-  if (a.distance() != b.distance()) {
-    return a.distance() < b.distance();
-  }
-  if (a.value().size() != b.value().size()) {
-    return a.value().size() < b.value().size();
-  }
-  return a.value() < b.value();
-}
+// The modes that open the tables.
+constexpr std::int32_t kReading = 1;
+constexpr std::int32_t kWriting = 2;
 
 }  // namespace
 
@@ -62,7 +25,12 @@ LXFuzzyIndex::LXFuzzyIndex(std::string path)
 
 LXFuzzyIndex::~LXFuzzyIndex() = default;
 
-void LXFuzzyIndex::setMode(std::int32_t mode) { _LXindex.setMode(mode); }
+void LXFuzzyIndex::setMode(std::int32_t mode) {
+  if (mode == kReading || mode == kWriting) {
+    _image.reset();
+  }
+  _LXindex.setMode(mode);
+}
 
 std::int32_t LXFuzzyIndex::getMode() const noexcept { return _LXindex.getMode(); }
 
@@ -97,33 +65,22 @@ std::vector<LXFuzzyMatch> LXFuzzyIndex::search_withMaxDistance(
   if (!query || query->empty()) {
     return matches;
   }
-  const LevenshteinNFA nfa = _LXcreateNFAWithWord_withMaxDistance(toLower(*query), maxDistance);
-  const LevenshteinDFA dfa = _LXcreateDFAFromNFA(nfa);
-  std::vector<WalkItem> pending;
-  pending.push_back({dfa.stateNamed(*dfa.startState()), _LXindex.startState()});
-  while (!pending.empty()) {
-    const WalkItem item = std::move(pending.back());
-    pending.pop_back();
-    for (const auto& symbol : _LXindex.edgesFromState(item.prefix)) {
-      // A U+0000 inside an added string leaves an empty symbol behind, which leads nowhere new.
-      if (symbol.size() != 1) {
-        continue;
-      }
-      const auto* next = queryStep(*item.query, symbol);
-      if (next == nullptr) {
-        continue;
-      }
-      std::u16string prefix = item.prefix + symbol;
-      if (next->final() && _LXindex.isFinalState(prefix)) {
-        const auto data = _LXindex.dataFor(prefix);
-        matches.emplace_back(prefix, distanceOf(nfa, next->data(), maxDistance),
-                             std::vector<std::u16string>(data.begin(), data.end()));
-      }
-      pending.push_back({next, std::move(prefix)});
+  const SearchImage& tree = image();
+  for (const auto& hit : searchImage(tree, toLower(*query), maxDistance)) {
+    std::vector<std::u16string> data;
+    for (const auto value : tree.postingsOf(hit.word)) {
+      data.push_back(*fromUtf8(tree.valueText(value)));
     }
+    matches.emplace_back(tree.textOf(hit.word), hit.distance, std::move(data));
   }
-  std::sort(matches.begin(), matches.end(), &ranksBefore);
   return matches;
+}
+
+const std::shared_ptr<const SearchImage>& LXFuzzyIndex::sharedImage() {
+  if (!_image) {
+    _image = makeTableImage(_LXindex);
+  }
+  return _image;
 }
 
 std::u16string LXFuzzyIndex::description() const { return _LXindex.description(); }

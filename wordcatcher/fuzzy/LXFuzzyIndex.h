@@ -20,6 +20,7 @@
 
 namespace wordcatcher {
 
+class SearchImage;
 class WordSegmenter;
 
 /// The automaton of all strings within a distance of a word.
@@ -39,8 +40,13 @@ using LevenshteinDFA = LXDFA<LXIntTupleSet>;
 /// half a surrogate pair has no UTF-8 form to store. The same holds for a string with an unpaired
 /// surrogate.
 ///
-/// Growth: the tables hold one record an adding call, so finishing a table and every walk from the
-/// root grow with the number of words added (finishing grows with its square).
+/// Growth: the tables hold one record an adding call, so finishing them grows with the square of the
+/// number of words added. The first search after they were opened reads all records once and builds
+/// an image of them in memory, of about 60 bytes a distinct string beside the data; later searches
+/// use it. For many phrases, or for readers that open often, see IndexBuilder and Index.
+///
+/// Errors: the constructors throw std::runtime_error when ICU's data is not installed. A string of
+/// more than 2^31 - 1 code units is refused with std::length_error.
 ///
 /// Thread safety: one thread at a time.
 class WORDCATCHER_EXPORT LXFuzzyIndex {
@@ -86,8 +92,8 @@ class WORDCATCHER_EXPORT LXFuzzyIndex {
   /// stands for any one character at no cost; a "_" in it may be skipped at no cost and does not
   /// match a stored "_".
   ///
-  /// Valid in mode 1. The query's automaton is built first, and grows with its length and steeply
-  /// with the distance (61 states a code unit at distance 3): bound both for untrusted input.
+  /// Valid in mode 1. Visits each place of the stored tree at most twice, and far fewer at small
+  /// distances; bound the length of the query and the distance for untrusted input.
   std::vector<LXFuzzyMatch> search_withMaxDistance(std::optional<std::u16string_view> query,
                                                    std::int64_t maxDistance);
 
@@ -112,10 +118,19 @@ class WORDCATCHER_EXPORT LXFuzzyIndex {
                                                                     std::u16string_view symbol);
 
  private:
+  friend class Index;
+  friend class KXWordcatcher;
+
+  /// What searches answer from: an image of the tables as they were last opened for reading, made
+  /// at the first search after they were opened, for reading or for writing.
+  const SearchImage& image() { return *sharedImage(); }
+  const std::shared_ptr<const SearchImage>& sharedImage();
+
   PLXDFA _LXindex;
   // Looked up by nothing and filled by nothing: always empty.
   std::unordered_map<std::u16string, std::vector<std::u16string>> _LXdata;
   std::unique_ptr<WordSegmenter> _segmenter;
+  std::shared_ptr<const SearchImage> _image;
 };
 
 WORDCATCHER_EXPORT std::ostream& operator<<(std::ostream& stream, const LXFuzzyIndex& index);

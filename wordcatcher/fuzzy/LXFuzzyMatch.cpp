@@ -11,9 +11,9 @@ LXFuzzyMatch::LXFuzzyMatch() : _LXdistance(0) {
   throw std::logic_error("Init is not a valid initializer for the class LXFuzzyMatch.");
 }
 
-LXFuzzyMatch::LXFuzzyMatch(std::u16string value, std::int64_t distance,
+LXFuzzyMatch::LXFuzzyMatch(std::u16string_view value, std::int64_t distance,
                            std::vector<std::u16string> data)
-    : _LXdistance(distance), _LXdata(std::move(data)), _LXvalue(std::move(value)) {}
+    : _LXdistance(distance), _LXdata(std::move(data)), _LXvalue(value) {}
 
 std::u16string LXFuzzyMatch::description() const {
   std::u16string list = u"(";

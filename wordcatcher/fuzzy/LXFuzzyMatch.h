@@ -4,6 +4,7 @@
 #include <cstdint>
 #include <ostream>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "wordcatcher/Export.h"
@@ -18,7 +19,7 @@ class WORDCATCHER_EXPORT LXFuzzyMatch {
   [[noreturn]] LXFuzzyMatch();
 
   /// A record of exactly these values.
-  LXFuzzyMatch(std::u16string value, std::int64_t distance, std::vector<std::u16string> data);
+  LXFuzzyMatch(std::u16string_view value, std::int64_t distance, std::vector<std::u16string> data);
 
   /// The stored string, which is lower-cased.
   const std::u16string& value() const noexcept { return _LXvalue; }

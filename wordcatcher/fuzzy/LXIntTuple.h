@@ -13,7 +13,8 @@
 namespace wordcatcher {
 
 /// The label of a state of a Levenshtein automaton: `index` code units of the word are accounted
-/// for, at a cost of `distance` edits. A value: copyable, comparable, hashable.
+/// for, at a cost of `distance` edits. A value: copyable, comparable, hashable;
+/// free for concurrent reading.
 class WORDCATCHER_EXPORT LXIntTuple {
  public:
   LXIntTuple(std::int64_t index, std::int64_t distance) noexcept

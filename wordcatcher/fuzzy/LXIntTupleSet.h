@@ -18,7 +18,7 @@ namespace wordcatcher {
 /// A set of labels, which is the name of a state of a query's deterministic automaton: two sets are
 /// the same state when they hold the same labels, in whatever order those were collected. Kept as a
 /// sorted list, since the sets are small and compared often. A value: copyable, comparable,
-/// hashable.
+/// hashable; one thread at a time while it grows.
 class WORDCATCHER_EXPORT LXIntTupleSet {
  public:
   using value_type = LXIntTuple;

@@ -28,9 +28,9 @@ namespace wordcatcher {
 /// nothing worse, whatever the file holds.
 ///
 /// Budgets: a query looks at no more than the options allow and says when it left something out, so
-/// that texts of strangers cannot make it run away. Beside its result a query needs at most 64 bytes
-/// for each code unit of a word, 32 for each byte of the text and 64 for each posting of the words
-/// that it finds.
+/// that texts of strangers cannot make it run away. Beside its result a query needs at most 64
+/// bytes for each code unit of a word, 32 for each byte of the text and 64 for each posting of the
+/// words that it finds.
 class WORDCATCHER_EXPORT Index {
  public:
   enum class Load {
@@ -54,8 +54,8 @@ class WORDCATCHER_EXPORT Index {
 
   /// One phrase that a query found.
   struct Match {
-    std::string value;      ///< the data string; in whole-text mode the stored text
-    std::int64_t distance;  ///< as KXWordcatcher::query scores it; edits in whole-text mode
+    std::string value;              ///< the data string; in whole-text mode the stored text
+    std::int64_t distance;          ///< as KXWordcatcher::query scores it; edits in whole-text mode
     std::vector<std::string> data;  ///< in whole-text mode: the data strings; else empty
   };
 
@@ -89,12 +89,12 @@ class WORDCATCHER_EXPORT Index {
 
   struct Info {
     MatchingMode mode;
-    std::uint64_t phrases;     ///< phrases added; 0 for a classic index, which does not count them
-    std::uint64_t words;       ///< distinct stored words
-    std::uint64_t values;      ///< distinct data strings
-    std::uint64_t bytes;       ///< of the image
-    std::string generation;    ///< 32 hexadecimal digits, random for each build
-    std::uint32_t version;     ///< of the format
+    std::uint64_t phrases;   ///< phrases added; 0 for a classic index, which does not count them
+    std::uint64_t words;     ///< distinct stored words
+    std::uint64_t values;    ///< distinct data strings
+    std::uint64_t bytes;     ///< of the image
+    std::string generation;  ///< 32 hexadecimal digits, random for each build
+    std::uint32_t version;   ///< of the format
   };
   Info info() const;
 

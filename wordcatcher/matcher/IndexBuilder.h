@@ -28,9 +28,9 @@ enum class MatchingMode : std::uint32_t {
 /// readers see the old index or the new one, whole, whatever happens meanwhile. A builder that is
 /// dropped without commit() leaves everything as it was.
 ///
-/// Memory: the distinct words, 8 bytes a posting (a phrase under a word), the distinct data strings;
-/// in commit() the image beside them. Errors: Error, after which the builder is as before the call.
-/// Thread safety: one thread at a time.
+/// Memory: the distinct words, 8 bytes a posting (a phrase under a word), the distinct data
+/// strings; in commit() the image beside them. Errors: Error, after which the builder is as before
+/// the call. Thread safety: one thread at a time.
 class WORDCATCHER_EXPORT IndexBuilder {
  public:
   struct Options {
@@ -50,10 +50,10 @@ class WORDCATCHER_EXPORT IndexBuilder {
   IndexBuilder(IndexBuilder&&) noexcept;
   IndexBuilder& operator=(IndexBuilder&&) noexcept;
 
-  /// Adds one phrase with its data string, or none: such a phrase's words are found by search(), and
-  /// the phrase is not found by query(). A data string that begins with the phrase, and puts any
-  /// further fields after "{ ", lets queries judge the phrase's length. The same phrase and data
-  /// added twice count once. Linear in the strings.
+  /// Adds one phrase with its data string, or none: such a phrase's words are found by search(),
+  /// and the phrase is not found by query(). A data string that begins with the phrase, and puts
+  /// any further fields after "{ ", lets queries judge the phrase's length. The same phrase and
+  /// data added twice count once. Linear in the strings.
   ///
   /// Throws Error: badInput for strings that are not UTF-8 or hold U+0000, tooLarge beyond 2^30
   /// words or data strings.
@@ -66,8 +66,8 @@ class WORDCATCHER_EXPORT IndexBuilder {
   std::uint64_t wordCount() const noexcept;
 
   /// Writes the index: to a temporary file beside the target, synced, renamed over the target, the
-  /// directory synced. The builder is empty afterwards. n log n in what was added. Returns the bytes
-  /// of the image.
+  /// directory synced. The builder is empty afterwards. n log n in what was added. Returns the
+  /// bytes of the image.
   ///
   /// Throws Error (notWritable) when anything of that fails: the target is then as it was, no
   /// temporary file is left, and what was added is kept, so that the call may be tried again.

@@ -5,7 +5,7 @@
 #include <functional>
 #include <ostream>
 #include <string>
-#include <utility>
+#include <string_view>
 
 #include "wordcatcher/Export.h"
 
@@ -13,14 +13,15 @@ namespace wordcatcher {
 
 /// One phrase that a query found: a data string that the host stored with it, and its score, of
 /// which smaller is better. Two records are equal when their values are, whatever their distances:
-/// a set of records holds each phrase once.
+/// a set of records holds each phrase once. A value, used by one thread at a time while it is
+/// changed.
 class WORDCATCHER_EXPORT KXWordcatch {
  public:
-  KXWordcatch(std::u16string value, std::int64_t distance)
-      : _value(std::move(value)), _distance(distance) {}
+  KXWordcatch(std::u16string_view value, std::int64_t distance)
+      : _value(value), _distance(distance) {}
 
   const std::u16string& value() const noexcept { return _value; }
-  void setValue(std::u16string value) { _value = std::move(value); }
+  void setValue(std::u16string_view value) { _value = value; }
 
   /// Edits of the words plus penalties for missing and surplus words.
   std::int64_t distance() const noexcept { return _distance; }

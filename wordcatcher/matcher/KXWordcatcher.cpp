@@ -1,10 +1,12 @@
 #include "wordcatcher/matcher/KXWordcatcher.h"
 
+#include <cstdint>
 #include <utility>
 
 #include "wordcatcher/fuzzy/LXFuzzyIndex.h"
 #include "wordcatcher/matcher/SpanQuery.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
+#include "wordcatcher/text/Unicode.h"
 #include "wordcatcher/text/WordSegmenter.h"
 
 namespace wordcatcher {
@@ -73,10 +75,20 @@ std::optional<QueryResult> KXWordcatcher::query(std::u16string_view text) {
     // searched for within edits again.
     _editDistance = 0;
   }
-  SpanQuery query(*_index, *_segmenter,
-                  {_editDistance, _ignoredWordLength, _ignoredWordLengthForEditDistance},
-                  _wordsMatched);
-  return query.run(text);
+  const SearchImage& image = _index->image();
+  SpanQuery query(
+      image, *_segmenter,
+      {_editDistance, _ignoredWordLength, _ignoredWordLengthForEditDistance, SIZE_MAX, SIZE_MAX},
+      _wordsMatched);
+  const auto scored = query.run(text);
+  if (!scored) {
+    return std::nullopt;
+  }
+  std::vector<KXWordcatch> records;
+  for (const auto& [value, distance] : *scored) {
+    records.emplace_back(*fromUtf8(image.valueText(value)), distance);
+  }
+  return records;
 }
 
 }  // namespace wordcatcher

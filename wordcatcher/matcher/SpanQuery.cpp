@@ -4,12 +4,17 @@
 #include <cstdlib>
 #include <utility>
 
+#include "wordcatcher/text/Unicode.h"
+
 namespace wordcatcher {
 
 namespace {
 
-// Ends the phrase at the head of a data string and begins the host's own fields.
-constexpr std::u16string_view kFieldSeparator = u"{ ";
+// Up to this many postings, sorting them costs less than marking them in an array of all values.
+constexpr std::size_t kShortLists = 4096;
+
+// Where one list is this many times as long as the other, its elements are searched for one by one.
+constexpr std::size_t kMuchLonger = 16;
 
 std::int64_t lengthOf(std::u16string_view text) { return static_cast<std::int64_t>(text.size()); }
 
@@ -25,23 +30,22 @@ std::int64_t wrappingMultiply(std::int64_t a, std::int64_t b) {
   return static_cast<std::int64_t>(static_cast<std::uint64_t>(a) * static_cast<std::uint64_t>(b));
 }
 
-template <typename Set>
-void addToAll(Set& phrases, std::int64_t penalty) {
-  for (auto& [value, distance] : phrases) {
-    distance = wrappingAdd(distance, penalty);
+/// The first place from `begin` on that is not below `value`: near places are tried first, since
+/// the values that are asked for ascend as well.
+template <typename Iterator>
+Iterator gallop(Iterator begin, Iterator end, std::uint32_t value) {
+  std::ptrdiff_t step = 1;
+  Iterator low = begin;
+  while (end - low > step && low[step] < value) {
+    low += step;
+    step *= 2;
   }
-}
-
-template <typename Set>
-bool sameValues(const Set& a, const Set& b) {
-  return a.size() == b.size() && std::all_of(a.begin(), a.end(), [&b](const auto& entry) {
-           return b.contains(entry.first);
-         });
+  return std::lower_bound(low, end - low > step ? low + step + 1 : end, value);
 }
 
 }  // namespace
 
-std::optional<std::vector<KXWordcatch>> SpanQuery::run(std::u16string_view text) {
+std::optional<std::vector<ScoredValue>> SpanQuery::run(std::u16string_view text) {
   lookUpLongWords(text);
   if (_searchedWords == 0) {
     lookUpEveryWord(text);
@@ -49,21 +53,29 @@ std::optional<std::vector<KXWordcatch>> SpanQuery::run(std::u16string_view text)
   if (_candidates.empty()) {
     return std::nullopt;
   }
-  CandidateSet phrases = _candidates.front();
-  // Words that bring exactly the first word's phrases tell nothing new.
-  std::erase_if(_candidates,
-                [&phrases](const CandidateSet& set) { return sameValues(set, phrases); });
-  penaliseMissingHits(phrases);
-  for (const auto& others : _candidates) {
-    intersect(phrases, others);
+  const CandidateSet first = std::move(_candidates.front());
+  _phrases.reserve(first.values.size());
+  for (std::size_t i = 0; i < first.values.size(); ++i) {
+    _phrases.push_back({first.values[i], first.distances[i]});
   }
-  penaliseLength(phrases);
-  return withinBound(std::move(phrases));
+  penaliseMissingHits();
+  for (std::size_t i = 1; i < _candidates.size(); ++i) {
+    // Words that bring exactly the first word's phrases tell nothing new.
+    if (_candidates[i].values != first.values) {
+      intersect(_candidates[i]);
+    }
+  }
+  return scored();
 }
 
 void SpanQuery::lookUpLongWords(std::u16string_view text) {
+  std::size_t seen = 0;
   _segmenter.start(text);
   while (const auto word = _segmenter.next()) {
+    if (seen++ == _limits.maxWords) {
+      _truncated = true;
+      return;
+    }
     if (lengthOf(*word) <= _limits.ignoredWordLength) {
       continue;
     }
@@ -76,82 +88,161 @@ void SpanQuery::lookUpLongWords(std::u16string_view text) {
 }
 
 void SpanQuery::lookUpEveryWord(std::u16string_view text) {
+  std::size_t seen = 0;
   _segmenter.start(text);
   while (const auto word = _segmenter.next()) {
+    if (seen++ == _limits.maxWords) {
+      _truncated = true;
+      return;
+    }
     lookUp(*word);
     ++_countedWords;
   }
 }
 
-/// The phrases of every indexed word near this one. A phrase keeps the distance of the first match
-/// that brings it, in the index's order, which need not be the nearest.
+/// The phrases of every indexed word near this one. Every near word counts as a hit, also one
+/// without values.
 void SpanQuery::lookUp(std::u16string_view word) {
-  CandidateSet phrases;
-  for (const auto& match : _index.search_withMaxDistance(word, _limits.editDistance)) {
-    _wordsMatched = wrappingAdd(_wordsMatched, 1);
-    for (const auto& value : match.data()) {
-      phrases.try_emplace(value, match.distance());
-    }
+  if (word.size() > _limits.maxWordUnits) {
+    _truncated = true;
+    return;
   }
-  if (!phrases.empty()) {
+  const auto hits = searchImage(_image, toLower(word), _limits.editDistance);
+  _wordsMatched = wrappingAdd(_wordsMatched, static_cast<std::int64_t>(hits.size()));
+  CandidateSet phrases = candidatesOf(hits);
+  if (!phrases.values.empty()) {
     _candidates.push_back(std::move(phrases));
   }
 }
 
-void SpanQuery::penaliseMissingHits(CandidateSet& phrases) const {
+/// A phrase keeps the distance of the first hit that brings it, in the order of the search, which
+/// need not be the nearest.
+SpanQuery::CandidateSet SpanQuery::candidatesOf(const std::vector<WordHit>& hits) const {
+  std::size_t postings = 0;
+  for (const auto& hit : hits) {
+    postings += hit.values;
+  }
+  return postings <= kShortLists ? mergeShortLists(hits) : markLongLists(hits);
+}
+
+SpanQuery::CandidateSet SpanQuery::mergeShortLists(const std::vector<WordHit>& hits) const {
+  struct Posting {
+    std::uint32_t value;
+    std::uint32_t hit;
+  };
+  std::vector<Posting> postings;
+  for (std::uint32_t hit = 0; hit < hits.size(); ++hit) {
+    for (const std::uint32_t value : _image.postingsOf(hits[hit].word)) {
+      postings.push_back({value, hit});
+    }
+  }
+  std::sort(postings.begin(), postings.end(), [](const Posting& a, const Posting& b) {
+    return a.value != b.value ? a.value < b.value : a.hit < b.hit;
+  });
+  CandidateSet set;
+  for (const auto& posting : postings) {
+    if (set.values.empty() || set.values.back() != posting.value) {
+      set.values.push_back(posting.value);
+      set.distances.push_back(hits[posting.hit].distance);
+    }
+  }
+  return set;
+}
+
+SpanQuery::CandidateSet SpanQuery::markLongLists(const std::vector<WordHit>& hits) const {
+  // 0 for a value that no hit brings, else its distance and one. A distance is at most the limit of
+  // the query, which is small.
+  std::vector<std::uint8_t> marks(_image.valueCount());
+  std::size_t count = 0;
+  for (const auto& hit : hits) {
+    const auto mark = static_cast<std::uint8_t>(hit.distance + 1);
+    for (const std::uint32_t value : _image.postingsOf(hit.word)) {
+      if (value >= marks.size()) {
+        _image.throwDamaged("a posting list refers to a data string that is not there");
+      }
+      if (marks[value] == 0) {
+        marks[value] = mark;
+        ++count;
+      }
+    }
+  }
+  CandidateSet set;
+  set.values.reserve(count);
+  set.distances.reserve(count);
+  for (std::uint32_t value = 0; value < marks.size(); ++value) {
+    if (marks[value] != 0) {
+      set.values.push_back(value);
+      set.distances.push_back(marks[value] - 1U);
+    }
+  }
+  return set;
+}
+
+void SpanQuery::penaliseMissingHits() {
   if (_wordsMatched >= _countedWords) {
     return;
   }
   const auto missing = wrappingSubtract(_countedWords, _wordsMatched);
-  addToAll(phrases, wrappingAdd(wrappingMultiply(missing, _limits.editDistance), 1));
+  _penalty = wrappingAdd(wrappingMultiply(missing, _limits.editDistance), 1);
 }
 
-void SpanQuery::intersect(CandidateSet& phrases, const CandidateSet& others) {
-  CandidateSet common;
-  for (const auto& [value, distance] : phrases) {
-    const auto other = others.find(value);
-    if (other != others.end()) {
-      common.emplace(value, wrappingAdd(distance, other->second));
+void SpanQuery::intersect(const CandidateSet& others) {
+  std::vector<ScoredValue> common;
+  const auto begin = others.values.begin();
+  const auto end = others.values.end();
+  if (others.values.size() / kMuchLonger >= _phrases.size()) {
+    auto place = begin;
+    for (const auto& phrase : _phrases) {
+      place = gallop(place, end, phrase.value);
+      if (place == end) {
+        break;
+      }
+      if (*place == phrase.value) {
+        common.push_back(
+            {phrase.value, wrappingAdd(phrase.distance,
+                                       others.distances[static_cast<std::size_t>(place - begin)])});
+      }
+    }
+  } else {
+    auto phrase = _phrases.begin();
+    for (auto place = begin; place != end && phrase != _phrases.end();) {
+      if (*place < phrase->value) {
+        ++place;
+      } else if (phrase->value < *place) {
+        ++phrase;
+      } else {
+        common.push_back({phrase->value,
+                          wrappingAdd(phrase->distance,
+                                      others.distances[static_cast<std::size_t>(place - begin)])});
+        ++place;
+        ++phrase;
+      }
     }
   }
   if (common.empty()) {
     // Twice the counted words whatever the edit distance is, so that a word that shares no phrase
     // with the others counts against them in phonetic mode too.
-    addToAll(phrases, wrappingAdd(wrappingMultiply(2, _countedWords), 1));
+    _penalty = wrappingAdd(_penalty, wrappingAdd(wrappingMultiply(2, _countedWords), 1));
     return;
   }
-  phrases = std::move(common);
+  _phrases = std::move(common);
   _wordsMatched = wrappingAdd(_wordsMatched, 1);
 }
 
-void SpanQuery::penaliseLength(CandidateSet& phrases) {
-  for (auto& [value, distance] : phrases) {
-    const std::int64_t difference = countedWordsOf(value) - _countedWords;
-    distance = wrappingAdd(distance, _limits.editDistance * std::abs(difference));
-  }
-}
-
-std::int64_t SpanQuery::countedWordsOf(std::u16string_view value) {
-  std::int64_t count = 0;
-  _segmenter.start(value.substr(0, value.find(kFieldSeparator)));
-  while (const auto word = _segmenter.next()) {
-    if (lengthOf(*word) > _limits.ignoredWordLengthForEditDistance) {
-      ++count;
-    }
-  }
-  return count;
-}
-
-std::vector<KXWordcatch> SpanQuery::withinBound(CandidateSet&& phrases) const {
+std::vector<ScoredValue> SpanQuery::scored() const {
   const std::int64_t bound = _limits.editDistance * _countedWords;
-  std::vector<KXWordcatch> records;
-  for (auto& [value, distance] : phrases) {
+  std::vector<ScoredValue> records;
+  for (const auto& phrase : _phrases) {
+    const std::int64_t difference =
+        static_cast<std::int64_t>(_image.countedWordsOf(phrase.value)) - _countedWords;
+    const std::int64_t distance = wrappingAdd(wrappingAdd(phrase.distance, _penalty),
+                                              _limits.editDistance * std::abs(difference));
     if (distance <= bound) {
-      records.emplace_back(value, distance);
+      records.push_back({phrase.value, distance});
     }
   }
-  std::sort(records.begin(), records.end(), [](const KXWordcatch& a, const KXWordcatch& b) {
-    return a.distance() != b.distance() ? a.distance() < b.distance() : a.value() < b.value();
+  std::sort(records.begin(), records.end(), [](const ScoredValue& a, const ScoredValue& b) {
+    return a.distance != b.distance ? a.distance < b.distance : a.value < b.value;
   });
   return records;
 }

@@ -67,7 +67,7 @@ std::set<std::u16string> PLXDFA::dataFor(std::u16string_view state) {
 
 const std::u16string& PLXDFA::startState() const noexcept { return _startState; }
 
-void PLXDFA::setStartState(std::u16string state) { _startState = std::move(state); }
+void PLXDFA::setStartState(std::u16string_view state) { _startState = state; }
 
 const std::string& PLXDFA::path() const noexcept { return _path; }
 

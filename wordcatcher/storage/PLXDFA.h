@@ -2,6 +2,7 @@
 #define WORDCATCHER_STORAGE_PLXDFA_H
 
 #include <cstdint>
+#include <memory>
 #include <optional>
 #include <ostream>
 #include <set>
@@ -12,6 +13,8 @@
 #include "wordcatcher/storage/TinyCDB.h"
 
 namespace wordcatcher {
+
+class SearchImage;
 
 /// A deterministic automaton kept on disk in three table files: its edges, its final states and the
 /// data strings of its states. It holds the index's prefix tree: a state is named by the symbols
@@ -71,7 +74,7 @@ class WORDCATCHER_EXPORT PLXDFA {
 
   /// The start state's name, "" unless replaced.
   const std::u16string& startState() const noexcept;
-  void setStartState(std::u16string state);
+  void setStartState(std::u16string_view state);
 
   /// The path given at construction. Replacing it changes this string only: the tables keep the
   /// paths that they were made with.
@@ -82,6 +85,8 @@ class WORDCATCHER_EXPORT PLXDFA {
   std::u16string description() const;
 
  private:
+  friend std::shared_ptr<const SearchImage> makeTableImage(const PLXDFA& automaton);
+
   TinyCDB _edgeTable;
   TinyCDB _dataTable;
   TinyCDB _finalTable;

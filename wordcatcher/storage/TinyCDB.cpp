@@ -9,6 +9,7 @@
 
 #include <cerrno>
 #include <cstdlib>
+#include <cstring>
 #include <limits>
 #include <unordered_set>
 #include <utility>
@@ -79,7 +80,7 @@ void TinyCDB::setMode(std::int32_t mode) {
   if (_mode != mode && _mode != 0) {
     if (_mode == kWriting) {
       logLine("%s Finalizing %@", {kSetMode, _path});
-      if (cdb_make_finish(_cdbmake.get()) != 0) {
+      if (!_makeStarted || cdb_make_finish(_cdbmake.get()) != 0) {
         logLine("%s Could not finalize for db make at %@, db may be corrupted!", {kSetMode, _path});
       }
     }
@@ -115,7 +116,8 @@ void TinyCDB::enterWriting() {
     logLine("%s Could not RDRW open file %@ because (%d) %s",
             {kSetMode, _path, errno, ErrorText{errno}});
   }
-  if (cdb_make_start(_cdbmake.get(), _fileDesc) != 0) {
+  _makeStarted = cdb_make_start(_cdbmake.get(), _fileDesc) == 0;
+  if (!_makeStarted) {
     logLine("%s Could not init for db make at %@ because (%d) %s",
             {kSetMode, _path, errno, ErrorText{errno}});
   }
@@ -143,7 +145,14 @@ void TinyCDB::setValue_forKey(std::optional<std::u16string_view> value,
   if (!keyBytes || !valueBytes) {
     return;
   }
-  if (cdb_make_add(_cdbmake.get(), keyBytes->data(), static_cast<unsigned>(keyBytes->size()),
+  // Outside a writing pass the writer's record holds no buffer, or a descriptor that was closed and
+  // may be the host's by now.
+  const bool writing = _mode == kWriting && _makeStarted;
+  if (!writing) {
+    errno = EBADF;
+  }
+  if (!writing ||
+      cdb_make_add(_cdbmake.get(), keyBytes->data(), static_cast<unsigned>(keyBytes->size()),
                    valueBytes->data(), static_cast<unsigned>(valueBytes->size())) != 0) {
     logLine("%s Could not put %@ into key %@ because (%d) %s",
             {kSetValue, *value, *key, errno, ErrorText{errno}});
@@ -169,11 +178,14 @@ std::set<std::u16string> TinyCDB::valuesFor(std::u16string_view key) {
   while (cdb_findnext(_cdbfind.get()) > 0) {
     if (!readFoundValue()) {
       logLine("%s unable to read value for %@", {kValuesFor, key});
+    }
+    const std::size_t length = _cdb->cdb_vlen;
+    if (length > 0 && (buf == nullptr || length > static_cast<std::size_t>(blen))) {
       continue;
     }
-    const char* bytes = reinterpret_cast<const char*>(buf);
+    // After a failed read, whatever the buffer holds.
     const auto inserted =
-        seen.emplace(bytes == nullptr ? std::string() : std::string(bytes, _cdb->cdb_vlen));
+        seen.emplace(length == 0 ? "" : reinterpret_cast<const char*>(buf), length);
     if (!inserted.second) {
       continue;
     }
@@ -207,6 +219,10 @@ void TinyCDB::_allocbuf(std::int32_t size) {
   if (grown == nullptr) {
     std::free(buf);
     syslog(LOG_USER | LOG_ERR, "Unable to allocate %u bytes", static_cast<unsigned>(size));
+  } else {
+    // So that a failed read leaves nothing undefined to decode.
+    const std::int32_t kept = buf == nullptr ? 0 : blen;
+    std::memset(grown + kept, 0, static_cast<std::size_t>(size - kept));
   }
   buf = grown;
   blen = size;

@@ -59,9 +59,9 @@ class WORDCATCHER_EXPORT TinyCDB {
   /// switched to writing again; 0 before. It does not tell the mode last set.
   std::int32_t getMode() const noexcept;
 
-  /// Adds one record; earlier records of the key stay. Valid in mode 2. A null string, or one with
-  /// an unpaired surrogate, which has no UTF-8 form, is not stored and not logged. Both strings are
-  /// stored up to their first U+0000.
+  /// Adds one record; earlier records of the key stay. Valid in mode 2; elsewhere it is a line in
+  /// the log. A null string, or one with an unpaired surrogate, which has no UTF-8 form, is not
+  /// stored and not logged. Both strings are stored up to their first U+0000.
   void setValue_forKey(std::optional<std::u16string_view> value,
                        std::optional<std::u16string_view> key);
 
@@ -76,6 +76,8 @@ class WORDCATCHER_EXPORT TinyCDB {
   void setPath(std::string path);
 
  private:
+  friend class TableScan;
+
   void enterWriting();
   void enterReading();
   bool readFoundValue();
@@ -86,6 +88,7 @@ class WORDCATCHER_EXPORT TinyCDB {
   std::int32_t _fileDesc = -1;
   std::unique_ptr<struct cdb> _cdb;
   std::unique_ptr<struct cdb_make> _cdbmake;
+  bool _makeStarted = false;
   std::unique_ptr<struct cdb_find> _cdbfind;
   unsigned char* buf = nullptr;
   std::int32_t blen = 0;

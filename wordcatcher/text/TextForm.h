@@ -11,9 +11,12 @@
 
 namespace wordcatcher {
 
-/// The text form of a value inside descriptions: a string is itself, an integer is written in
+/// The text form of a value inside descriptions: a string is itself
+/// (U+FFFD for bytes that are not UTF-8), an integer is written in
 /// decimal, and an object gives its own description(). Other types need an overload beside them.
 inline std::u16string textForm(std::u16string_view text) { return std::u16string(text); }
+
+WORDCATCHER_EXPORT std::u16string textForm(std::string_view utf8);
 
 template <std::integral Integer>
 std::u16string textForm(Integer number) {

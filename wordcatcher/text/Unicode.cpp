@@ -2,6 +2,7 @@
 
 #include <unicode/ustring.h>
 
+#include <algorithm>
 #include <cstdint>
 #include <limits>
 #include <stdexcept>
@@ -13,19 +14,27 @@ namespace {
 constexpr UChar32 kReplacement = 0xFFFD;
 constexpr const char* kRootLocale = "";
 
+constexpr std::size_t kMaxLength = std::numeric_limits<std::int32_t>::max();
+
 std::int32_t icuLength(std::size_t length) {
-  if (length > static_cast<std::size_t>(std::numeric_limits<std::int32_t>::max() / 4)) {
-    throw std::length_error("A text must not be longer than 536,870,911 code units or bytes.");
+  if (length > kMaxLength) {
+    throw std::length_error("A text must not be longer than 2,147,483,647 code units.");
   }
   return static_cast<std::int32_t>(length);
 }
+
+/// Room for the UTF-8 form of so many code units, as far as ICU can count it.
+std::size_t utf8Room(std::size_t units) { return std::min(units * 3, kMaxLength); }
 
 using CaseMapping = std::int32_t (*)(UChar*, std::int32_t, const UChar*, std::int32_t, const char*,
                                      UErrorCode*);
 
 std::u16string mapCase(CaseMapping mapping, std::u16string_view text) {
+  if (text.empty()) {
+    return {};
+  }
   const std::int32_t length = icuLength(text.size());
-  std::u16string result(text.size() + text.size() / 8 + 8, u'\0');
+  std::u16string result(std::min(text.size() + text.size() / 8 + 8, kMaxLength), u'\0');
   UErrorCode status = U_ZERO_ERROR;
   std::int32_t needed =
       mapping(result.data(), icuLength(result.size()), text.data(), length, kRootLocale, &status);
@@ -44,11 +53,14 @@ std::u16string mapCase(CaseMapping mapping, std::u16string_view text) {
 }  // namespace
 
 std::optional<std::string> toUtf8(std::u16string_view text) {
-  const std::int32_t length = icuLength(text.size());
-  std::string bytes(text.size() * 3, '\0');
+  if (text.empty() || text.size() > kMaxLength) {
+    return text.empty() ? std::optional<std::string>("") : std::nullopt;
+  }
+  std::string bytes(utf8Room(text.size()), '\0');
   std::int32_t used = 0;
   UErrorCode status = U_ZERO_ERROR;
-  u_strToUTF8(bytes.data(), icuLength(bytes.size()), &used, text.data(), length, &status);
+  u_strToUTF8(bytes.data(), icuLength(bytes.size()), &used, text.data(), icuLength(text.size()),
+              &status);
   if (U_FAILURE(status)) {
     return std::nullopt;
   }
@@ -57,6 +69,9 @@ std::optional<std::string> toUtf8(std::u16string_view text) {
 }
 
 std::optional<std::u16string> fromUtf8(std::string_view bytes) {
+  if (bytes.empty() || bytes.size() > kMaxLength) {
+    return bytes.empty() ? std::optional<std::u16string>(u"") : std::nullopt;
+  }
   const std::int32_t length = icuLength(bytes.size());
   std::u16string text(bytes.size(), u'\0');
   std::int32_t used = 0;
@@ -69,13 +84,30 @@ std::optional<std::u16string> fromUtf8(std::string_view bytes) {
   return text;
 }
 
-std::string displayUtf8(std::u16string_view text) {
-  const std::int32_t length = icuLength(text.size());
-  std::string bytes(text.size() * 3, '\0');
+std::u16string decodeUtf8(std::string_view bytes) {
+  if (bytes.empty()) {
+    return {};
+  }
+  const std::int32_t length = icuLength(bytes.size());
+  std::u16string text(bytes.size(), u'\0');
   std::int32_t used = 0;
   UErrorCode status = U_ZERO_ERROR;
-  u_strToUTF8WithSub(bytes.data(), icuLength(bytes.size()), &used, text.data(), length,
-                     kReplacement, nullptr, &status);
+  u_strFromUTF8WithSub(text.data(), length, &used, bytes.data(), length, kReplacement, nullptr,
+                       &status);
+  text.resize(static_cast<std::size_t>(used));
+  return text;
+}
+
+std::string displayUtf8(std::u16string_view text) {
+  if (text.empty()) {
+    return {};
+  }
+  text = text.substr(0, kMaxLength / 3);
+  std::string bytes(utf8Room(text.size()), '\0');
+  std::int32_t used = 0;
+  UErrorCode status = U_ZERO_ERROR;
+  u_strToUTF8WithSub(bytes.data(), icuLength(bytes.size()), &used, text.data(),
+                     icuLength(text.size()), kReplacement, nullptr, &status);
   bytes.resize(static_cast<std::size_t>(used));
   return bytes;
 }

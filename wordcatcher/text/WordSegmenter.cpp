@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <limits>
+#include <new>
 #include <stdexcept>
 
 namespace wordcatcher {
@@ -17,6 +18,14 @@ WordSegmenter::WordSegmenter() {
   }
 }
 
+WordSegmenter::WordSegmenter(const WordSegmenter& other) {
+  UErrorCode status = U_ZERO_ERROR;
+  _iterator.reset(ubrk_clone(other._iterator.get(), &status));
+  if (U_FAILURE(status)) {
+    throw std::bad_alloc();
+  }
+}
+
 WordSegmenter::~WordSegmenter() = default;
 
 void WordSegmenter::CloseIterator::operator()(UBreakIterator* iterator) const noexcept {
@@ -27,9 +36,9 @@ void WordSegmenter::start(std::u16string_view text) {
   if (text.size() > static_cast<std::size_t>(std::numeric_limits<std::int32_t>::max())) {
     throw std::length_error("A text must not be longer than 2,147,483,647 code units.");
   }
-  _text = text;
+  _text = text.empty() ? std::u16string_view(u"") : text;  // ICU takes no null pointer
   UErrorCode status = U_ZERO_ERROR;
-  ubrk_setText(_iterator.get(), text.data(), static_cast<std::int32_t>(text.size()), &status);
+  ubrk_setText(_iterator.get(), _text.data(), static_cast<std::int32_t>(_text.size()), &status);
   if (U_FAILURE(status)) {
     throw std::runtime_error(u_errorName(status));
   }

@@ -1,0 +1,72 @@
+#include <CLI/CLI.hpp>
+#include <memory>
+#include <nlohmann/json.hpp>
+#include <string>
+#include <vector>
+
+#include "cli/Arguments.h"
+#include "cli/Failure.h"
+#include "cli/Output.h"
+#include "cli/Questions.h"
+#include "cli/Utf8.h"
+#include "cli/Verbs.h"
+#include "wordcatcher/phonetic/KXMetaphone.h"
+
+namespace wordcatcher::cli {
+
+namespace {
+
+using Json = nlohmann::ordered_json;
+
+constexpr const char* kFooter = R"(
+Prints the codes of each TEXT, or of each line of standard input: a line of one code a
+word, a space between them. Words that sound alike have equal codes. A word of which
+no letter sounds has none.
+
+--json prints one object a TEXT instead:
+  {"text": "...", "codes": ["...", "..."]}
+
+Examples:
+  wordcatcher encode 'Catherine Schmidt' 'Kathryn Shmit'
+  wordcatcher encode --json < names.txt)";
+
+struct Arguments {
+  bool json = false;
+  std::vector<std::string> texts;
+};
+
+/// The codes of a translated text, which stand several spaces apart.
+std::vector<std::string> codesOf(const std::u16string& translation) {
+  std::vector<std::string> codes;
+  std::size_t begin = 0;
+  while ((begin = translation.find_first_not_of(u' ', begin)) != std::u16string::npos) {
+    const std::size_t end = translation.find(u' ', begin);
+    codes.push_back(toUtf8(translation.substr(begin, end - begin)));
+    begin = end;
+  }
+  return codes;
+}
+
+ExitCode runEncode(const Arguments& arguments) {
+  const Questions questions(arguments.texts, false);
+  KXMetaphone encoder;
+  return questions.answerEach([&](const InputLine& question, Output& output) {
+    const auto codes = codesOf(encoder.translate(question.text));
+    output.write(arguments.json ? Json{{"text", question.utf8}, {"codes", codes}}.dump() + '\n'
+                                : CLI::detail::join(codes, " ") + '\n');
+    return true;
+  });
+}
+
+}  // namespace
+
+void addEncodeVerb(CLI::App& program, ChosenVerb& chosen) {
+  auto* const verb = program.add_subcommand("encode", "Print the codes of how words sound");
+  const auto arguments = std::make_shared<Arguments>();
+  verb->add_flag("--json", arguments->json, "Print a JSON object a text");
+  addArguments(*verb, "TEXT", arguments->texts, "Texts; without any, the lines of standard input");
+  verb->footer(kFooter);
+  verb->callback([arguments, &chosen] { chosen = [arguments] { return runEncode(*arguments); }; });
+}
+
+}  // namespace wordcatcher::cli

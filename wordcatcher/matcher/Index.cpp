@@ -1,0 +1,208 @@
+#include "wordcatcher/matcher/Index.h"
+
+#include <sys/stat.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <system_error>
+#include <utility>
+
+#include "wordcatcher/Error.h"
+#include "wordcatcher/fuzzy/ImageSearch.h"
+#include "wordcatcher/fuzzy/LXFuzzyIndex.h"
+#include "wordcatcher/matcher/SpanQuery.h"
+#include "wordcatcher/phonetic/KXMetaphone.h"
+#include "wordcatcher/storage/SearchImage.h"
+#include "wordcatcher/text/Unicode.h"
+
+namespace wordcatcher {
+
+namespace {
+
+constexpr std::int32_t kReading = 1;
+
+// As the classic matcher's.
+constexpr std::int64_t kWordDistance = 2;
+constexpr std::int64_t kWholeTextDistance = 3;
+constexpr std::int64_t kIgnoredWordLength = 2;
+constexpr std::int64_t kUncountedWordLengthOfQueries = 3;
+
+constexpr std::int64_t kMaxSearchDistance = 16;
+
+/// The three files of a classic index whose names begin with `prefix`.
+std::vector<std::string> tablesAt(const std::string& prefix) {
+  return {prefix + "edgeTable.tdb", prefix + "dataTable.tdb", prefix + "finalTable.tdb"};
+}
+
+bool isDirectory(const std::string& path) {
+  struct stat status = {};
+  return stat(path.c_str(), &status) == 0 && S_ISDIR(status.st_mode);
+}
+
+bool exists(const std::string& path) {
+  struct stat status = {};
+  return stat(path.c_str(), &status) == 0;
+}
+
+/// The tables' own failures are only lines in the log, so what can be told beforehand is told here.
+void checkTables(const std::string& prefix) {
+  constexpr off_t kHeaderBytes = 2048;
+  for (const auto& table : tablesAt(prefix)) {
+    struct stat status = {};
+    if (stat(table.c_str(), &status) != 0) {
+      const ErrorCode code = errno == ENOENT ? ErrorCode::notFound : ErrorCode::notReadable;
+      throw Error(code, "There is no classic index at " + prefix + ": " + table + " cannot be read (" +
+                            std::generic_category().message(errno) + ").");
+    }
+    if (!S_ISREG(status.st_mode) || status.st_size < kHeaderBytes) {
+      throw Error(ErrorCode::notAnIndex, table + " is no finished table; index again.");
+    }
+  }
+}
+
+std::uint32_t modeNumber(MatchingMode mode) { return static_cast<std::uint32_t>(mode); }
+
+}  // namespace
+
+struct Index::State {
+  std::shared_ptr<const SearchImage> image;
+  MatchingMode mode;
+  Options options;
+  // Copied by each query; never used itself.
+  WordSegmenter segmenter;
+
+  std::vector<std::string> dataOf(std::uint32_t word) const {
+    std::vector<std::string> data;
+    for (const std::uint32_t value : image->postingsOf(word)) {
+      data.emplace_back(image->valueText(value));
+    }
+    return data;
+  }
+
+  /// A word of the image as UTF-8; unpaired surrogates, which no text has, appear as U+FFFD.
+  std::string wordText(std::uint32_t word) const { return displayUtf8(image->textOf(word)); }
+
+  QueryResult queryWholeText(const std::u16string& text) const;
+  QueryResult queryWords(std::u16string_view text, std::int64_t editDistance) const;
+};
+
+Index::Index(std::shared_ptr<const State> state) : _state(std::move(state)) {}
+
+Index Index::open(const std::string& path) { return open(path, Options()); }
+
+Index Index::open(const std::string& path, const Options& options, MatchingMode mode) {
+  const bool directory = isDirectory(path);
+  const std::string prefix = directory && !path.ends_with('/') ? path + '/' : path;
+  if (directory || (!exists(path) && exists(tablesAt(path).front()))) {
+    checkTables(prefix);
+    LXFuzzyIndex tables(prefix);
+    tables.setMode(kReading);
+    if (tables.getMode() != kReading) {
+      throw Error(ErrorCode::notReadable,
+                  "The classic index at " + prefix + " cannot be opened; the log says why.");
+    }
+    return Index(std::make_shared<const State>(
+        State{tables.sharedImage(), mode, options, WordSegmenter()}));
+  }
+  auto image = SearchImage::open(
+      path, options.load == Load::copy ? SearchImage::Load::copy : SearchImage::Load::map);
+  const std::uint32_t stored = image->header().mode;
+  if (stored > modeNumber(MatchingMode::phoneticWords)) {
+    throw Error(ErrorCode::notAnIndex,
+                "The search image " + path + " has a matching mode that this version does not know.");
+  }
+  return Index(std::make_shared<const State>(
+      State{std::move(image), static_cast<MatchingMode>(stored), options, WordSegmenter()}));
+}
+
+Index::QueryResult Index::query(std::string_view text) const {
+  const std::u16string units = decodeUtf8(text);
+  switch (_state->mode) {
+    case MatchingMode::wholeText:
+      return _state->queryWholeText(units);
+    case MatchingMode::phoneticWords:
+      return _state->queryWords(KXMetaphone().translate(units), 0);
+    default:
+      return _state->queryWords(units, kWordDistance);
+  }
+}
+
+Index::QueryResult Index::State::queryWholeText(const std::u16string& text) const {
+  QueryResult result;
+  result.found = true;
+  if (text.size() > options.maxWordUnits) {
+    result.truncated = true;
+    return result;
+  }
+  auto hits = searchImage(*image, toLower(text), kWholeTextDistance);
+  std::sort(hits.begin(), hits.end(), [](const WordHit& a, const WordHit& b) {
+    return a.distance != b.distance ? a.distance < b.distance : a.word < b.word;
+  });
+  for (const auto& hit : hits) {
+    result.matches.push_back({wordText(hit.word), hit.distance, dataOf(hit.word)});
+  }
+  return result;
+}
+
+Index::QueryResult Index::State::queryWords(std::u16string_view text,
+                                            std::int64_t editDistance) const {
+  std::int64_t wordsMatched = 0;
+  WordSegmenter words(segmenter);
+  SpanQuery query(*image, words,
+                  {editDistance, kIgnoredWordLength, kUncountedWordLengthOfQueries,
+                   options.maxQueryWords, options.maxWordUnits},
+                  wordsMatched);
+  const auto scored = query.run(text);
+  QueryResult result;
+  result.truncated = query.truncated();
+  result.found = scored.has_value();
+  if (scored) {
+    for (const auto& [value, distance] : *scored) {
+      result.matches.push_back({std::string(image->valueText(value)), distance, {}});
+    }
+  }
+  return result;
+}
+
+Index::SearchResult Index::search(std::string_view word, std::int64_t maxDistance) const {
+  if (maxDistance > kMaxSearchDistance) {
+    throw Error(ErrorCode::badInput, "A distance of " + std::to_string(maxDistance) +
+                                         " finds almost anything; give at most " +
+                                         std::to_string(kMaxSearchDistance) + ".");
+  }
+  const auto units = fromUtf8(word);
+  if (!units) {
+    throw Error(ErrorCode::badInput, "The word is not UTF-8; convert it before the search.");
+  }
+  SearchResult result;
+  if (units->size() > _state->options.maxWordUnits) {
+    result.truncated = true;
+    return result;
+  }
+  for (const auto& hit : searchImage(*_state->image, toLower(*units), maxDistance)) {
+    result.matches.push_back({_state->wordText(hit.word), hit.distance, _state->dataOf(hit.word)});
+  }
+  return result;
+}
+
+Index::Info Index::info() const {
+  const auto& header = _state->image->header();
+  constexpr const char* kDigits = "0123456789abcdef";
+  Info info = {};
+  info.mode = _state->mode;
+  info.phrases = header.phraseCount;
+  info.words = header.wordCount;
+  info.values = header.valueCount;
+  info.bytes = _state->image->bytes().size();
+  info.version = header.version;
+  for (const std::uint64_t half : header.generation) {
+    for (unsigned shift = 64; shift > 0; shift -= 4) {
+      info.generation += kDigits[(half >> (shift - 4)) & 0xFU];
+    }
+  }
+  return info;
+}
+
+void Index::verify() const { _state->image->verify(); }
+
+}  // namespace wordcatcher
