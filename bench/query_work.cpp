@@ -74,10 +74,9 @@ class QueryWork {
 
   void judge(const Question& question, const Index::QueryResult& answer) {
     const auto& matches = answer.matches;
-    const auto source =
-        std::find_if(matches.begin(), matches.end(), [&](const Index::Match& match) {
-          return match.value == dataOf(question.source);
-        });
+    const auto source = std::find_if(
+        matches.begin(), matches.end(),
+        [&](const Index::Match& match) { return match.value == dataOf(question.source); });
     const auto place = static_cast<std::size_t>(source - matches.begin());
     _matches += matches.size();
     _found += source != matches.end() ? 1 : 0;

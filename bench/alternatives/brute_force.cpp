@@ -3,9 +3,9 @@
 //
 //     brute_force WORDS QUERIES [RESULTS]
 //
-// prints one JSON object as search_work does. Into RESULTS it writes lines of the bound, the query and the words with two distances: the plain one,
-// and that of searches that may not leave out the head of the query before a code unit of the word
-// is read.
+// prints one JSON object as search_work does. Into RESULTS it writes lines of the bound, the query
+// and the words with two distances: the plain one, and that of searches that may not leave out the
+// head of the query before a code unit of the word is read.
 
 #include <algorithm>
 #include <array>

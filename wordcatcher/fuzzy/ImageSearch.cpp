@@ -22,7 +22,7 @@ constexpr char16_t kEmptyMove = u'_';
 constexpr std::int64_t kMaxBandedDistance = 4;
 
 /// Below this length the two halves of a query are too short to rule anything out.
-constexpr std::size_t kMinSplitLength = 4;
+constexpr std::size_t kMinSplitLength = 6;
 
 /// A lower-cased query in an image's labels.
 struct Query {
@@ -74,26 +74,36 @@ std::uint32_t wordAt(const SearchImage::Tree& tree, std::uint64_t place) {
   return tree.order.empty() ? static_cast<std::uint32_t>(place) : tree.order[place];
 }
 
+void checkSlot(const SearchImage& image, const SearchImage::Tree& tree, std::size_t slot) {
+  if (slot >= tree.slots.size()) {
+    image.throwDamaged("a tree leads out of its section");
+  }
+}
+
 /// Calls `visit(label, child)` for every child of a place whose bit is in `wanted`; the child for
 /// the end of a word has label 0.
 template <typename Visit>
 void forEachChild(const SearchImage& image, const SearchImage::Tree& tree, const TreeSlot& parent,
                   std::uint64_t wanted, Visit visit) {
   const std::uint64_t common = parent.children & ~(std::uint64_t{1} << image::kRareBit);
-  for (std::uint64_t bits = common & wanted; bits != 0; bits &= bits - 1) {
-    const auto label = static_cast<unsigned>(std::countr_zero(bits));
-    const std::uint64_t before = common & ((std::uint64_t{1} << label) - 1);
-    const std::size_t child = parent.index() + static_cast<unsigned>(std::popcount(before));
-    if (child >= tree.slots.size()) {
-      image.throwDamaged("a tree leads out of its section");
+  std::size_t child = parent.index();
+  if ((common & ~wanted) == 0) {
+    for (std::uint64_t bits = common; bits != 0; bits &= bits - 1, ++child) {
+      checkSlot(image, tree, child);
+      visit(static_cast<std::uint16_t>(std::countr_zero(bits)), child);
     }
-    visit(static_cast<std::uint16_t>(label), child);
+  } else {
+    for (std::uint64_t bits = common & wanted; bits != 0; bits &= bits - 1) {
+      const std::uint64_t lower = (bits & -bits) - 1;
+      const std::size_t at = child + static_cast<unsigned>(std::popcount(common & lower));
+      checkSlot(image, tree, at);
+      visit(static_cast<std::uint16_t>(std::countr_zero(bits)), at);
+    }
   }
   if ((parent.children & wanted & ~common) == 0) {
     return;
   }
-  for (std::size_t child = parent.index() + static_cast<unsigned>(std::popcount(common));;
-       ++child) {
+  for (child = parent.index() + static_cast<unsigned>(std::popcount(common));; ++child) {
     if (child >= tree.slots.size() || tree.slots[child].label < image::kRareBit) {
       image.throwDamaged("a tree leads out of its section");
     }
@@ -137,6 +147,14 @@ class BandedWalk {
     std::uint64_t states;
   };
 
+  /// A word of a leaf that is still to be read: first its place, then itself.
+  struct LeafWord {
+    std::uint32_t word;
+    std::uint32_t depth;
+    std::uint64_t states;
+  };
+  static constexpr std::size_t kLeafWords = 64;
+
   template <typename Accept>
   void finish(Accept& accept) {
     while (!_pending.empty()) {
@@ -144,6 +162,7 @@ class BandedWalk {
       _pending.pop_back();
       expand(_tree.slots[item.slot], item.states, item.depth, accept);
     }
+    readLeafWords(accept);
   }
 
   template <typename Accept>
@@ -151,8 +170,8 @@ class BandedWalk {
     _budget.spendSlot();
     constexpr std::uint64_t kEnd = std::uint64_t{1} << image::kEndBit;
     // When only matches keep the automaton alive, no other child is looked at.
-    std::uint64_t wanted =
-        _pattern.stepOther(states, depth) != 0 ? ~kEnd : _pattern.wantedChildren(states, depth);
+    const typename BandedPattern<K>::Fork fork(_pattern, states, depth);
+    std::uint64_t wanted = fork.other() != 0 ? ~kEnd : _pattern.wantedChildren(states, depth);
     if ((states & _pattern.acceptingAt(depth)) != 0) {
       wanted |= kEnd;
     }
@@ -165,7 +184,7 @@ class BandedWalk {
         accept(wordAt(_tree, slot.index()), states & _pattern.acceptingAt(depth));
         return;
       }
-      std::uint64_t next = _pattern.step(states, depth, label);
+      std::uint64_t next = fork.step(label);
       next &= Band<K>::kReach.notTooFarAhead[Band<K>::reachEntry(ahead - slot.shortest)];
       if (slot.longest < image::kLengthCap) {
         next &= Band<K>::kReach.notTooFarBehind[Band<K>::reachEntry(ahead - slot.longest)];
@@ -180,15 +199,45 @@ class BandedWalk {
   void enter(std::size_t child, std::uint64_t states, std::size_t depth, Accept& accept) {
     const TreeSlot& slot = _tree.slots[child];
     if (!slot.isLeaf()) {
+      if (slot.index() < _tree.slots.size()) {
+        __builtin_prefetch(&_tree.slots[slot.index()]);
+      }
       _pending.push_back(
           {static_cast<std::uint32_t>(child), static_cast<std::uint32_t>(depth), states});
       return;
     }
     _budget.spendPlaces(slot.index(), slot.children);
     for (std::uint64_t place = slot.index(); place < slot.index() + slot.children; ++place) {
-      const std::uint32_t word = wordAt(_tree, place);
-      if (const std::uint64_t accepted = readRest(word, states, depth)) {
-        accept(word, accepted);
+      if (!_tree.order.empty()) {
+        __builtin_prefetch(&_tree.order[place]);
+      } else {
+        _image.prefetchOffsetOf(static_cast<std::uint32_t>(place));
+      }
+      _leafWords[_leafWordCount++] = {static_cast<std::uint32_t>(place),
+                                      static_cast<std::uint32_t>(depth), states};
+      if (_leafWordCount == kLeafWords) {
+        readLeafWords(accept);
+      }
+    }
+  }
+
+  /// What is needed of each word is asked of memory before the first is waited for.
+  template <typename Accept>
+  void readLeafWords(Accept& accept) {
+    const std::span<LeafWord> leafWords(_leafWords, _leafWordCount);
+    _leafWordCount = 0;
+    if (!_tree.order.empty()) {
+      for (auto& leaf : leafWords) {
+        leaf.word = _tree.order[leaf.word];
+        _image.prefetchOffsetOf(leaf.word);
+      }
+    }
+    for (const auto& leaf : leafWords) {
+      _image.prefetchLabelsOf(leaf.word);
+    }
+    for (const auto& leaf : leafWords) {
+      if (const std::uint64_t accepted = readRest(leaf.word, leaf.states, leaf.depth)) {
+        accept(leaf.word, accepted);
       }
     }
   }
@@ -209,6 +258,8 @@ class BandedWalk {
   const BandedPattern<K>& _pattern;
   VisitBudget _budget;
   std::vector<Item> _pending;
+  LeafWord _leafWords[kLeafWords];
+  std::size_t _leafWordCount = 0;
 };
 
 /// Collects hits, and puts them into the order of a search.

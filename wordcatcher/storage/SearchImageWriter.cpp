@@ -23,7 +23,7 @@ using image::TreeSlot;
 
 // Leaves of several words keep the trees small; looking at a word costs about as much as looking at
 // a slot, so beyond a few the walk gets slower.
-constexpr std::uint32_t kWordsALeaf = 2;
+constexpr std::uint32_t kWordsALeaf = 4;
 
 [[noreturn]] void tooMany(const char* what) {
   throw Error(ErrorCode::tooLarge, std::string("An index holds at most 1,073,741,823 ") + what +
