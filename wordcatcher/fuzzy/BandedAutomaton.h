@@ -61,15 +61,16 @@ struct Band {
     return states & kAll;
   }
 
-  /// Reads one code unit; bit c of `matching` says that the query's code unit behind column c is
-  /// that one.
-  static constexpr std::uint64_t step(std::uint64_t states, std::uint64_t matching) {
-    return closed((states & (matching * kStarts)) | edited(states));
+  /// What reading any one code unit leads to by an edit.
+  static constexpr std::uint64_t edited(std::uint64_t states) {
+    return closed((states | ((states >> 1) & kNotLastColumn)) << kColumns);
   }
 
-  /// The part of a step that is the same whatever is read.
-  static constexpr std::uint64_t edited(std::uint64_t states) {
-    return (states | ((states >> 1) & kNotLastColumn)) << kColumns;
+  /// What reading a code unit leads to without an edit; bit c of `matching` says that the query's
+  /// code unit behind column c is that one. Together with edited() this is the whole step: missing
+  /// code units behind either are those behind both.
+  static constexpr std::uint64_t matched(std::uint64_t states, std::uint64_t matching) {
+    return closed(states & (matching * kStarts));
   }
 
   /// The columns in use in any row.
@@ -120,14 +121,9 @@ class BandedPattern {
 
   /// `restricted` code units at the head may only be passed with at most `edits` edits.
   BandedPattern(std::span<const QueryUnit> units, std::size_t restricted, unsigned edits)
-      : _units(units) {
+      : _units(units), _states(units.size() + K + 2) {
     const auto length = static_cast<std::int64_t>(units.size());
-    const std::size_t depths = units.size() + K + 2;
-    if (depths > kFewDepths) {
-      _manyStates.resize(depths);
-      _states = _manyStates.data();
-    }
-    for (std::size_t depth = 0; depth < depths; ++depth) {
+    for (std::size_t depth = 0; depth < _states.size(); ++depth) {
       const auto shift = static_cast<std::int64_t>(depth) - static_cast<std::int64_t>(K);
       // Column c stands for p = shift + c.
       const std::uint64_t inside = below(length + 1 - shift) & ~below(-shift);
@@ -144,9 +140,6 @@ class BandedPattern {
     }
   }
 
-  BandedPattern(const BandedPattern&) = delete;
-  BandedPattern& operator=(const BandedPattern&) = delete;
-
   std::size_t length() const noexcept { return _units.size(); }
   std::uint64_t validAt(std::size_t depth) const noexcept { return _states[depth].valid; }
   std::uint64_t acceptingAt(std::size_t depth) const noexcept { return _states[depth].accepting; }
@@ -159,37 +152,18 @@ class BandedPattern {
   std::uint64_t closedStart() const noexcept { return B::closed(start()) & validAt(0); }
 
   std::uint64_t step(std::uint64_t states, std::size_t depth, std::uint16_t label) const noexcept {
-    return B::step(states, matching(depth, label)) & _states[depth + 1].valid;
+    return (B::edited(states) | B::matched(states, matching(depth, label))) &
+           _states[depth + 1].valid;
   }
 
-  /// The same for several code units that are read from the same states: what does not depend on
-  /// the code unit is worked out once.
-  class Fork {
-   public:
-    Fork(const BandedPattern& pattern, std::uint64_t states, std::size_t depth) noexcept
-        : _pattern(pattern),
-          _states(states),
-          _edited(B::edited(states)),
-          _valid(pattern.validAt(depth + 1)),
-          _depth(depth),
-          _other(B::closed(_edited) & _valid) {}
-
-    /// After a code unit that the query does not hold.
-    std::uint64_t other() const noexcept { return _other; }
-
-    std::uint64_t step(std::uint16_t label) const noexcept {
-      const std::uint64_t matched = _states & (_pattern.matching(_depth, label) * B::kStarts);
-      return matched == 0 ? _other : B::closed(matched | _edited) & _valid;
-    }
-
-   private:
-    const BandedPattern& _pattern;
-    std::uint64_t _states;
-    std::uint64_t _edited;
-    std::uint64_t _valid;
-    std::size_t _depth;
-    std::uint64_t _other;
-  };
+  /// The two parts of a step apart, for a place whose children share the first.
+  std::uint64_t stepByEdit(std::uint64_t states, std::size_t depth) const noexcept {
+    return B::edited(states) & _states[depth + 1].valid;
+  }
+  std::uint64_t stepByMatch(std::uint64_t states, std::size_t depth,
+                            std::uint16_t label) const noexcept {
+    return B::matched(states, matching(depth, label)) & _states[depth + 1].valid;
+  }
 
   /// The bits, in a tree's sets of children, of the labels that match from these states.
   std::uint64_t wantedChildren(std::uint64_t states, std::size_t depth) const noexcept {
@@ -235,14 +209,11 @@ class BandedPattern {
   }
 
   std::uint64_t matching(std::size_t depth, std::uint16_t label) const noexcept {
-    if (_hasTable && label < image::kRareBit) [[likely]] {
-      return (_table[label] >> depth) & B::kRow;
-    }
-    return matchingUnits(depth, label);
+    return _hasTable && label < image::kRareBit ? (_table[label] >> depth) & B::kRow
+                                                : compared(depth, label);
   }
 
-  [[gnu::noinline]] std::uint64_t matchingUnits(std::size_t depth,
-                                                std::uint16_t label) const noexcept {
+  std::uint64_t compared(std::size_t depth, std::uint16_t label) const noexcept {
     std::uint64_t bits = 0;
     for (unsigned c = 0; c < B::kColumns; ++c) {
       const std::size_t p = depth + c - K;
@@ -254,11 +225,7 @@ class BandedPattern {
   }
 
   std::span<const QueryUnit> _units;
-  // Most queries are short enough to need no memory of their own.
-  static constexpr std::size_t kFewDepths = 40;
-  AtDepth _fewStates[kFewDepths];
-  std::vector<AtDepth> _manyStates;
-  AtDepth* _states = _fewStates;
+  std::vector<AtDepth> _states;
   // For queries that fit: bit p + K of a label's row says that it is the query's code unit p.
   std::uint64_t _table[image::kRareBit] = {};
   bool _hasTable = false;

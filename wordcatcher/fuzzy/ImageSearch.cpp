@@ -1,10 +1,11 @@
 #include "wordcatcher/fuzzy/ImageSearch.h"
 
 #include <algorithm>
+#include <array>
 #include <bit>
 #include <iterator>
 #include <limits>
-#include <ranges>
+#include <span>
 #include <tuple>
 
 #include "wordcatcher/fuzzy/BandedAutomaton.h"
@@ -46,11 +47,16 @@ Query prepared(const SearchImage& image, std::u16string_view text) {
   return query;
 }
 
-/// What a walk may visit at the most: each place once. More means that the image is no tree.
+/// What a walk may visit at the most: each slot, each place of a word and each code unit of the
+/// words once. More means that the image is no tree, and would make the walk's time or memory grow
+/// faster than the image.
 class VisitBudget {
  public:
   explicit VisitBudget(const SearchImage& image, const SearchImage::Tree& tree)
-      : _image(image), _slots(tree.slots.size()), _places(image.wordCount()) {}
+      : _image(image),
+        _slots(tree.slots.size()),
+        _places(image.wordCount()),
+        _units(image.unitCount()) {}
 
   void spendSlot() {
     if (_slots-- == 0) {
@@ -63,56 +69,19 @@ class VisitBudget {
     }
     _places -= count;
   }
+  void spendUnits(std::uint64_t count) {
+    if (count > _units) {
+      _image.throwDamaged("a tree repeats words");
+    }
+    _units -= count;
+  }
 
  private:
   const SearchImage& _image;
   std::uint64_t _slots;
   std::uint64_t _places;
+  std::uint64_t _units;
 };
-
-std::uint32_t wordAt(const SearchImage::Tree& tree, std::uint64_t place) {
-  return tree.order.empty() ? static_cast<std::uint32_t>(place) : tree.order[place];
-}
-
-void checkSlot(const SearchImage& image, const SearchImage::Tree& tree, std::size_t slot) {
-  if (slot >= tree.slots.size()) {
-    image.throwDamaged("a tree leads out of its section");
-  }
-}
-
-/// Calls `visit(label, child)` for every child of a place whose bit is in `wanted`; the child for
-/// the end of a word has label 0.
-template <typename Visit>
-void forEachChild(const SearchImage& image, const SearchImage::Tree& tree, const TreeSlot& parent,
-                  std::uint64_t wanted, Visit visit) {
-  const std::uint64_t common = parent.children & ~(std::uint64_t{1} << image::kRareBit);
-  std::size_t child = parent.index();
-  if ((common & ~wanted) == 0) {
-    for (std::uint64_t bits = common; bits != 0; bits &= bits - 1, ++child) {
-      checkSlot(image, tree, child);
-      visit(static_cast<std::uint16_t>(std::countr_zero(bits)), child);
-    }
-  } else {
-    for (std::uint64_t bits = common & wanted; bits != 0; bits &= bits - 1) {
-      const std::uint64_t lower = (bits & -bits) - 1;
-      const std::size_t at = child + static_cast<unsigned>(std::popcount(common & lower));
-      checkSlot(image, tree, at);
-      visit(static_cast<std::uint16_t>(std::countr_zero(bits)), at);
-    }
-  }
-  if ((parent.children & wanted & ~common) == 0) {
-    return;
-  }
-  for (child = parent.index() + static_cast<unsigned>(std::popcount(common));; ++child) {
-    if (child >= tree.slots.size() || tree.slots[child].label < image::kRareBit) {
-      image.throwDamaged("a tree leads out of its section");
-    }
-    visit(tree.slots[child].label, child);
-    if (tree.slots[child].isLastChild()) {
-      return;
-    }
-  }
-}
 
 /// A walk of one tree in step with a query's automaton; collects the words that it accepts.
 template <unsigned K>
@@ -134,7 +103,7 @@ class BandedWalk {
     if constexpr (K > 0) {
       const std::uint64_t inserted =
           Band<K>::closed(std::uint64_t{1} << (Band<K>::kColumns + K - 1)) & _pattern.validAt(1);
-      forEachChild(_image, _tree, _tree.slots[0], ~(std::uint64_t{1} << image::kEndBit),
+      forEachChild(_tree.slots[0], ~(std::uint64_t{1} << image::kEndBit),
                    [&](std::uint16_t, std::size_t child) { enter(child, inserted, 1, accept); });
       finish(accept);
     }
@@ -165,26 +134,64 @@ class BandedWalk {
     readLeafWords(accept);
   }
 
+  std::uint32_t wordAt(std::uint64_t place) const {
+    return _tree.order.empty() ? static_cast<std::uint32_t>(place) : _tree.order[place];
+  }
+
+  /// Calls `visit(label, child)` for every child of a place whose bit is in `wanted`; the child for
+  /// the end of a word has label 0.
+  template <typename Visit>
+  void forEachChild(const TreeSlot& parent, std::uint64_t wanted, Visit visit) {
+    const std::uint64_t common = parent.children & ~(std::uint64_t{1} << image::kRareBit);
+    // Counting along costs less than counting the bits before each wanted one.
+    std::size_t child = parent.index();
+    for (std::uint64_t bits = common; (bits & wanted) != 0; bits &= bits - 1, ++child) {
+      const auto label = static_cast<unsigned>(std::countr_zero(bits));
+      if ((wanted >> label & 1U) == 0) {
+        continue;
+      }
+      if (child >= _tree.slots.size()) {
+        _image.throwDamaged("a tree leads out of its section");
+      }
+      _budget.spendSlot();
+      visit(static_cast<std::uint16_t>(label), child);
+    }
+    if ((parent.children & wanted & ~common) == 0) {
+      return;
+    }
+    for (child = parent.index() + static_cast<unsigned>(std::popcount(common));; ++child) {
+      if (child >= _tree.slots.size() || _tree.slots[child].label < image::kRareBit) {
+        _image.throwDamaged("a tree leads out of its section");
+      }
+      _budget.spendSlot();
+      visit(_tree.slots[child].label, child);
+      if (_tree.slots[child].isLastChild()) {
+        return;
+      }
+    }
+  }
+
   template <typename Accept>
   void expand(const TreeSlot& place, std::uint64_t states, std::size_t depth, Accept& accept) {
-    _budget.spendSlot();
     constexpr std::uint64_t kEnd = std::uint64_t{1} << image::kEndBit;
     // When only matches keep the automaton alive, no other child is looked at.
-    const typename BandedPattern<K>::Fork fork(_pattern, states, depth);
-    std::uint64_t wanted = fork.other() != 0 ? ~kEnd : _pattern.wantedChildren(states, depth);
+    const std::uint64_t byEdit = _pattern.stepByEdit(states, depth);
+    std::uint64_t wanted = byEdit != 0 ? ~kEnd : _pattern.wantedChildren(states, depth);
     if ((states & _pattern.acceptingAt(depth)) != 0) {
       wanted |= kEnd;
     }
     const auto ahead =
         static_cast<std::int64_t>(_pattern.length()) - static_cast<std::int64_t>(depth) - 1;
-    forEachChild(_image, _tree, place, wanted, [&](std::uint16_t label, std::size_t child) {
+    forEachChild(place, wanted, [&](std::uint16_t label, std::size_t child) {
       const TreeSlot& slot = _tree.slots[child];
       if (label == 0) {
         _budget.spendPlaces(slot.index(), 1);
-        accept(wordAt(_tree, slot.index()), states & _pattern.acceptingAt(depth));
+        const std::uint32_t word = wordAt(slot.index());
+        _budget.spendUnits(_image.labelsOf(word).size());
+        accept(word, states & _pattern.acceptingAt(depth));
         return;
       }
-      std::uint64_t next = fork.step(label);
+      std::uint64_t next = byEdit | _pattern.stepByMatch(states, depth, label);
       next &= Band<K>::kReach.notTooFarAhead[Band<K>::reachEntry(ahead - slot.shortest)];
       if (slot.longest < image::kLengthCap) {
         next &= Band<K>::kReach.notTooFarBehind[Band<K>::reachEntry(ahead - slot.longest)];
@@ -208,10 +215,10 @@ class BandedWalk {
     }
     _budget.spendPlaces(slot.index(), slot.children);
     for (std::uint64_t place = slot.index(); place < slot.index() + slot.children; ++place) {
-      if (!_tree.order.empty()) {
-        __builtin_prefetch(&_tree.order[place]);
-      } else {
+      if (_tree.order.empty()) {
         _image.prefetchOffsetOf(static_cast<std::uint32_t>(place));
+      } else {
+        __builtin_prefetch(&_tree.order[place]);
       }
       _leafWords[_leafWordCount++] = {static_cast<std::uint32_t>(place),
                                       static_cast<std::uint32_t>(depth), states};
@@ -224,11 +231,11 @@ class BandedWalk {
   /// What is needed of each word is asked of memory before the first is waited for.
   template <typename Accept>
   void readLeafWords(Accept& accept) {
-    const std::span<LeafWord> leafWords(_leafWords, _leafWordCount);
+    const std::span<LeafWord> leafWords(_leafWords.data(), _leafWordCount);
     _leafWordCount = 0;
     if (!_tree.order.empty()) {
       for (auto& leaf : leafWords) {
-        leaf.word = _tree.order[leaf.word];
+        leaf.word = wordAt(leaf.word);
         _image.prefetchOffsetOf(leaf.word);
       }
     }
@@ -243,8 +250,9 @@ class BandedWalk {
   }
 
   /// The accepting states after the rest of a word.
-  std::uint64_t readRest(std::uint32_t word, std::uint64_t states, std::size_t depth) const {
+  std::uint64_t readRest(std::uint32_t word, std::uint64_t states, std::size_t depth) {
     const auto labels = _image.labelsOf(word);
+    _budget.spendUnits(labels.size());
     for (; depth < labels.size() && states != 0; ++depth) {
       states = _pattern.step(states, depth,
                              _backward ? labels[labels.size() - 1 - depth] : labels[depth]);
@@ -258,7 +266,7 @@ class BandedWalk {
   const BandedPattern<K>& _pattern;
   VisitBudget _budget;
   std::vector<Item> _pending;
-  LeafWord _leafWords[kLeafWords];
+  std::array<LeafWord, kLeafWords> _leafWords;
   std::size_t _leafWordCount = 0;
 };
 
@@ -272,7 +280,8 @@ class HitList {
                      static_cast<std::uint32_t>(_image.postingsOf(word).size())});
   }
 
-  /// In order; a word that was found twice once.
+  /// In order; a word that was found twice once. All their values are at most all postings, so that
+  /// a caller may read them without a budget of its own.
   std::vector<WordHit> take() && {
     const auto key = [](const WordHit& hit) {
       return std::make_tuple(~hit.values, hit.distance, hit.length, hit.word);
@@ -280,6 +289,13 @@ class HitList {
     std::sort(_hits.begin(), _hits.end(),
               [&key](const WordHit& a, const WordHit& b) { return key(a) < key(b); });
     _hits.erase(std::unique(_hits.begin(), _hits.end()), _hits.end());
+    std::uint64_t values = 0;
+    for (const WordHit& hit : _hits) {
+      values += hit.values;
+    }
+    if (values > _image.postingCount()) {
+      _image.throwDamaged("posting lists overlap");
+    }
     return std::move(_hits);
   }
 
@@ -347,106 +363,107 @@ void searchBanded(const SearchImage& image, const Query& query, HitList& hits) {
   }
 }
 
-/// Any number of edits: one column of the table of edit distances for each code unit of the path.
-class ColumnWalk {
+/// Any number of edits: the words one after the other, by a table of edit distances with one column
+/// for each code unit of the word. Of a column only the rows near its depth are kept, since all
+/// others cost too much; of a word only the columns behind what it shares with the word before are
+/// made.
+class ColumnSearch {
  public:
-  ColumnWalk(const SearchImage& image, std::u16string_view query, std::int64_t maxDistance)
-      : _image(image), _query(query), _maxDistance(maxDistance), _budget(image, image.forward()) {
-    for (const char16_t unit : query) {
-      _units.push_back({.label = image.labelOf(unit), .any = unit == kAny});
-    }
-    _columns.emplace_back(query.size() + 1, kUnreachable);
-    _columns[0][0] = 0;
+  ColumnSearch(const SearchImage& image, const Query& query, std::int64_t maxDistance)
+      : _image(image),
+        _query(query),
+        _maxDistance(
+            std::min<std::uint64_t>(static_cast<std::uint64_t>(maxDistance), kUnreachable - 1)) {
+    const std::uint64_t rows = std::min<std::uint64_t>(query.units.size(), 2 * _maxDistance) + 1;
+    _kept = 1 + kKeptCells / rows;
+    _columns.resize(_kept + 2);
+    _columns[0].costs = {0};
   }
 
   void run(HitList& hits) {
-    _pending.push_back({0, 0, 0});
-    while (!_pending.empty()) {
-      const Item item = _pending.back();
-      _pending.pop_back();
-      const TreeSlot& slot = _image.forward().slots[item.slot];
-      if (item.depth > 0 && !read(item.label, item.depth)) {
-        continue;
-      }
-      if (item.depth > 0 && slot.isLeaf()) {
-        readLeaf(slot, item.depth, hits);
-      } else {
-        expand(slot, item.depth, hits);
+    for (std::uint32_t word = 0; word < _image.wordCount(); ++word) {
+      const auto labels = _image.labelsOf(word);
+      const std::size_t length = _query.units.size();
+      if (std::max(labels.size(), length) - std::min(labels.size(), length) <= _maxDistance &&
+          read(labels)) {
+        hits.add(word, columnAt(labels.size()).costAt(length));
       }
     }
   }
 
  private:
-  static constexpr std::int64_t kUnreachable = std::numeric_limits<std::int64_t>::max() / 2;
+  static constexpr std::uint32_t kUnreachable = std::numeric_limits<std::uint32_t>::max();
+  static constexpr std::size_t kKeptCells = 1U << 14U;
 
-  struct Item {
-    std::size_t slot;
-    std::size_t depth;
-    std::uint16_t label;
+  /// The costs of the query's first `first`, first + 1 ... code units.
+  struct Column {
+    std::uint64_t first = 0;
+    std::vector<std::uint32_t> costs;
+
+    std::uint32_t costAt(std::uint64_t row) const {
+      return row < first || row - first >= costs.size() ? kUnreachable : costs[row - first];
+    }
   };
 
-  /// Makes the column at `depth`; false when nothing in it is within the distance.
-  bool read(std::uint16_t label, std::size_t depth) {
-    if (_columns.size() <= depth) {
-      _columns.emplace_back(_query.size() + 1);
+  /// The columns up to a depth are kept for the next word, those beyond take turns.
+  Column& columnAt(std::size_t depth) {
+    return _columns[depth < _kept ? depth : _kept + depth % 2];
+  }
+
+  /// Reads a word; false when it is beyond the distance.
+  bool read(std::span<const std::uint16_t> labels) {
+    const auto parted = std::mismatch(labels.begin(), labels.end(), _last.begin(), _last.end());
+    const auto shared = static_cast<std::size_t>(parted.first - labels.begin());
+    if (shared == _last.size() && _lastIsBeyond) {
+      return false;
     }
-    const auto& before = _columns[depth - 1];
-    auto& column = _columns[depth];
-    column[0] = before[0] + 1;
-    std::int64_t least = column[0];
-    for (std::size_t i = 1; i < column.size(); ++i) {
-      const bool emptyMove = _query[i - 1] == kEmptyMove;
-      const bool equal = !emptyMove && _units[i - 1].matches(label);
-      column[i] = std::min(
-          {before[i - 1] + (equal ? 0 : 1), before[i] + 1, column[i - 1] + (emptyMove ? 0 : 1)});
-      least = std::min(least, column[i]);
+    std::size_t depth = std::min(shared, _kept - 1);
+    bool within = true;
+    while (depth < labels.size() && within) {
+      within = readOne(labels[depth], depth + 1);
+      ++depth;
+    }
+    _last = labels.first(depth);
+    _lastIsBeyond = !within;
+    return within && !labels.empty() &&
+           columnAt(labels.size()).costAt(_query.units.size()) <= _maxDistance;
+  }
+
+  /// Makes the column at `depth`; false when nothing in it is within the distance.
+  bool readOne(std::uint16_t label, std::size_t depth) {
+    const Column& before = columnAt(depth - 1);
+    Column& column = columnAt(depth);
+    column.costs.clear();
+    column.first = depth > _maxDistance ? depth - _maxDistance : 0;
+    const std::uint64_t last = std::min<std::uint64_t>(_query.units.size(), depth + _maxDistance);
+    const bool onlyInserted = depth == 1 && _query.beginsWithEmptyMove;
+    std::uint32_t least = kUnreachable;
+    std::uint32_t missing = kUnreachable;
+    for (std::uint64_t row = column.first; row <= last; ++row) {
+      std::uint32_t cost = std::min(oneMore(before.costAt(row)), missing);
+      if (row > 0 && !onlyInserted) {
+        const std::uint32_t read = before.costAt(row - 1);
+        cost = std::min(cost, _query.units[row - 1].matches(label) ? read : oneMore(read));
+      }
+      column.costs.push_back(cost);
+      least = std::min(least, cost);
+      missing = oneMore(cost);
     }
     return least <= _maxDistance;
   }
 
-  void expand(const TreeSlot& place, std::size_t depth, HitList& hits) {
-    _budget.spendSlot();
-    forEachChild(_image, _image.forward(), place, ~std::uint64_t{0},
-                 [&](std::uint16_t label, std::size_t child) {
-                   if (label != 0) {
-                     _pending.push_back({child, depth + 1, label});
-                     return;
-                   }
-                   const std::uint64_t at = _image.forward().slots[child].index();
-                   _budget.spendPlaces(at, 1);
-                   accept(wordAt(_image.forward(), at), depth, hits);
-                 });
-  }
-
-  void readLeaf(const TreeSlot& slot, std::size_t depth, HitList& hits) {
-    _budget.spendPlaces(slot.index(), slot.children);
-    for (std::uint64_t place = slot.index(); place < slot.index() + slot.children; ++place) {
-      const std::uint32_t word = wordAt(_image.forward(), place);
-      const auto labels = _image.labelsOf(word);
-      std::size_t read = depth;
-      while (read < labels.size() && this->read(labels[read], read + 1)) {
-        ++read;
-      }
-      if (read == labels.size()) {
-        accept(word, read, hits);
-      }
-    }
-  }
-
-  void accept(std::uint32_t word, std::size_t depth, HitList& hits) const {
-    const std::int64_t distance = _columns[depth].back();
-    if (depth > 0 && distance <= _maxDistance) {
-      hits.add(word, static_cast<std::uint32_t>(distance));
-    }
+  static std::uint32_t oneMore(std::uint32_t cost) {
+    return cost == kUnreachable ? cost : cost + 1;
   }
 
   const SearchImage& _image;
-  std::u16string_view _query;
-  std::int64_t _maxDistance;
-  VisitBudget _budget;
-  std::vector<QueryUnit> _units;
-  std::vector<std::vector<std::int64_t>> _columns;
-  std::vector<Item> _pending;
+  const Query& _query;
+  std::uint64_t _maxDistance;
+  std::size_t _kept = 0;
+  std::vector<Column> _columns;
+  // What the columns were made of: a word, or the head of one at which nothing was within reach.
+  std::span<const std::uint16_t> _last;
+  bool _lastIsBeyond = false;
 };
 
 }  // namespace
@@ -457,11 +474,11 @@ std::vector<WordHit> searchImage(const SearchImage& image, std::u16string_view q
   if (query.empty() || maxDistance < 0) {
     return {};
   }
+  const Query units = prepared(image, query);
   if (maxDistance > kMaxBandedDistance) {
-    ColumnWalk(image, query, maxDistance).run(hits);
+    ColumnSearch(image, units, maxDistance).run(hits);
     return std::move(hits).take();
   }
-  const Query units = prepared(image, query);
   switch (maxDistance) {
     case 0:
       searchBanded<0>(image, units, hits);

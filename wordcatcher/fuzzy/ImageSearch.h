@@ -24,10 +24,12 @@ struct WordHit {
 /// distance, then the shorter word, then by code units. That includes its ways with a missing first
 /// character, "*" and "_" (see LXFuzzyIndex::search_withMaxDistance).
 ///
-/// Up to 4 edits the automaton is simulated bit-parallel, on words of any length; beyond, by a
-/// table of edit distances. Visits each place of the image's trees at most once; memory is a few
-/// words a code unit of the query, and the hits. Safe for any number of threads. Throws Error
-/// (damaged) when the image turns out to be damaged.
+/// Up to 4 edits the automaton is simulated bit-parallel, on words of any length, in two walks of
+/// the trees at the most; a walk visits each place once at the most. Beyond, all words are read one
+/// after the other, by a table of edit distances. Memory is a few words a code unit of the query
+/// and, whatever the image's bytes are, less than a few times the image. Safe for any number of
+/// threads. Throws Error (damaged) when the image turns out to be damaged. There are at most
+/// wordCount() hits, with at most postingCount() values in all.
 std::vector<WordHit> searchImage(const SearchImage& image, std::u16string_view query,
                                  std::int64_t maxDistance);
 

@@ -40,10 +40,10 @@ using LevenshteinDFA = LXDFA<LXIntTupleSet>;
 /// half a surrogate pair has no UTF-8 form to store. The same holds for a string with an unpaired
 /// surrogate.
 ///
-/// Growth: the tables hold one record an adding call, so finishing them grows with the square of the
-/// number of words added. The first search after they were opened reads all records once and builds
-/// an image of them in memory, of about 60 bytes a distinct string beside the data; later searches
-/// use it. For many phrases, or for readers that open often, see IndexBuilder and Index.
+/// Growth: the tables hold one record an adding call, so finishing them grows with the square of
+/// the number of words added. The first search after they were opened reads all records once and
+/// builds an image of them in memory, of about 60 bytes a distinct string beside the data; later
+/// searches use it. For many phrases, or for readers that open often, see IndexBuilder and Index.
 ///
 /// Errors: the constructors throw std::runtime_error when ICU's data is not installed. A string of
 /// more than 2^31 - 1 code units is refused with std::length_error.

@@ -89,12 +89,13 @@ std::shared_ptr<const SearchImage> makeTableImage(const PLXDFA& automaton) {
       if (!text) {
         continue;
       }
-      const auto counted = countedWords(segmenter, phraseOf(*text));
+      const auto counted =
+          static_cast<std::uint32_t>(countedWords(segmenter, phraseOf(std::u16string_view(*text))));
       value = values.emplace(record->value, writer.addValue(record->value, counted)).first;
     }
     writer.addPosting(word->second, value->second);
   }
-  return SearchImage::fromBytes(std::move(writer).finish());
+  return SearchImage::fromBytes(writer.finish());
 }
 
 }  // namespace wordcatcher

@@ -13,6 +13,7 @@
 #include "wordcatcher/matcher/SpanQuery.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
 #include "wordcatcher/storage/SearchImage.h"
+#include "wordcatcher/text/PhraseLength.h"
 #include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher {
@@ -25,7 +26,6 @@ constexpr std::int32_t kReading = 1;
 constexpr std::int64_t kWordDistance = 2;
 constexpr std::int64_t kWholeTextDistance = 3;
 constexpr std::int64_t kIgnoredWordLength = 2;
-constexpr std::int64_t kUncountedWordLengthOfQueries = 3;
 
 constexpr std::int64_t kMaxSearchDistance = 16;
 
@@ -51,8 +51,8 @@ void checkTables(const std::string& prefix) {
     struct stat status = {};
     if (stat(table.c_str(), &status) != 0) {
       const ErrorCode code = errno == ENOENT ? ErrorCode::notFound : ErrorCode::notReadable;
-      throw Error(code, "There is no classic index at " + prefix + ": " + table + " cannot be read (" +
-                            std::generic_category().message(errno) + ").");
+      throw Error(code, "There is no classic index at " + prefix + ": " + table +
+                            " cannot be read (" + std::generic_category().message(errno) + ").");
     }
     if (!S_ISREG(status.st_mode) || status.st_size < kHeaderBytes) {
       throw Error(ErrorCode::notAnIndex, table + " is no finished table; index again.");
@@ -101,15 +101,15 @@ Index Index::open(const std::string& path, const Options& options, MatchingMode 
       throw Error(ErrorCode::notReadable,
                   "The classic index at " + prefix + " cannot be opened; the log says why.");
     }
-    return Index(std::make_shared<const State>(
-        State{tables.sharedImage(), mode, options, WordSegmenter()}));
+    return Index(
+        std::make_shared<const State>(State{tables.sharedImage(), mode, options, WordSegmenter()}));
   }
   auto image = SearchImage::open(
       path, options.load == Load::copy ? SearchImage::Load::copy : SearchImage::Load::map);
   const std::uint32_t stored = image->header().mode;
   if (stored > modeNumber(MatchingMode::phoneticWords)) {
-    throw Error(ErrorCode::notAnIndex,
-                "The search image " + path + " has a matching mode that this version does not know.");
+    throw Error(ErrorCode::notAnIndex, "The search image " + path +
+                                           " has a matching mode that this version does not know.");
   }
   return Index(std::make_shared<const State>(
       State{std::move(image), static_cast<MatchingMode>(stored), options, WordSegmenter()}));
@@ -149,8 +149,8 @@ Index::QueryResult Index::State::queryWords(std::u16string_view text,
   std::int64_t wordsMatched = 0;
   WordSegmenter words(segmenter);
   SpanQuery query(*image, words,
-                  {editDistance, kIgnoredWordLength, kUncountedWordLengthOfQueries,
-                   options.maxQueryWords, options.maxWordUnits},
+                  {editDistance, kIgnoredWordLength, kUncountedWordLength, options.maxQueryWords,
+                   options.maxWordUnits},
                   wordsMatched);
   const auto scored = query.run(text);
   QueryResult result;

@@ -35,8 +35,9 @@ using QueryResult = std::variant<std::vector<KXWordcatch>, std::vector<LXFuzzyMa
 /// and it finds nothing.
 ///
 /// Growth: the index holds one record an adding call, so that finishing it grows with the square of
-/// the number of words added; the first query after it was opened reads all of it (see LXFuzzyIndex).
-/// For many phrases, several threads or readers that open often, see IndexBuilder and Index.
+/// the number of words added; the first query after it was opened reads all of it (see
+/// LXFuzzyIndex). For many phrases, several threads or readers that open often, see IndexBuilder
+/// and Index.
 ///
 /// Errors of the environment: the constructor throws std::runtime_error when ICU's data is not
 /// installed; a text of more than 2^31 - 1 code units is refused with std::length_error.

@@ -8,15 +8,12 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
-#include <optional>
 #include <system_error>
 
 #define XXH_INLINE_ALL
 #include <xxhash.h>
 
 #include "wordcatcher/Error.h"
-#include "wordcatcher/text/CodeUnitOrder.h"
-#include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher {
 
@@ -74,7 +71,8 @@ std::vector<std::byte> readAll(int descriptor, std::size_t bytes, const std::str
 }  // namespace
 
 std::shared_ptr<const SearchImage> SearchImage::open(const std::string& path, Load load) {
-  const Descriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC));
+  // Without O_NONBLOCK a pipe would be waited for until somebody writes to it.
+  const Descriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
   struct stat status = {};
   if (file.number() < 0 || fstat(file.number(), &status) != 0) {
     throwUnreadable(path, errno);
@@ -119,21 +117,18 @@ SearchImage::~SearchImage() {
   }
 }
 
-std::span<const std::byte> SearchImage::sectionBytes(SectionKind kind) const {
-  for (const auto& section : _sections) {
-    if (section.kind == kind) {
-      return _bytes.subspan(section.offset, section.bytes);
-    }
-  }
-  throwDamaged("a section is missing");
-}
-
 template <typename Element>
 std::span<const Element> SearchImage::sectionOf(SectionKind kind) const {
-  const auto bytes = sectionBytes(kind);
-  if (bytes.size() % sizeof(Element) != 0) {
-    throwDamaged("a section has an odd length");
+  const auto section =
+      std::find_if(_sections.begin(), _sections.end(),
+                   [kind](const image::Section& candidate) { return candidate.kind == kind; });
+  if (section == _sections.end()) {
+    throwDamaged("a section is missing");
   }
+  if (section->elementBytes != sizeof(Element) || section->bytes % sizeof(Element) != 0) {
+    throwDamaged("a section has elements of another size");
+  }
+  const auto bytes = _bytes.subspan(section->offset, section->bytes);
   return {reinterpret_cast<const Element*>(bytes.data()), bytes.size() / sizeof(Element)};
 }
 
@@ -176,6 +171,9 @@ void SearchImage::bind(const std::string& name) {
   if (_header->wordCount > TreeSlot::kIndex || _header->valueCount > TreeSlot::kIndex) {
     throwDamaged("its counts are too large");
   }
+  if (_header->mode > image::kLastMode) {
+    throwDamaged("its mode is unknown");
+  }
   _wordCount = static_cast<std::uint32_t>(_header->wordCount);
   _valueCount = static_cast<std::uint32_t>(_header->valueCount);
 
@@ -193,9 +191,11 @@ void SearchImage::bind(const std::string& name) {
   _countedWords = sectionOf<std::uint32_t>(SectionKind::countedWords);
   const std::size_t words = _wordCount;
   const std::size_t values = _valueCount;
-  if (_labels.empty() || _wordOffsets.size() != words + 1 || _postingOffsets.size() != words + 1 ||
+  if (_labels.empty() || _labels.size() > image::kMaxLabels || _wordOffsets.size() != words + 1 ||
+      _postingOffsets.size() != words + 1 ||
       (!_forward.order.empty() && _forward.order.size() != words) ||
       _backward.order.size() != words || _forward.slots.empty() || _backward.slots.empty() ||
+      _forward.slots.size() > TreeSlot::kIndex || _backward.slots.size() > TreeSlot::kIndex ||
       _valueOffsets.size() != values + 1 || _countedWords.size() != values) {
     throwDamaged("its sections do not have the lengths that its counts ask for");
   }
@@ -254,146 +254,6 @@ std::uint32_t SearchImage::countedWordsOf(std::uint32_t value) const {
     throwDamaged("it refers to a data string that is not there");
   }
   return _countedWords[value];
-}
-
-void SearchImage::verify() const {
-  verifyChecksums();
-  verifyWords();
-  verifyTree(_forward, false);
-  verifyTree(_backward, true);
-  verifyValues();
-}
-
-void SearchImage::verifyChecksums() const {
-  for (const auto& section : _sections) {
-    if (XXH3_64bits(_bytes.data() + section.offset, section.bytes) != section.checksum) {
-      throwDamaged("section " + std::to_string(static_cast<unsigned>(section.kind)) +
-                   " does not have its checksum");
-    }
-  }
-}
-
-void SearchImage::verifyWords() const {
-  const auto ascending = [](std::span<const std::uint16_t> units) {
-    return std::adjacent_find(units.begin(), units.end(), std::greater_equal<>()) == units.end();
-  };
-  const std::size_t common = std::min<std::size_t>(_labels.size(), image::kRareBit);
-  if (!ascending(_labels.subspan(1, common - 1)) || !ascending(_labels.subspan(common))) {
-    throwDamaged("its labels are out of order");
-  }
-  if (_wordOffsets.front() != 0 || _wordOffsets.back() != _wordText.size() ||
-      _postingOffsets.front() != 0 || _postingOffsets.back() != _postings.size()) {
-    throwDamaged("its words do not fill their section");
-  }
-  std::u16string previous;
-  for (std::uint32_t word = 0; word < _wordCount; ++word) {
-    std::u16string text = textOf(word);
-    if (text <= previous) {
-      throwDamaged("its words are out of order");
-    }
-    previous = std::move(text);
-    const auto postings = postingsOf(word);
-    if (std::adjacent_find(postings.begin(), postings.end(), std::greater_equal<>()) !=
-            postings.end() ||
-        (!postings.empty() && postings.back() >= _valueCount)) {
-      throwDamaged("a posting list is out of order");
-    }
-  }
-}
-
-/// Walks a whole tree in the order of labels: the words must come one after the other, each behind
-/// the edges that spell it.
-void SearchImage::verifyTree(const Tree& tree, bool backward) const {
-  struct Item {
-    std::size_t slot;
-    std::size_t depth;
-  };
-  const auto wrong = [this] { throwDamaged("a tree does not spell the words"); };
-  std::vector<Item> pending = {{0, 0}};
-  std::vector<std::uint16_t> path;
-  std::size_t nextPlace = 0;
-  std::size_t seenSlots = 0;
-  while (!pending.empty()) {
-    const auto [index, depth] = pending.back();
-    pending.pop_back();
-    const TreeSlot& slot = tree.slots[index];
-    ++seenSlots;
-    const bool isEnd = index != 0 && slot.label == 0;
-    path.resize(depth == 0 ? 0 : depth - 1);
-    if (index != 0 && !isEnd) {
-      path.push_back(slot.label);
-    }
-    if (slot.isLeaf() && index != 0) {
-      if (slot.index() != nextPlace || slot.children == 0 ||
-          slot.children > _wordCount - nextPlace || (isEnd && slot.children != 1)) {
-        wrong();
-      }
-      std::size_t shortest = SIZE_MAX;
-      std::size_t longest = 0;
-      for (std::uint64_t i = 0; i < slot.children; ++i, ++nextPlace) {
-        const std::uint32_t word =
-            tree.order.empty() ? static_cast<std::uint32_t>(nextPlace) : tree.order[nextPlace];
-        const auto span = labelsOf(word);
-        std::vector<std::uint16_t> labels(span.begin(), span.end());
-        if (backward) {
-          std::reverse(labels.begin(), labels.end());
-        }
-        if (labels.size() < path.size() || (isEnd && labels.size() != path.size()) ||
-            !std::equal(path.begin(), path.end(), labels.begin())) {
-          wrong();
-        }
-        shortest = std::min(shortest, labels.size() - path.size());
-        longest = std::max(longest, labels.size() - path.size());
-      }
-      if (slot.shortest != std::min<std::size_t>(shortest, image::kLengthCap) ||
-          slot.longest != std::min<std::size_t>(longest, image::kLengthCap)) {
-        wrong();
-      }
-      continue;
-    }
-    if (isEnd) {
-      wrong();
-    }
-    // The children in reverse, so that the first is taken first.
-    const std::size_t first = slot.index();
-    std::size_t last = first;
-    std::uint64_t bits = 0;
-    if (slot.children != 0) {
-      for (;; ++last) {
-        if (last <= index || last >= tree.slots.size() ||
-            (last > first && tree.slots[last].label <= tree.slots[last - 1].label)) {
-          wrong();
-        }
-        bits |= std::uint64_t{1} << image::labelBit(tree.slots[last].label);
-        if (tree.slots[last].isLastChild()) {
-          break;
-        }
-      }
-      for (std::size_t child = last + 1; child-- > first;) {
-        pending.push_back({child, path.size() + 1});
-      }
-    }
-    if (bits != slot.children) {
-      wrong();
-    }
-  }
-  if (nextPlace != _wordCount || seenSlots != tree.slots.size()) {
-    wrong();
-  }
-}
-
-void SearchImage::verifyValues() const {
-  if (_valueOffsets.front() != 0 || _valueOffsets.back() != _valueText.size()) {
-    throwDamaged("its data strings do not fill their section");
-  }
-  std::optional<std::string_view> previous;
-  for (std::uint32_t value = 0; value < _valueCount; ++value) {
-    const std::string_view text = valueText(value);
-    if (!fromUtf8(text) || (previous && !utf16Less(*previous, text))) {
-      throwDamaged("its data strings are out of order or not UTF-8");
-    }
-    previous = text;
-  }
 }
 
 }  // namespace wordcatcher

@@ -37,6 +37,8 @@ class SearchImage {
   const image::Header& header() const noexcept { return *_header; }
   std::uint32_t wordCount() const noexcept { return _wordCount; }
   std::uint32_t valueCount() const noexcept { return _valueCount; }
+  std::uint64_t unitCount() const noexcept { return _wordText.size(); }  // of all words
+  std::uint64_t postingCount() const noexcept { return _postings.size(); }
 
   /// The label of a code unit; 0 when no word holds it. Logarithmic in the number of labels.
   std::uint16_t labelOf(char16_t unit) const noexcept;
@@ -53,6 +55,7 @@ class SearchImage {
     }
     return _wordText.subspan(begin, end - begin);
   }
+
   /// Ask memory early for what labelsOf() will read: first the offset, some time later the labels.
   /// Any word may be given.
   void prefetchOffsetOf(std::uint32_t word) const noexcept {
@@ -84,8 +87,9 @@ class SearchImage {
   std::string_view valueText(std::uint32_t value) const;
   std::uint32_t countedWordsOf(std::uint32_t value) const;
 
-  /// Checks everything: checksums, orders, ranges, that both trees hold exactly the words. Throws
-  /// Error (damaged) that names the section. Linear in the file.
+  /// Checks everything: that the sections fill the file, checksums, orders, ranges, that both trees
+  /// hold exactly the words. Throws Error (damaged) that says what is wrong. Linear in the file,
+  /// whatever its bytes are.
   void verify() const;
 
   /// Throws the Error (damaged) of a reader that met something impossible in this image.
@@ -97,12 +101,11 @@ class SearchImage {
  private:
   SearchImage() = default;
   void bind(const std::string& name);
-  std::span<const std::byte> sectionBytes(image::SectionKind kind) const;
   template <typename Element>
   std::span<const Element> sectionOf(image::SectionKind kind) const;
-  void verifyChecksums() const;
+  void verifySections() const;
+  void verifyLabels() const;
   void verifyWords() const;
-  void verifyTree(const Tree& tree, bool backward) const;
   void verifyValues() const;
 
   std::vector<std::byte> _copy;

@@ -34,6 +34,8 @@ enum class SectionKind : std::uint32_t {
   countedWords = 12,   // u32: the counted words of each value's phrase
 };
 inline constexpr std::size_t kSectionKinds = 12;
+inline constexpr std::uint32_t kLastMode = 2;
+inline constexpr std::size_t kMaxLabels = 0x10000;  // label 0, and every code unit but U+0000
 
 struct Header {
   std::array<char, 8> magic;

@@ -5,7 +5,7 @@
 #include <limits>
 #include <numeric>
 #include <random>
-#include <span>
+#include <string>
 
 #define XXH_INLINE_ALL
 #include <xxhash.h>
@@ -25,25 +25,71 @@ using image::TreeSlot;
 // a slot, so beyond a few the walk gets slower.
 constexpr std::uint32_t kWordsALeaf = 4;
 
+// Word offsets have 32 bits.
+constexpr std::uint64_t kMaxWordUnits = std::numeric_limits<std::uint32_t>::max();
+
 [[noreturn]] void tooMany(const char* what) {
-  throw Error(ErrorCode::tooLarge, std::string("An index holds at most 1,073,741,823 ") + what +
-                                       "; split it in several.");
+  throw Error(ErrorCode::tooLarge,
+              std::string("This index has too many ") + what + "; split it in several.");
 }
+
+/// The numbers from 0 in the order of `before`. Comparing strings by number jumps about in memory,
+/// so the numbers are sorted by keys, made of the strings' beginnings, and only equal keys by
+/// `before`.
+template <typename KeyOf, typename Before>
+std::vector<std::uint32_t> sortedOrder(std::uint32_t count, KeyOf keyOf, Before before) {
+  struct Entry {
+    std::uint64_t key;
+    std::uint32_t number;
+  };
+  std::vector<Entry> entries;
+  entries.reserve(count);
+  for (std::uint32_t number = 0; number < count; ++number) {
+    entries.push_back({keyOf(number), number});
+  }
+  std::sort(entries.begin(), entries.end(), [&before](const Entry& a, const Entry& b) {
+    return a.key != b.key ? a.key < b.key : before(a.number, b.number);
+  });
+  std::vector<std::uint32_t> order;
+  order.reserve(count);
+  for (const Entry& entry : entries) {
+    order.push_back(entry.number);
+  }
+  return order;
+}
+
+std::vector<std::uint32_t> placesOf(const std::vector<std::uint32_t>& order) {
+  std::vector<std::uint32_t> places(order.size());
+  for (std::uint32_t place = 0; place < order.size(); ++place) {
+    places[order[place]] = place;
+  }
+  return places;
+}
+
+/// The first 64 bits of a sequence of `Bits` wide elements, the first one highest. Nothing is
+/// counted as zeros, so that a sequence comes before those that it begins.
+template <unsigned Bits, typename Iterator, typename ValueOf>
+std::uint64_t sortingKey(Iterator begin, Iterator end, ValueOf valueOf) {
+  std::uint64_t key = 0;
+  for (unsigned shift = 64; shift > 0 && begin != end; ++begin) {
+    shift -= Bits;
+    key |= std::uint64_t{valueOf(*begin)} << shift;
+  }
+  return key;
+}
+
+std::uint16_t unitOf(std::uint16_t unit) { return unit; }
 
 /// Words as sequences of labels, in one list.
 class LabelledWords {
  public:
-  LabelledWords(const std::vector<const std::u16string*>& words,
+  LabelledWords(const SearchImageWriter::Content& content,
                 const std::vector<std::uint16_t>& labelOfUnit) {
+    _offsets.reserve(std::size_t{content.wordCount()} + 1);
     _offsets.push_back(0);
-    for (const auto* word : words) {
-      for (const char16_t unit : *word) {
+    for (std::uint32_t word = 0; word < content.wordCount(); ++word) {
+      for (const char16_t unit : content.word(word)) {
         _labels.push_back(labelOfUnit[unit]);
-      }
-      if (_labels.size() > std::numeric_limits<std::uint32_t>::max()) {
-        throw Error(ErrorCode::tooLarge,
-                    "The distinct words of an index have at most 4,294,967,295 code units in all; "
-                    "split it in several.");
       }
       _offsets.push_back(static_cast<std::uint32_t>(_labels.size()));
     }
@@ -65,9 +111,12 @@ class LabelledWords {
 class TreeBuilder {
  public:
   TreeBuilder(const LabelledWords& words, bool backward) : _words(words), _backward(backward) {
-    _order.resize(words.size());
-    std::iota(_order.begin(), _order.end(), 0U);
-    std::sort(_order.begin(), _order.end(), [this](std::uint32_t a, std::uint32_t b) {
+    const auto key = [this](std::uint32_t number) {
+      const auto word = _words[number];
+      return _backward ? sortingKey<16>(word.rbegin(), word.rend(), unitOf)
+                       : sortingKey<16>(word.begin(), word.end(), unitOf);
+    };
+    _order = sortedOrder(words.size(), key, [this](std::uint32_t a, std::uint32_t b) {
       const auto left = _words[a];
       const auto right = _words[b];
       return _backward ? std::lexicographical_compare(left.rbegin(), left.rend(), right.rbegin(),
@@ -167,10 +216,10 @@ class TreeBuilder {
 /// The code units of all words, by label: the most frequent ones have a bit of their own in the
 /// trees. Each of the two groups ascends by code units; when all units fit into the first, the
 /// order of labels is the order of code units.
-std::vector<std::uint16_t> chooseLabels(const std::vector<const std::u16string*>& words) {
+std::vector<std::uint16_t> chooseLabels(const SearchImageWriter::Content& content) {
   std::vector<std::uint64_t> frequency(0x10000);
-  for (const auto* word : words) {
-    for (const char16_t unit : *word) {
+  for (std::uint32_t word = 0; word < content.wordCount(); ++word) {
+    for (const char16_t unit : content.word(word)) {
       ++frequency[unit];
     }
   }
@@ -194,7 +243,12 @@ std::vector<std::uint16_t> chooseLabels(const std::vector<const std::u16string*>
 /// Lays sections one after the other into an image.
 class Assembler {
  public:
-  Assembler() : _bytes(image::headerBytes(image::kSectionKinds)) {}
+  /// `expected`: the bytes of all sections, for which room is made at once.
+  explicit Assembler(std::size_t expected) {
+    const std::size_t header = image::headerBytes(image::kSectionKinds);
+    _bytes.reserve(header + expected + image::kSectionKinds * image::kSectionAlignment);
+    _bytes.resize(header);
+  }
 
   template <typename Element>
   void add(SectionKind kind, const std::vector<Element>& elements) {
@@ -244,23 +298,6 @@ std::array<std::uint64_t, 2> randomGeneration() {
   return {word(), word()};
 }
 
-/// For each element, its place when they are sorted by `before`.
-template <typename Before>
-std::vector<std::uint32_t> sortedOrder(std::size_t count, Before before) {
-  std::vector<std::uint32_t> order(count);
-  std::iota(order.begin(), order.end(), 0U);
-  std::sort(order.begin(), order.end(), before);
-  return order;
-}
-
-std::vector<std::uint32_t> placesOf(const std::vector<std::uint32_t>& order) {
-  std::vector<std::uint32_t> places(order.size());
-  for (std::uint32_t place = 0; place < order.size(); ++place) {
-    places[order[place]] = place;
-  }
-  return places;
-}
-
 bool isIdentity(const std::vector<std::uint32_t>& order) {
   for (std::uint32_t place = 0; place < order.size(); ++place) {
     if (order[place] != place) {
@@ -272,41 +309,30 @@ bool isIdentity(const std::vector<std::uint32_t>& order) {
 
 }  // namespace
 
-std::string_view SearchImageWriter::valueText(Value value) const noexcept {
-  const std::uint64_t begin = value == 0 ? 0 : _valueEnds[value - 1];
-  return std::string_view(_valueText).substr(begin, _valueEnds[value] - begin);
-}
-
 SearchImageWriter::Value SearchImageWriter::addValue(std::string_view text,
                                                      std::uint32_t countedWords) {
-  const std::uint64_t hash = XXH3_64bits(text.data(), text.size());
-  const auto [first, last] = _valuesByHash.equal_range(hash);
-  for (auto known = first; known != last; ++known) {
-    if (valueText(known->second) == text) {
-      return known->second;
+  // Room first, so that a value never lacks its count.
+  if (_countedWords.size() == _countedWords.capacity()) {
+    _countedWords.reserve(_countedWords.size() * 2 + 1);
+  }
+  const auto [value, added] = _values.insert(text);
+  if (added) {
+    _countedWords.push_back(countedWords);
+    if (value >= _limit) {
+      rollBack({_words.size(), value, _postings.size(), _phrases});
+      tooMany("data strings");
     }
   }
-  if (_valueEnds.size() >= TreeSlot::kIndex) {
-    tooMany("data strings");
-  }
-  const auto value = static_cast<Value>(_valueEnds.size());
-  _valueText.append(text);
-  _valueEnds.push_back(_valueText.size());
-  _countedWords.push_back(countedWords);
-  _valuesByHash.emplace(hash, value);
   return value;
 }
 
 std::uint32_t SearchImageWriter::wordId(std::u16string_view word) {
-  const auto [entry, added] =
-      _wordIds.try_emplace(std::u16string(word), static_cast<std::uint32_t>(_words.size()));
-  if (added) {
-    if (_words.size() >= TreeSlot::kIndex) {
-      tooMany("distinct words");
-    }
-    _words.push_back(&entry->first);
+  const auto [id, added] = _words.insert(word);
+  if (added && (id >= _limit || _words.characters() > kMaxWordUnits)) {
+    _words.truncate(id);
+    tooMany("distinct words");
   }
-  return entry->second;
+  return id;
 }
 
 void SearchImageWriter::addWord(std::u16string_view word) { wordId(word); }
@@ -315,69 +341,100 @@ void SearchImageWriter::addPosting(std::u16string_view word, Value value) {
   _postings.emplace_back(wordId(word), value);
 }
 
-std::vector<std::byte> SearchImageWriter::finish() && {
-  const auto valueOrder = sortedOrder(_valueEnds.size(), [this](Value a, Value b) {
-    return utf16Less(valueText(a), valueText(b));
-  });
-  const auto wordOrder = sortedOrder(
-      _words.size(), [this](std::uint32_t a, std::uint32_t b) { return *_words[a] < *_words[b]; });
-  const auto placeOfValue = placesOf(valueOrder);
-  const auto placeOfWord = placesOf(wordOrder);
-  for (auto& [word, value] : _postings) {
-    word = placeOfWord[word];
-    value = placeOfValue[value];
-  }
-  std::sort(_postings.begin(), _postings.end());
-  _postings.erase(std::unique(_postings.begin(), _postings.end()), _postings.end());
+void SearchImageWriter::rollBack(const Mark& mark) noexcept {
+  _words.truncate(mark.words);
+  _values.truncate(mark.values);
+  _countedWords.resize(mark.values);
+  _postings.resize(mark.postings);
+  _phrases = mark.phrases;
+}
 
-  std::vector<const std::u16string*> words;
-  words.reserve(_words.size());
-  for (const std::uint32_t word : wordOrder) {
-    words.push_back(_words[word]);
+SearchImageWriter::Content SearchImageWriter::content() const { return Content(*this); }
+
+SearchImageWriter::Content::Content(const SearchImageWriter& writer) : _writer(writer) {
+  const auto& words = writer._words;
+  _words = sortedOrder(
+      words.size(),
+      [&words](std::uint32_t word) {
+        return sortingKey<16>(words[word].begin(), words[word].end(), unitOf);
+      },
+      [&words](std::uint32_t a, std::uint32_t b) { return words[a] < words[b]; });
+  const auto& values = writer._values;
+  _values = sortedOrder(
+      values.size(),
+      [&values](Value value) {
+        return sortingKey<8>(values[value].begin(), values[value].end(), utf16Rank);
+      },
+      [&values](Value a, Value b) { return utf16Less(values[a], values[b]); });
+  gatherPostings();
+}
+
+/// Deals the postings out to their words, sorts each word's, and closes the gaps that repeated ones
+/// leave.
+void SearchImageWriter::Content::gatherPostings() {
+  const auto placeOfWord = placesOf(_words);
+  const auto placeOfValue = placesOf(_values);
+  _offsets.resize(_words.size() + 1);
+  for (const auto& [word, value] : _writer._postings) {
+    ++_offsets[placeOfWord[word] + 1];
   }
-  const auto labels = chooseLabels(words);
+  std::partial_sum(_offsets.begin(), _offsets.end(), _offsets.begin());
+  _postings.resize(_writer._postings.size());
+  std::vector<std::uint64_t> next(_offsets.begin(), _offsets.end() - 1);
+  for (const auto& [word, value] : _writer._postings) {
+    _postings[next[placeOfWord[word]]++] = placeOfValue[value];
+  }
+  auto kept = _postings.begin();
+  for (std::size_t word = 0; word < _words.size(); ++word) {
+    const auto begin = _postings.begin() + static_cast<std::ptrdiff_t>(_offsets[word]);
+    const auto end = _postings.begin() + static_cast<std::ptrdiff_t>(_offsets[word + 1]);
+    std::sort(begin, end);
+    _offsets[word] = static_cast<std::uint64_t>(kept - _postings.begin());
+    const auto last = std::unique(begin, end);
+    kept = kept == begin ? last : std::copy(begin, last, kept);
+  }
+  _offsets.back() = static_cast<std::uint64_t>(kept - _postings.begin());
+  _postings.erase(kept, _postings.end());
+}
+
+std::vector<std::byte> SearchImageWriter::finish() const {
+  const Content content(*this);
+  const auto labels = chooseLabels(content);
   std::vector<std::uint16_t> labelOfUnit(0x10000);
   for (std::size_t label = 1; label < labels.size(); ++label) {
     labelOfUnit[labels[label]] = static_cast<std::uint16_t>(label);
   }
-
-  Assembler assembler;
-  assembler.add(SectionKind::labels, labels);
-  const LabelledWords labelled(words, labelOfUnit);
-  assembler.add(SectionKind::wordOffsets, labelled.offsets());
-  assembler.add(SectionKind::wordText, labelled.labels());
-  {
-    const TreeBuilder forward(labelled, false);
-    assembler.add(SectionKind::forwardTree, forward.slots());
-    assembler.add(SectionKind::forwardOrder,
-                  isIdentity(forward.order()) ? std::vector<std::uint32_t>() : forward.order());
-  }
-  {
-    const TreeBuilder backward(labelled, true);
-    assembler.add(SectionKind::backwardTree, backward.slots());
-    assembler.add(SectionKind::backwardOrder, backward.order());
-  }
-
-  std::vector<std::uint64_t> postingOffsets(_words.size() + 1);
-  std::vector<std::uint32_t> postings;
-  postings.reserve(_postings.size());
-  for (const auto& [word, value] : _postings) {
-    ++postingOffsets[word + 1];
-    postings.push_back(value);
-  }
-  std::partial_sum(postingOffsets.begin(), postingOffsets.end(), postingOffsets.begin());
-  assembler.add(SectionKind::postingOffsets, postingOffsets);
-  assembler.add(SectionKind::postings, postings);
+  const LabelledWords labelled(content, labelOfUnit);
+  const TreeBuilder forward(labelled, false);
+  const TreeBuilder backward(labelled, true);
 
   std::vector<std::uint64_t> valueOffsets = {0};
   std::string valueTexts;
   std::vector<std::uint32_t> countedWords;
-  valueTexts.reserve(_valueText.size());
-  for (const Value value : valueOrder) {
-    valueTexts += valueText(value);
+  valueTexts.reserve(_values.characters());
+  for (Value value = 0; value < content.valueCount(); ++value) {
+    valueTexts += content.value(value);
     valueOffsets.push_back(valueTexts.size());
-    countedWords.push_back(_countedWords[value]);
+    countedWords.push_back(content.countedWords(value));
   }
+
+  Assembler assembler(sizeof(std::uint16_t) * (labels.size() + labelled.labels().size()) +
+                      sizeof(TreeSlot) * (forward.slots().size() + backward.slots().size()) +
+                      sizeof(std::uint32_t) * (labelled.offsets().size() + 2U * wordCount() +
+                                               content.postings().size() + countedWords.size()) +
+                      sizeof(std::uint64_t) *
+                          (content.postingOffsets().size() + valueOffsets.size()) +
+                      valueTexts.size());
+  assembler.add(SectionKind::labels, labels);
+  assembler.add(SectionKind::wordOffsets, labelled.offsets());
+  assembler.add(SectionKind::wordText, labelled.labels());
+  assembler.add(SectionKind::forwardTree, forward.slots());
+  assembler.add(SectionKind::forwardOrder,
+                isIdentity(forward.order()) ? std::vector<std::uint32_t>() : forward.order());
+  assembler.add(SectionKind::backwardTree, backward.slots());
+  assembler.add(SectionKind::backwardOrder, backward.order());
+  assembler.add(SectionKind::postingOffsets, content.postingOffsets());
+  assembler.add(SectionKind::postings, content.postings());
   assembler.add(SectionKind::valueOffsets, valueOffsets);
   assembler.add(SectionKind::valueText, valueTexts);
   assembler.add(SectionKind::countedWords, countedWords);
@@ -385,8 +442,8 @@ std::vector<std::byte> SearchImageWriter::finish() && {
   image::Header header = {};
   header.generation = randomGeneration();
   header.mode = _mode;
-  header.wordCount = _words.size();
-  header.valueCount = _valueEnds.size();
+  header.wordCount = wordCount();
+  header.valueCount = valueCount();
   header.phraseCount = _phrases;
   return std::move(assembler).finish(header);
 }

@@ -19,8 +19,8 @@ std::optional<std::string> toUtf8(std::u16string_view text);
 /// The string that these bytes are the UTF-8 form of, or nothing if they are not well-formed.
 std::optional<std::u16string> fromUtf8(std::string_view bytes);
 
-/// The string of these bytes as far as they are well-formed; each ill-formed sequence is one U+FFFD,
-/// which is no part of a word. Throws std::length_error beyond 2^31 - 1 bytes.
+/// The string of these bytes as far as they are well-formed; each ill-formed sequence is one
+/// U+FFFD, which is no part of a word. Throws std::length_error beyond 2^31 - 1 bytes.
 std::u16string decodeUtf8(std::string_view bytes);
 
 /// UTF-8 for people to read: unpaired surrogates appear as U+FFFD; cut off beyond 2^31 - 1 bytes.
