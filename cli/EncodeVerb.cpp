@@ -50,12 +50,14 @@ std::vector<std::string> codesOf(const std::u16string& translation) {
 ExitCode runEncode(const Arguments& arguments) {
   const Questions questions(arguments.texts, false);
   KXMetaphone encoder;
-  return questions.answerEach([&](const InputLine& question, Output& output) {
+  questions.answerEach([&](const InputLine& question, Output& output) {
     const auto codes = codesOf(encoder.translate(question.text));
     output.write(arguments.json ? Json{{"text", question.utf8}, {"codes", codes}}.dump() + '\n'
                                 : CLI::detail::join(codes, " ") + '\n');
     return true;
   });
+  // Nothing is looked for, so that no text, and a text without codes, is no miss.
+  return kMatched;
 }
 
 }  // namespace

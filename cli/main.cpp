@@ -22,8 +22,8 @@ constexpr const char* kSummary =
     "Finds stored phrases in free text, tolerating spelling mistakes.\n";
 
 constexpr const char* kFooter = R"(
-Exit codes: 0 matches were found (or the index was written), 1 nothing matched,
-2 wrong usage or a failure.
+Exit codes: 0 matches were found (or the index was written, or codes were printed),
+1 nothing matched, 2 wrong usage or a failure.
 
 Examples:
   printf 'golden retriever\ngolden gate bridge\n' | wordcatcher index dogs

@@ -1,9 +1,11 @@
-// Encodes any code units: nothing throws, and the codes are letters of the code alone, at most two
-// for each letter of the upper-cased text and three spaces for each word.
+// Encodes any code units: nothing throws, the codes are letters of the code and spaces, no more of
+// either than their words allow, and the same text has the same codes again.
+//
+// The first two bytes are a length, little-endian; the rest is a text of UTF-16. A length of 65,280
+// and more puts the first four code units of the text, repeated to that length, before the others:
+// so words come to the lengths that are counted modulo 65,536. A smaller length changes nothing.
 
-#include <unicode/ubrk.h>
-#include <unicode/ustring.h>
-
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <cstdlib>
@@ -11,9 +13,14 @@
 #include <string>
 #include <string_view>
 
+#include "CodeBounds.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
 
 namespace {
+
+constexpr std::size_t kHeaderBytes = 2;
+constexpr std::size_t kPieceLength = 4;
+constexpr std::size_t kShortestRepetition = 0xFF00;
 
 void require(bool holds) {
   if (!holds) {
@@ -21,43 +28,43 @@ void require(bool holds) {
   }
 }
 
-std::size_t upperCasedLength(std::u16string_view word) {
-  UErrorCode preflight = U_ZERO_ERROR;
-  return static_cast<std::size_t>(u_strToUpper(
-      nullptr, 0, word.data(), static_cast<std::int32_t>(word.size()), "", &preflight));
+std::u16string repeated(std::u16string_view piece, std::size_t length) {
+  std::u16string text;
+  text.reserve(length + piece.size());
+  while (text.size() < length) {
+    text += piece;
+  }
+  text.resize(length);
+  return text;
 }
 
-/// The most code units that the codes of the text can have.
-std::size_t longestCodes(std::u16string_view text) {
-  UErrorCode status = U_ZERO_ERROR;
-  static UBreakIterator* const words = ubrk_open(UBRK_WORD, "", nullptr, 0, &status);
-  ubrk_setText(words, text.data(), static_cast<std::int32_t>(text.size()), &status);
-  require(U_SUCCESS(status));
-  std::size_t most = 0;
-  std::int32_t begin = 0;
-  for (std::int32_t end = ubrk_next(words); end != UBRK_DONE; end = ubrk_next(words)) {
-    if (ubrk_getRuleStatus(words) >= UBRK_WORD_NONE_LIMIT) {
-      most += 2 * upperCasedLength(text.substr(static_cast<std::size_t>(begin),
-                                               static_cast<std::size_t>(end - begin))) +
-              3;
-    }
-    begin = end;
+std::u16string textOf(const std::uint8_t* data, std::size_t size) {
+  if (size < kHeaderBytes + sizeof(char16_t)) {
+    return {};
   }
-  return most;
+  const std::size_t length = data[0] + std::size_t{data[1]} * 256;
+  std::u16string text((size - kHeaderBytes) / sizeof(char16_t), u'\0');
+  std::memcpy(text.data(), data + kHeaderBytes, text.size() * sizeof(char16_t));
+  if (length < kShortestRepetition) {
+    return text;
+  }
+  const std::size_t pieceLength = std::min(text.size(), kPieceLength);
+  return repeated(text.substr(0, pieceLength), length) + text.substr(pieceLength);
 }
 
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
+  using wordcatcher::testing::within;
   static wordcatcher::KXMetaphone encoder;
-  std::u16string text(size / sizeof(char16_t), u'\0');
-  if (!text.empty()) {
-    std::memcpy(text.data(), data, text.size() * sizeof(char16_t));
-  }
+  const std::u16string text = textOf(data, size);
+
   const std::u16string codes = encoder.translate(text);
-  require(codes.find_first_not_of(u"AFHJKLMNPRSTX0 ") == codes.npos);
-  require(codes.size() <= longestCodes(text));
+  require(within(wordcatcher::testing::boundsOfText(text), codes));
   require(encoder.translate(text) == codes);
-  require(encoder._translateWord(text) == encoder._translateWord(text));
+
+  const std::u16string code = encoder._translateWord(text);
+  require(within(wordcatcher::testing::boundsOfWord(text), code));
+  require(encoder._translateWord(text) == code);
   return 0;
 }

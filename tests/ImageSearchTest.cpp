@@ -7,6 +7,7 @@
 #include <rapidcheck/gtest.h>
 
 #include <algorithm>
+#include <limits>
 #include <map>
 #include <set>
 #include <string>
@@ -110,6 +111,31 @@ TEST(ImageSearchTest, EveryWordOfASmallWorldAtEveryDistance) {
 
 TEST(ImageSearchTest, EveryQueryOfLettersStarsAndUnderscores) {
   compareAll(entriesOf(wordsUpTo(4, u"ab_*")), wordsUpTo(5, u"ab_*"), 3, 500000);
+}
+
+TEST(ImageSearchTest, ManyEditsOfLettersStarsAndUnderscores) {
+  // Beyond four edits the search is another.
+  compareAll(entriesOf(wordsUpTo(5, u"a_")), wordsUpTo(6, u"a_*"), 7, 200000);
+}
+
+TEST(ImageSearchTest, ManyEditsOfLongWords) {
+  // Longer than the columns that are kept from word to word, the words alike beyond that length;
+  // distances around the greatest that fit into 32 bits, and up to the greatest of all.
+  Entries entries;
+  const std::u16string head(1600, u'a');
+  for (const std::u16string_view tail : {u"", u"b", u"bb", u"bbcc", u"bcb", u"cbbbbbbb"}) {
+    entries[head + std::u16string(tail)] = 1;
+    entries[u"b" + head + std::u16string(tail)] = 2;
+  }
+  const auto image = imageOf(entries);
+  for (const std::size_t length : {1U, 1598U}) {
+    const std::u16string query = std::u16string(length, u'a') + u"bbc";
+    for (const std::int64_t k :
+         {std::int64_t{5}, std::int64_t{11}, std::int64_t{1700}, std::int64_t{0xFFFFFFFF},
+          std::numeric_limits<std::int64_t>::max()}) {
+      ASSERT_EQ(actual(*image, query, k), expected(entries, query, k)) << length << " at " << k;
+    }
+  }
 }
 
 TEST(ImageSearchTest, EveryIndexOfAFewWords) {

@@ -2,12 +2,13 @@
 
 #include <gtest/gtest.h>
 #include <rapidcheck/gtest.h>
-#include <unicode/ubrk.h>
-#include <unicode/ustring.h>
+#include <sys/mman.h>
 
-#include <memory>
+#include <stdexcept>
 #include <string>
 #include <vector>
+
+#include "CodeBounds.h"
 
 namespace wordcatcher {
 namespace {
@@ -184,39 +185,57 @@ TEST(KXMetaphoneTest, AskingAboutTheWholeWordStaysLinear) {
   EXPECT_EQ(translate(repeated(u"GN", 65532)).size(), 1 + 32766 + 1 + 1);
 }
 
-struct CloseWords {
-  void operator()(UBreakIterator* words) const { ubrk_close(words); }
+/// A text of U+0000 that takes address space and, being read at most, no memory.
+class EndlessText {
+ public:
+  explicit EndlessText(std::size_t length)
+      : _bytes(length * sizeof(char16_t)),
+        _memory(
+            mmap(nullptr, _bytes, PROT_READ, MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0)) {}
+  ~EndlessText() { munmap(_memory, _bytes); }
+  EndlessText(const EndlessText&) = delete;
+  EndlessText& operator=(const EndlessText&) = delete;
+
+  bool exists() const { return _memory != MAP_FAILED; }
+  std::u16string_view text() const {
+    return {static_cast<const char16_t*>(_memory), _bytes / sizeof(char16_t)};
+  }
+
+ private:
+  std::size_t _bytes;
+  void* _memory;
 };
 
-/// Code units of each word of the text once it is upper-cased.
-std::vector<std::size_t> upperCasedLengths(const std::u16string& text) {
-  std::vector<std::size_t> lengths;
-  UErrorCode status = U_ZERO_ERROR;
-  const std::unique_ptr<UBreakIterator, CloseWords> words(
-      ubrk_open(UBRK_WORD, "", text.data(), static_cast<std::int32_t>(text.size()), &status));
-  std::int32_t begin = 0;
-  for (std::int32_t end = ubrk_next(words.get()); end != UBRK_DONE; end = ubrk_next(words.get())) {
-    if (ubrk_getRuleStatus(words.get()) >= UBRK_WORD_NONE_LIMIT) {
-      UErrorCode preflight = U_ZERO_ERROR;
-      lengths.push_back(static_cast<std::size_t>(
-          u_strToUpper(nullptr, 0, text.data() + begin, end - begin, "", &preflight)));
-    }
-    begin = end;
-  }
-  return lengths;
+TEST(KXMetaphoneTest, LongerThanIcuCountsIsAnErrorThatLeavesTheEncoderAsItWas) {
+  const EndlessText endless(std::size_t{1} << 31);
+  ASSERT_TRUE(endless.exists());
+  KXMetaphone encoder;
+  encoder._append(u"X");
+  EXPECT_THROW(encoder.translate(endless.text()), std::length_error);
+  EXPECT_THROW(encoder._translateWord(endless.text()), std::length_error);
+  EXPECT_EQ(encoder._translateWord(u"a"), u"X A ");
+  EXPECT_EQ(encoder.translate(u"smith"), u" SM0  ");
 }
 
-/// What holds for the codes of every text: letters of the code alone, and at most two of them for
-/// each letter of the text, three spaces for each word.
 void checkCodes(const std::u16string& text) {
-  const std::u16string codes = translate(text);
-  RC_ASSERT(codes.find_first_not_of(u"AFHJKLMNPRSTX0 ") == codes.npos);
-  std::size_t bound = 0;
-  for (const std::size_t length : upperCasedLengths(text)) {
-    bound += 2 * length + 3;
-  }
-  RC_ASSERT(codes.size() <= bound);
-  RC_ASSERT(codes.empty() == (bound == 0));
+  KXMetaphone encoder;
+  const std::u16string codes = encoder.translate(text);
+  const testing::CodeBounds bounds = testing::boundsOfText(text);
+  RC_ASSERT(testing::within(bounds, codes));
+  RC_ASSERT(codes.empty() == (bounds.spaces == 0));
+  RC_ASSERT(testing::within(testing::boundsOfWord(text), encoder._translateWord(text)));
+}
+
+TEST(CodeBoundsTest, LettersAndSpacesAreCountedApart) {
+  const testing::CodeBounds bounds = testing::boundsOfText(u"stra\u00DFe 1984, ça!");
+  EXPECT_EQ(bounds.letters, 2 * (7 + 0 + 2));
+  EXPECT_EQ(bounds.spaces, 3 * 3);
+  EXPECT_EQ(testing::boundsOfWord(u"mac queen").letters, 2 * 8);
+  EXPECT_EQ(testing::boundsOfWord(u"mac queen").spaces, 3);
+  EXPECT_TRUE(testing::within({2, 2}, u" KS "));
+  EXPECT_FALSE(testing::within({1, 9}, u" KS "));
+  EXPECT_FALSE(testing::within({9, 1}, u" KS "));
+  EXPECT_FALSE(testing::within({9, 9}, u" KV "));
 }
 
 RC_GTEST_PROP(KXMetaphonePropertyTest, AnyCodeUnitsAreEncoded,

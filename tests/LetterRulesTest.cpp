@@ -98,6 +98,14 @@ LETTER(C,                              //
        Case{u"mac queen", u"MKN"},      // M1 M, A2 -, C3 K (3; " Q"), U6 -, E7 -, E8 -, N9 N
        Case{u"mac gregor", u"MKRKR"});  // M1 M, A2 -, C3 K (3; " G"), R6 R, E7 -, G8 K, O9 -, R10 R
 
+// Words that come near a rule and miss it.
+
+LETTER(CNearMisses,                  //
+       Case{u"baccy", u"PK"},        // B1 P, A2 -, C3 K (2; CC, but before Y), Y5 -
+       Case{u"bachelor", u"PXLR"},   // B1 P, A2 -, C3 X (2; not BACHER), E5 -, L6 L, O7 -, R8 R
+       Case{u"chess", u"XS"},        // C1 X (2; HES is none of the first), E3 -, S4 S (2)
+       Case{u"orchard", u"ARXRT"});  // O1 A, R2 R, C3 X (2; not ORCHID), A5 -, R6 R, D7 T
+
 LETTER(D,                        //
        Case{u"badger", u"PJR"},  // B1 P, A2 -, D3 J (3; DGE), R6 R
        Case{u"budgie", u"PJ"},   // B1 P, U2 -, D3 J (3; DGI), E6 -
@@ -176,6 +184,11 @@ LETTER(GElsewhere,                //
        Case{u"buggier", u"PKR"},  // B1 P, U2 -, G3 K (2; GG), I5 -, E6 -, R7 R
        Case{u"gut", u"KT"});      // G1 K, U2 -, T3 T
 
+LETTER(GNearMisses,             //
+       Case{u"sough", u"SK"},   // S1 S, O2 -, U3 -, G4 K (2; S is not among the letters before)
+       Case{u"genre", u"JNR"},  // G1 J (2; EN is not in the list of the start), N3 N, R4 R, E5 -
+       Case{u"getto", u"KT"});  // G1 K (2; ET, though not in that list), T3 T (2), O5 -
+
 LETTER(H,                            //
        Case{u"homme", u"HM"},        // H1 H (2), M3 M (2), E5 -
        Case{u"ahoy", u"AH"},         // A1 A, H2 H (2), Y4 -
@@ -193,6 +206,11 @@ LETTER(J,                        //
        Case{u"sjesta", u"SST"},  // S1 S, J2 - (after S), E3 -, S4 S, T5 T, A6 -
        Case{u"boje", u"PJ"},     // B1 P, O2 -, J3 J, E4 -
        Case{u"hajji", u"HJ"});   // H1 H (2), J3 J (2), I5 -
+
+LETTER(JNearMisses,               //
+       Case{u"hajduk", u"HJTK"},  // H1 H (2), J3 J (before D), D4 T, U5 -, K6 K
+       Case{u"adjacent",
+            u"ATJSNT"});  // A1 A, D2 T, J3 J (no vowel before), A4 -, C5 S (2), N7 N, T8 T
 
 LETTER(K,                        //
        Case{u"lekko", u"LK"},    // L1 L, E2 -, K3 K (2), O5 -
@@ -251,6 +269,11 @@ LETTER(S,                           //
        Case{u"passion", u"PSN"},    // P1 P, A2 -, S3 S (2), I5 -, O6 -, N7 N
        Case{u"haus", u"HS"});       // H1 H (2), U3 -, S4 S
 
+LETTER(SNearMisses,                   //
+       Case{u"threshold", u"0RXLT"},  // T1 0 (2), R3 R, E4 -, S5 X (2; HOLD), O7 -, L8 L, D9 T
+       Case{u"sheik", u"XK"},         // S1 X (2; HEIK), E3 -, I4 -, K5 K
+       Case{u"sugared", u"XKRT"});    // S1 X (SUGAR), U2 -, G3 K, A4 -, R5 R, E6 -, D7 T
+
 LETTER(Sc,                          //
        Case{u"school", u"SKL"},     // S1 SK (3; OO), O4 -, O5 -, L6 L
        Case{u"schuyler", u"SKLR"},  // S1 SK (3; UY), U4 -, Y5 -, L6 L, E7 -, R8 R
@@ -279,6 +302,7 @@ LETTER(T,                          //
        Case{u"gottheit", u"K0T"},  // G1 K, O2 -, T3 0 (2), H5 -, E6 -, I7 -, T8 T
        Case{u"cottbus", u"KTPS"},  // C1 K, O2 -, T3 T (2), B5 P, U6 -, S7 S
        Case{u"hotdog", u"HTK"},    // H1 H (2), T3 T (2; before D), O5 -, G6 K
+       Case{u"theme", u"0M"},      // T1 0 (2; EM is neither OM nor AM), E3 -, M4 M, E5 -
        Case{u"gut", u"KT"});       // G1 K, U2 -, T3 T
 
 LETTER(V,                        //
@@ -299,7 +323,9 @@ LETTER(W,                             //
        Case{u"horowitz", u"HRTS"},    // H1 H (2), R3 R, O4 -, W5 TS (4)
        Case{u"witzel", u"ATSL"},      // W1 A (before I), then TS (4), E5 -, L6 L
        Case{u"witzbold", u"ATSPLT"},  // W1 A (before I), then TS (4), B5 P, O6 -, L7 L, D8 T
-       Case{u"owl", u"AL"});          // O1 A, W2 -, L3 L
+       Case{u"witzhelden", u"ATSLTN"},  // W1 A, then TS (4, with the Z), H5 -, L7 L, D8 T, N10 N
+       Case{u"wittig", u"ATK"},         // W1 A (before I; WITT), I2 -, T3 T (2), I5 -, G6 K
+       Case{u"owl", u"AL"});            // O1 A, W2 -, L3 L
 
 LETTER(X,                            //
        Case{u"taxi", u"TKS"},        // T1 T, A2 -, X3 KS, I4 -

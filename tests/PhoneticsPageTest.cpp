@@ -39,6 +39,8 @@ constexpr Example kExamples[] = {
     {u"danger", "a G before ER is K"},
     {u"magic", "elsewhere before E, I and Y it is mostly J"},
     {u"dumb", "a final B is heard"},
+    {u"teach", "a final CH after A, E, O or U is K"},
+    {u"milch", "after other letters it is X"},
     {u"school", "SCH is SK in words such as this"},
     {u"nation", "TION, TIA and TCH are X"},
     {u"horowitz", "WITZ and WICZ are TS"},

@@ -407,7 +407,7 @@ TEST(HostileImageTest, ManyPlacesWithTheSameManyChildren) {
   // Each place leads to the same long row of rare children: the square of the image's size, if the
   // row were read for each.
   ForgedImage image = broadImage(kBroad);
-  std::vector<TreeSlot> slots(2 * kBroad);
+  std::vector<TreeSlot> slots(std::size_t{2} * kBroad);
   slots[0] = {.children = std::uint64_t{1} << image::kRareBit, .target = 1};
   for (std::uint32_t i = 1; i < 2 * kBroad; ++i) {
     slots[i] = {.children = std::uint64_t{1} << image::kRareBit,
@@ -432,7 +432,7 @@ TEST(HostileImageTest, ManyPlacesWithTheSameManyChildren) {
 
 TEST(HostileImageTest, ManyLeavesWithoutWords) {
   ForgedImage image = broadImage(kBroad);
-  std::vector<TreeSlot> slots(2 * kBroad);
+  std::vector<TreeSlot> slots(std::size_t{2} * kBroad);
   for (auto& slot : slots) {
     slot = {.target = TreeSlot::kLeaf, .longest = 255};
   }

@@ -162,10 +162,36 @@ TEST(LineReaderTest, AnEmptyRestOfALongLineStaysInTheStream) {
   EXPECT_EQ(readLineAsKXString(file.get()), u"");
 }
 
+TEST(LineReaderTest, ACharacterThatLosesAByteBecomesAReplacementCharacter) {
+  // The first byte of the é ends the piece, and the second one is dropped.
+  const File secondByte = fileOf(std::string(4094, 'a') + "éb");
+  EXPECT_EQ(readLineAsKXString(secondByte.get()), std::u16string(4094, u'a') + u"\uFFFDb");
+  // The first byte is dropped.
+  const File firstByte = fileOf(std::string(4095, 'a') + "éb");
+  EXPECT_EQ(readLineAsKXString(firstByte.get()), std::u16string(4095, u'a') + u"\uFFFDb");
+  // A dropped character of one byte leaves the others whole.
+  const File noByte = fileOf(std::string(4093, 'a') + "éxéb");
+  EXPECT_EQ(readLineAsKXString(noByte.get()), std::u16string(4093, u'a') + u"ééb");
+}
+
+TEST(LineReaderTest, OnlyALineInPiecesMayHoldBytesThatAreNotUtf8) {
+  const File shorter = fileOf(std::string(4093, 'a') + "\xE9");
+  EXPECT_THROW(readLineAsKXString(shorter.get()), std::runtime_error);
+  const File longer = fileOf(std::string(4094, 'a') + "\xE9");
+  EXPECT_EQ(readLineAsKXString(longer.get()), std::u16string(4094, u'a') + u"\uFFFD");
+}
+
 TEST(LineReaderTest, ANulByteHidesTheRestOfItsPiece) {
   const File file = fileOf(std::string_view("ab\0cd\nef", 8));
   EXPECT_EQ(readLineAsKXString(file.get()), u"ab");
   EXPECT_EQ(readLineAsKXString(file.get()), u"ef");
+}
+
+TEST(VerifyMetaphoneTest, ALineThatIsCutInsideACharacterHasItsVerdict) {
+  const std::string word(4095, 'b');
+  EXPECT_EQ(verdictsOf(word + "é,PP\nknife,KNF"),
+            (Lines{"pass: \"" + word + "\uFFFD\" -> \"" + std::string(2048, 'P') + "\" == \"PP\"",
+                   "pass: \"knife\" -> \"KNF\" == \"KNF\""}));
 }
 
 TEST(VerifyMetaphoneTest, TwoLinesThatAreReadAsOneAreSplitAsOne) {

@@ -465,6 +465,14 @@ class EncodeTest(CommandTest):
         self.assertEqual(self.succeed("encode", "--json", "Peña Łódź", "..."),
                          '{"text":"Peña Łódź","codes":["PN","T"]}\n{"text":"...","codes":[]}\n')
 
+    def test_no_text_has_no_codes_and_is_no_miss(self):
+        self.assertEqual(self.succeed("encode", stdin=""), "")
+        self.assertEqual(self.succeed("encode", "--json", stdin=""), "")
+        with open(os.devnull, "rb") as nothing:
+            done = subprocess.run([PROGRAM, "encode"], stdin=nothing, capture_output=True,
+                                  timeout=PATIENCE)
+        self.assertEqual((done.returncode, done.stdout, done.stderr), (0, b"", b""))
+
     def test_invalid_utf8(self):
         self.fail_with("UTF-8", of=["encode", b"caf\xe9"])
 

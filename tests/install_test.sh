@@ -1,8 +1,9 @@
 #!/usr/bin/env bash
 # Installs a build into a temporary prefix, and builds and runs a host against it: once found by
-# CMake, once by pkg-config. Arguments: source directory, build directory, compiler flags.
+# CMake, once by pkg-config. Arguments: source directory, build directory, 1 if the wordcatcher
+# command was built, compiler flags.
 set -euo pipefail
-source=$1 build=$2 flags=$3
+source=$1 build=$2 with_cli=$3 flags=$4
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 prefix=$work/prefix
@@ -12,6 +13,28 @@ cmake --install "$build" --prefix "$prefix" >/dev/null
 mv "$prefix" "$work/moved"
 prefix=$work/moved
 libdir=$(dirname "$(find "$prefix" -name libwordcatcher.so)")
+
+# The commands find the library by themselves.
+unset LD_LIBRARY_PATH
+(cd "$source/tests/data" && "$prefix/bin/verify-metaphone") 2>"$work/verdicts" || {
+  echo "the installed verify-metaphone ended with $?: $(tail -n 1 "$work/verdicts")" >&2
+  exit 1
+}
+passes=$(grep -c '^pass: ' "$work/verdicts" || true)
+if [ "$passes" -lt 600 ] || grep '^FAIL' "$work/verdicts" >&2; then
+  echo "the installed verify-metaphone passed $passes words, or failed one" >&2
+  exit 1
+fi
+echo "the installed verify-metaphone passes $passes words"
+if [ "$with_cli" = 1 ]; then
+  version=$("$prefix/bin/wordcatcher" --version)
+  [ "$version" = "wordcatcher 1.0.0" ] || {
+    echo "the installed wordcatcher printed: $version" >&2
+    exit 1
+  }
+  echo "the installed wordcatcher works"
+fi
+
 export LD_LIBRARY_PATH=$libdir
 
 expected=$'1.0.0\n{KXWordcatch v:"golden retriever", dist: 1}'

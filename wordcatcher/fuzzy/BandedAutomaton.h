@@ -89,10 +89,14 @@ struct Band {
     std::uint64_t notTooFarBehind[2 * kAheadCap + 1];
     std::uint64_t notTooFarAhead[2 * kAheadCap + 1];
   };
+  static constexpr std::size_t reachEntry(std::int64_t ahead) {
+    constexpr auto cap = static_cast<std::int64_t>(kAheadCap);
+    return static_cast<std::size_t>((ahead < -cap ? -cap : (ahead > cap ? cap : ahead)) + cap);
+  }
   static constexpr Reach makeReach() {
     Reach reach = {};
     for (int ahead = -static_cast<int>(kAheadCap); ahead <= static_cast<int>(kAheadCap); ++ahead) {
-      const auto entry = static_cast<std::size_t>(ahead + static_cast<int>(kAheadCap));
+      const auto entry = reachEntry(ahead);
       for (unsigned e = 0; e <= K; ++e) {
         for (unsigned c = 0; c < kColumns; ++c) {
           const int lead = static_cast<int>(c) - static_cast<int>(K);
@@ -106,11 +110,6 @@ struct Band {
     return reach;
   }
   static constexpr Reach kReach = makeReach();
-
-  static constexpr std::size_t reachEntry(std::int64_t ahead) {
-    constexpr auto cap = static_cast<std::int64_t>(kAheadCap);
-    return static_cast<std::size_t>((ahead < -cap ? -cap : (ahead > cap ? cap : ahead)) + cap);
-  }
 };
 
 /// A query prepared for simulation at up to K edits.

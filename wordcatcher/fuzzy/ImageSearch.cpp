@@ -433,21 +433,24 @@ class ColumnSearch {
   bool readOne(std::uint16_t label, std::size_t depth) {
     const Column& before = columnAt(depth - 1);
     Column& column = columnAt(depth);
-    column.costs.clear();
     column.first = depth > _maxDistance ? depth - _maxDistance : 0;
-    const std::uint64_t last = std::min<std::uint64_t>(_query.units.size(), depth + _maxDistance);
+    const std::uint64_t end =
+        std::min<std::uint64_t>(_query.units.size(), depth + _maxDistance) + 1;
+    column.costs.resize(end > column.first ? end - column.first : 0);
     const bool onlyInserted = depth == 1 && _query.beginsWithEmptyMove;
     std::uint32_t least = kUnreachable;
     std::uint32_t missing = kUnreachable;
-    for (std::uint64_t row = column.first; row <= last; ++row) {
-      std::uint32_t cost = std::min(oneMore(before.costAt(row)), missing);
-      if (row > 0 && !onlyInserted) {
-        const std::uint32_t read = before.costAt(row - 1);
-        cost = std::min(cost, _query.units[row - 1].matches(label) ? read : oneMore(read));
-      }
-      column.costs.push_back(cost);
+    std::uint32_t read =
+        column.first > 0 && !onlyInserted ? before.costAt(column.first - 1) : kUnreachable;
+    for (std::uint64_t row = column.first; row < end; ++row) {
+      const bool equal = row > 0 && _query.units[row - 1].matches(label);
+      const std::uint32_t inserted = before.costAt(row);
+      const std::uint32_t cost =
+          std::min({equal ? read : oneMore(read), oneMore(inserted), missing});
+      column.costs[row - column.first] = cost;
       least = std::min(least, cost);
       missing = oneMore(cost);
+      read = onlyInserted ? kUnreachable : inserted;
     }
     return least <= _maxDistance;
   }

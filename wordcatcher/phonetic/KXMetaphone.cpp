@@ -5,6 +5,8 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <limits>
+#include <stdexcept>
 
 #include "wordcatcher/phonetic/LetterRules.h"
 #include "wordcatcher/text/Unicode.h"
@@ -13,6 +15,9 @@
 namespace wordcatcher {
 
 namespace {
+
+/// As far as ICU counts, and so the most that a word of a text can have.
+constexpr std::size_t kMaxLength = std::numeric_limits<std::int32_t>::max();
 
 std::u16string withoutPunctuation(std::u16string_view word) {
   std::u16string letters;
@@ -63,9 +68,9 @@ KXMetaphone::KXMetaphone() : _segmenter(std::make_unique<WordSegmenter>()) {}
 KXMetaphone::~KXMetaphone() = default;
 
 std::u16string KXMetaphone::translate(std::u16string_view text) {
+  _segmenter->start(text);
   std::u16string codes;
   codes.reserve(text.size());
-  _segmenter->start(text);
   while (const auto word = _segmenter->next()) {
     if (encode(*word)) {
       codes += code();
@@ -77,6 +82,9 @@ std::u16string KXMetaphone::translate(std::u16string_view text) {
 }
 
 std::u16string KXMetaphone::_translateWord(std::u16string_view word) {
+  if (word.size() > kMaxLength) {
+    throw std::length_error("A word must not be longer than 2,147,483,647 code units.");
+  }
   if (!encode(word)) {
     return {};
   }

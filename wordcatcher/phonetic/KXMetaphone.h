@@ -26,9 +26,13 @@ class WordSegmenter;
 /// a space on either side, a word's length is counted modulo 65,536, and the code ends there; it is
 /// empty if nothing remains.
 ///
+/// After an exception the buffers may hold a part of a code; reset() empties them.
+///
 /// Thread safety: one thread at a time, also for different texts.
 class WORDCATCHER_EXPORT KXMetaphone {
  public:
+  /// Loads the word-boundary rules, which takes far longer than encoding a word: keep the encoder.
+  /// Throws std::runtime_error if ICU's data, which holds them, is missing.
   KXMetaphone();
   ~KXMetaphone();
   KXMetaphone(const KXMetaphone&) = delete;
@@ -39,7 +43,9 @@ class WORDCATCHER_EXPORT KXMetaphone {
   /// result into words, do not count spaces. Words are those of the Unicode word-boundary rules
   /// (UAX #29); a text without words gives the empty string. Linear in the text.
   ///
-  /// Throws std::length_error beyond 536,870,911 code units.
+  /// Throws std::length_error, before it encodes anything, if the text is longer than
+  /// 2,147,483,647 code units; std::runtime_error if ICU cannot walk the text or the upper-case
+  /// form of one of its words is longer than that.
   std::u16string translate(std::u16string_view text);
 
   /// The code of one word: punctuation (the Unicode category P) is taken out, the rest upper-cased
@@ -47,6 +53,10 @@ class WORDCATCHER_EXPORT KXMetaphone {
   /// themselves to the code, unless the last letter's rule passes over the one at the end. Whatever
   /// _append() left in the buffers comes first. Leaves the buffers empty, except for a word whose
   /// padded length is a multiple of 65,536, which gives the empty string and touches nothing.
+  /// Linear in the word.
+  ///
+  /// Throws std::length_error if the word is longer than 2,147,483,647 code units, and
+  /// std::runtime_error if its upper-case form is; the buffers are then as they were.
   std::u16string _translateWord(std::u16string_view word);
 
   /// Adds to the code of the word that is being encoded, and to its alternate code.

@@ -41,8 +41,11 @@ template <Literal... members>
 inline constexpr AnyOf<members...> anyOf;
 
 /// The letter rules, run over one word. The word is padded with a space before and one after, so
-/// that its first letter stands at position 1, its last at length - 2, and every position outside
-/// the letters reads as a space.
+/// that its first letter stands at position 1 and its last two places before the padded word's end.
+/// Outside of that, a single character reads as a space. A piece that begins before position 0
+/// is moved there and keeps its length; a piece that reaches beyond the end is shorter, and fits no
+/// string of its full length. A word that `length` cuts is read beyond the cut: rules see the
+/// letters that follow.
 ///
 /// Each letter function looks around the current position, appends to the encoder's two codes and
 /// returns how many positions it has dealt with, at least 1. Within a function the first rule that

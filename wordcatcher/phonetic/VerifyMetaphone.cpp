@@ -2,6 +2,7 @@
 
 #include <stdexcept>
 #include <string_view>
+#include <utility>
 
 #include "wordcatcher/log/LogLine.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
@@ -67,18 +68,22 @@ void verifyMetaphone(std::FILE* expectations) {
 std::u16string readLineAsKXString(std::FILE* stream) {
   std::string bytes;
   int count = 0;
-  do {
-    char piece[kPieceLength + 1];
-    if (std::fscanf(stream, "%4095[^\n]%n%*c", piece, &count) != 1) {
+  bool inPieces = false;
+  for (char piece[kPieceLength + 1]; std::fscanf(stream, "%4095[^\n]%n%*c", piece, &count) == 1;) {
+    bytes += piece;
+    if (count < kPieceLength) {
       break;
     }
-    bytes += piece;
-  } while (count == kPieceLength);
-  const auto line = fromUtf8(bytes);
-  if (!line) {
-    throw std::runtime_error("the text is not UTF-8; convert the file.");
+    inPieces = true;
   }
-  return *line;
+  if (inPieces) {
+    // The byte that was dropped may have been one of several of its character.
+    return decodeUtf8(bytes);
+  }
+  if (auto line = fromUtf8(bytes)) {
+    return *std::move(line);
+  }
+  throw std::runtime_error("the text is not UTF-8; convert the file.");
 }
 
 }  // namespace wordcatcher

@@ -1,5 +1,6 @@
 #include "wordcatcher/storage/CommitImage.h"
 
+#include <algorithm>
 #include <array>
 #include <cerrno>
 #include <cstdint>
@@ -137,7 +138,8 @@ class Replacement {
     const SplitPath target(_path);
     if (target.name.empty() || _path.find('\0') != std::string::npos) {
       throw Error(ErrorCode::notWritable,
-                  "\"" + _path + "\" does not name a file; name the index.");
+                  "The path of the index does not name a file: it is empty, ends in \"/\" or holds "
+                  "U+0000; name a file.");
     }
     struct stat status = {};
     if (_files.status(_path, status) == 0 && !S_ISREG(status.st_mode)) {
