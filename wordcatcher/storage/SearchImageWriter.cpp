@@ -23,7 +23,7 @@ using image::TreeSlot;
 
 // Leaves of several words keep the trees small; looking at a word costs about as much as looking at
 // a slot, so beyond a few the walk gets slower.
-constexpr std::uint32_t kWordsALeaf = 4;
+constexpr std::uint32_t kWordsALeaf = 2;
 
 // Word offsets have 32 bits.
 constexpr std::uint64_t kMaxWordUnits = std::numeric_limits<std::uint32_t>::max();
