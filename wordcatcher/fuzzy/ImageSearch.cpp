@@ -1,6 +1,7 @@
 #include "wordcatcher/fuzzy/ImageSearch.h"
 
 #include <algorithm>
+#include <array>
 #include <bit>
 #include <iterator>
 #include <limits>
@@ -22,7 +23,7 @@ constexpr char16_t kEmptyMove = u'_';
 constexpr std::int64_t kMaxBandedDistance = 4;
 
 /// Below this length the two halves of a query are too short to rule anything out.
-constexpr std::size_t kMinSplitLength = 4;
+constexpr std::size_t kMinSplitLength = 6;
 
 /// A lower-cased query in an image's labels.
 struct Query {
@@ -115,6 +116,14 @@ class BandedWalk {
     std::uint64_t states;
   };
 
+  /// A word of a leaf that is still to be read: first its place, then itself.
+  struct LeafWord {
+    std::uint32_t word;
+    std::uint32_t depth;
+    std::uint64_t states;
+  };
+  static constexpr std::size_t kLeafWords = 64;
+
   template <typename Accept>
   void finish(Accept& accept) {
     while (!_pending.empty()) {
@@ -122,6 +131,7 @@ class BandedWalk {
       _pending.pop_back();
       expand(_tree.slots[item.slot], item.states, item.depth, accept);
     }
+    readLeafWords(accept);
   }
 
   std::uint32_t wordAt(std::uint64_t place) const {
@@ -196,15 +206,45 @@ class BandedWalk {
   void enter(std::size_t child, std::uint64_t states, std::size_t depth, Accept& accept) {
     const TreeSlot& slot = _tree.slots[child];
     if (!slot.isLeaf()) {
+      if (slot.index() < _tree.slots.size()) {
+        __builtin_prefetch(&_tree.slots[slot.index()]);
+      }
       _pending.push_back(
           {static_cast<std::uint32_t>(child), static_cast<std::uint32_t>(depth), states});
       return;
     }
     _budget.spendPlaces(slot.index(), slot.children);
     for (std::uint64_t place = slot.index(); place < slot.index() + slot.children; ++place) {
-      const std::uint32_t word = wordAt(place);
-      if (const std::uint64_t accepted = readRest(word, states, depth)) {
-        accept(word, accepted);
+      if (_tree.order.empty()) {
+        _image.prefetchOffsetOf(static_cast<std::uint32_t>(place));
+      } else {
+        __builtin_prefetch(&_tree.order[place]);
+      }
+      _leafWords[_leafWordCount++] = {static_cast<std::uint32_t>(place),
+                                      static_cast<std::uint32_t>(depth), states};
+      if (_leafWordCount == kLeafWords) {
+        readLeafWords(accept);
+      }
+    }
+  }
+
+  /// What is needed of each word is asked of memory before the first is waited for.
+  template <typename Accept>
+  void readLeafWords(Accept& accept) {
+    const std::span<LeafWord> leafWords(_leafWords.data(), _leafWordCount);
+    _leafWordCount = 0;
+    if (!_tree.order.empty()) {
+      for (auto& leaf : leafWords) {
+        leaf.word = wordAt(leaf.word);
+        _image.prefetchOffsetOf(leaf.word);
+      }
+    }
+    for (const auto& leaf : leafWords) {
+      _image.prefetchLabelsOf(leaf.word);
+    }
+    for (const auto& leaf : leafWords) {
+      if (const std::uint64_t accepted = readRest(leaf.word, leaf.states, leaf.depth)) {
+        accept(leaf.word, accepted);
       }
     }
   }
@@ -226,6 +266,8 @@ class BandedWalk {
   const BandedPattern<K>& _pattern;
   VisitBudget _budget;
   std::vector<Item> _pending;
+  std::array<LeafWord, kLeafWords> _leafWords;
+  std::size_t _leafWordCount = 0;
 };
 
 /// Collects hits, and puts them into the order of a search.

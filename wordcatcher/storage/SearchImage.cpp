@@ -214,18 +214,6 @@ std::uint16_t SearchImage::labelOf(char16_t unit) const noexcept {
   return 0;
 }
 
-std::span<const std::uint16_t> SearchImage::labelsOf(std::uint32_t word) const {
-  if (word >= _wordCount) {
-    throwDamaged("it refers to a word that is not there");
-  }
-  const std::uint32_t begin = _wordOffsets[word];
-  const std::uint32_t end = _wordOffsets[word + 1];
-  if (begin > end || end > _wordText.size()) {
-    throwDamaged("a word lies outside its section");
-  }
-  return _wordText.subspan(begin, end - begin);
-}
-
 std::u16string SearchImage::textOf(std::uint32_t word) const {
   std::u16string text;
   for (const std::uint16_t label : labelsOf(word)) {

@@ -44,7 +44,31 @@ class SearchImage {
   std::uint16_t labelOf(char16_t unit) const noexcept;
 
   /// The labels of a word, and its code units. The word must be below wordCount().
-  std::span<const std::uint16_t> labelsOf(std::uint32_t word) const;
+  std::span<const std::uint16_t> labelsOf(std::uint32_t word) const {
+    if (word >= _wordCount) {
+      throwDamaged("it refers to a word that is not there");
+    }
+    const std::uint32_t begin = _wordOffsets[word];
+    const std::uint32_t end = _wordOffsets[word + 1];
+    if (begin > end || end > _wordText.size()) {
+      throwDamaged("a word lies outside its section");
+    }
+    return _wordText.subspan(begin, end - begin);
+  }
+
+  /// Ask memory early for what labelsOf() will read: first the offset, some time later the labels.
+  /// Any word may be given.
+  void prefetchOffsetOf(std::uint32_t word) const noexcept {
+    if (word < _wordCount) {
+      __builtin_prefetch(&_wordOffsets[word]);
+    }
+  }
+  void prefetchLabelsOf(std::uint32_t word) const noexcept {
+    if (word < _wordCount && _wordOffsets[word] < _wordText.size()) {
+      __builtin_prefetch(&_wordText[_wordOffsets[word]]);
+    }
+  }
+
   std::u16string textOf(std::uint32_t word) const;
 
   /// One of the two trees, and the word that stands at each of its places.

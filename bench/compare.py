@@ -1,0 +1,264 @@
+#!/usr/bin/env python3
+"""Runs the drivers in turn, several rounds, and writes bench/results/DATE-compare.md and .svg.
+
+Run by scripts/compare, which builds what this runs and says which works there are.
+"""
+
+import json
+import os
+import statistics
+import subprocess
+import sys
+from datetime import date
+from pathlib import Path
+
+import agreement
+import chart
+
+ROUNDS = 3
+OURS = "wordcatcher"
+QUERY = "Lucene FuzzyQuery"
+TERMS = "Lucene terms"
+SCAN = "banded scan"
+LUCENE = "Lucene 8"
+MINISEARCH = "MiniSearch"
+
+ROOT = Path(__file__).resolve().parent.parent
+DRIVERS = ROOT / "build/release/bench"
+COMPARE = ROOT / "build/compare"
+DATA = COMPARE / "data"
+
+LATENCIES = ("mean", "p50", "p99")
+
+
+def run(*command, cwd=ROOT):
+    done = subprocess.run([str(part) for part in command], cwd=cwd, stdout=subprocess.PIPE, check=True)
+    return json.loads(done.stdout)
+
+
+def lucene(*arguments):
+    return run("java", "-cp", os.environ["LUCENE_CLASSPATH"], "LuceneFuzzy", *arguments)
+
+
+def minisearch():
+    program = ROOT / "bench/alternatives/minisearch.mjs"
+    data = (DATA / "w2-phrases.txt", DATA / "w2-queries.tsv")
+    return run("node", "--expose-gc", program, *data, cwd=COMPARE)
+
+
+def rounds(engines):
+    """Runs each engine's driver once a round, in turn; the outputs by engine."""
+    outputs = {engine: [] for engine in engines}
+    for number in range(ROUNDS):
+        for engine, driver in engines.items():
+            print(f"round {number + 1} of {ROUNDS}: {engine}", file=sys.stderr)
+            outputs[engine].append(driver(number))
+    return outputs
+
+
+def at(output, *path):
+    for key in path:
+        output = output[key]
+    return output
+
+
+def median(outputs, *path):
+    return statistics.median(at(output, *path) for output in outputs)
+
+
+def ratio(others, ours, path, our_path=None):
+    """How many times as long the others take: the median over the rounds."""
+    pairs = zip(others, ours)
+    return statistics.median(at(other, *path) / at(own, *(our_path or path)) for other, own in pairs)
+
+
+def number(value):
+    return f"{value:,.0f}" if value >= 100 else f"{value:.3g}"
+
+
+def megabytes(value):
+    return f"{value / 1e6:.1f} MB"
+
+
+def times(outputs, *path):
+    return " / ".join(number(median(outputs, *path, name)) for name in LATENCIES)
+
+
+def table(head, lines):
+    cells = [head, ["---"] + ["---:"] * (len(head) - 1), *lines]
+    return "".join(f"| {' | '.join(line)} |\n" for line in cells) + "\n"
+
+
+def words_work():
+    """W1: words within k of a misspelling."""
+    words = DATA / "w1-words.txt"
+    sample = DATA / "w1-sample.txt"
+    image = COMPARE / "w1.wci"
+    files = {name: COMPARE / f"{name}-found.txt" for name in ("ours", "scan", "lucene")}
+
+    def results(round_number, name):
+        return [files[name]] if round_number == 0 else []
+
+    out = rounds({
+        OURS: lambda n: run(DRIVERS / "search_work", words, sample, image, *results(n, "ours")),
+        LUCENE: lambda n: lucene("words", words, sample, *results(n, "lucene")),
+        SCAN: lambda n: run(DRIVERS / "brute_force", words, sample, *results(n, "scan")),
+        "all": lambda n: run(DRIVERS / "search_work", words, DATA / "w1-queries.txt", image),
+    })
+    ours, theirs, scan, whole = out[OURS], out[LUCENE], out[SCAN], out["all"]
+    agreeing, only_plain = agreement.check(files["scan"], files["ours"], {LUCENE: files["lucene"]})
+
+    lines = []
+    groups = []
+    for k in (1, 2, 3):
+        name = f"k{k}"
+        others = {SCAN: (scan, name)}
+        if k < 3:
+            others = {QUERY: (theirs, name), TERMS: (theirs, f"terms{k}"), SCAN: (scan, name)}
+        row = [f"k={k}", times(ours, name)]
+        for engine in (QUERY, TERMS, SCAN):
+            if engine not in others:
+                row.append("not offered")
+                continue
+            outputs, key = others[engine]
+            faster = ratio(outputs, ours, (key, "mean"), (name, "mean"))
+            row.append(f"{times(outputs, key)} ({number(faster)}×)")
+        row.append(times(whole, name))
+        lines.append(row)
+        bars = {engine: median(outputs, key, "mean") for engine, (outputs, key) in others.items()}
+        groups.append((f"W1 k={k}", {OURS: median(ours, name, "mean"), **bars}))
+
+    text = "## W1: all words within k of a misspelling\n\n"
+    text += (
+        f"{lines_of(words):,} words of wamerican-huge; {lines_of(sample):,} misspellings of codespell, "
+        "and in the last column the whole "
+        f"{lines_of(DATA / 'w1-queries.txt'):,}. Microseconds: mean / p50 / p99; in brackets how "
+        "many times as long as ours on average.\n\n"
+    )
+    text += table(["look-up", OURS, QUERY, TERMS, SCAN, f"{OURS}, all queries"], lines)
+    text += table(["", OURS, LUCENE], [
+        ["index", megabytes(median(ours, "indexBytes")), megabytes(median(theirs, "indexBytes"))],
+        ["build, s", number(median(ours, "buildSeconds")), number(median(theirs, "buildSeconds"))],
+        ["open, ms", number(median(ours, "openSeconds") * 1e3), "not measured"],
+    ])
+    text += (
+        "Agreement: every word that the scan of the whole list finds is found by Lucene (k up to 2), "
+        "and by wordcatcher with the same distance, save those that lack the query's first letters "
+        "and are within k only when these are left out before anything is read, which its search "
+        "does not do. "
+    )
+    text += "; ".join(
+        f"k={k}: {agreeing[k]:,} found by all, {only_plain[k]:,} by plain engines only"
+        for k in (1, 2, 3)
+    )
+    return text + ".\n\n", groups
+
+
+def lines_of(path):
+    with open(path, "rb") as file:
+        return sum(1 for _ in file)
+
+
+def query_work(name, phrases, kind="plain"):
+    queries = DATA / f"{name}-queries.tsv"
+    return run(DRIVERS / "query_work", phrases, queries, COMPARE / f"{name}.wci", kind)
+
+
+def phrases_work():
+    """W2: a phrase by a misspelled one."""
+    data = (DATA / "w2-phrases.txt", DATA / "w2-queries.tsv")
+    out = rounds({
+        OURS: lambda _: query_work("w2", data[0]),
+        LUCENE: lambda _: lucene("phrases", *data),
+        MINISEARCH: lambda _: minisearch(),
+    })
+    ours = out[OURS]
+
+    def each(show):
+        return [show(outputs) for outputs in out.values()]
+
+    def found(key):
+        return each(lambda o: f"{100 * o[0][key] / o[0]['questions']:.1f} %")
+
+    def compared(outputs):
+        faster = ratio(outputs, ours, ("query", "p50"))
+        return times(outputs, "query") + ("" if outputs is ours else f" ({number(faster)}×)")
+
+    text = "## W2: phrases by misspelled ones\n\n"
+    text += (
+        f"{lines_of(data[0]):,} lemmas of wordnet-base, {lines_of(data[1]):,} questions. In brackets how "
+        "many times as long as ours in the median. Lucene and MiniSearch rank whatever shares a "
+        "word; wordcatcher answers with what lies within its bound.\n\n"
+    )
+    text += table(["", *out], [
+        ["query, µs: mean / p50 / p99", *each(compared)],
+        ["source first", *found("foundFirst")],
+        ["source within ten", *found("foundWithinTen")],
+        ["index", *each(lambda o: megabytes(median(o, "indexBytes")))],
+        ["memory of the index", "mapped", "in the index", megabytes(median(out[MINISEARCH], "heapBytes"))],
+        ["build from text, s", *each(lambda o: number(median(o, "buildSeconds")))],
+        ["open, ms", number(median(ours, "openSeconds") * 1e3), "not measured", "not measured"],
+    ])
+    bars = {engine: median(outputs, "query", "p50") for engine, outputs in out.items()}
+    return text, [("W2 p50", bars)]
+
+
+def made_work(counts):
+    """W3: how a query grows with the number of phrases."""
+    lines = []
+    for count in counts:
+        runs = [query_work("w3", DATA / f"w3-{count}.txt", "numbered") for _ in range(min(ROUNDS, 5_000_000 // count))]
+        lines.append([
+            f"{count:,}",
+            times(runs, "query"),
+            f"{100 * runs[0]['found'] / runs[0]['questions']:.1f} %",
+            megabytes(median(runs, "indexBytes")),
+            number(median(runs, "buildSeconds")),
+            megabytes(median(runs, "buildPeakBytes")),
+            number(median(runs, "openSeconds") * 1e3),
+        ])
+    text = "## W3: many phrases\n\n"
+    text += (
+        "Phrases made of WordNet's words with their frequencies, numbered; the same questions of "
+        "the first million for each.\n\n"
+    )
+    text += table(
+        ["phrases", "query, µs: mean / p50 / p99", "source found", "index", "build, s", "peak memory", "open, ms"],
+        lines,
+    )
+    return text, []
+
+
+def machine():
+    with open("/proc/cpuinfo", encoding="utf-8") as lines:
+        model = next(line.split(":", 1)[1].strip() for line in lines if line.startswith("model name"))
+    return f"{model}, {os.cpu_count()} cores, load {os.getloadavg()[0]:.1f} at the start"
+
+
+def main(works):
+    counts = [count for work, count in (("w3", 1_000_000), ("w3-large", 5_000_000)) if work in works]
+    name = f"{date.today()}-compare"
+    text = (
+        f"# Comparison, {date.today()}\n\n{machine()}. One thread, warm, medians of {ROUNDS} rounds in "
+        "which the engines take turns; ratios are medians of the rounds' ratios. Written by "
+        "scripts/compare.\n\n"
+    )
+    groups = []
+    for wanted, work in (("w1" in works, words_work), ("w2" in works, phrases_work)):
+        if wanted:
+            part, bars = work()
+            text += part
+            groups += bars
+    if groups:
+        engines = list(dict.fromkeys(engine for _, bars in groups for engine in bars))
+        drawn = chart.svg("Time of a query, logarithmic (W1: mean, W2: median)", groups, engines)
+        (ROOT / f"bench/results/{name}.svg").write_text(drawn, encoding="utf-8")
+        text += f"![Times of queries]({name}.svg)\n\n"
+    if counts:
+        text += made_work(counts)[0]
+    (ROOT / f"bench/results/{name}.md").write_text(text.rstrip() + "\n", encoding="utf-8")
+    print(text)
+
+
+if __name__ == "__main__":
+    main(sys.argv[1:] or ["w1", "w2", "w3", "w3-large"])
