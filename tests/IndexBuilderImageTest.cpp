@@ -23,9 +23,9 @@
 #include "wordcatcher/Error.h"
 #include "wordcatcher/fuzzy/ImageSearch.h"
 #include "wordcatcher/matcher/IndexBuilder.h"
-#include "wordcatcher/text/PhraseLength.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
 #include "wordcatcher/storage/SearchImage.h"
+#include "wordcatcher/text/PhraseLength.h"
 #include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher {
