@@ -9,7 +9,7 @@ RIGHT = 90
 BAR = 15
 GAP = 14
 HEAD = 62
-COLOURS = ["#1b6ca8", "#e08e2b", "#b5563a", "#8a8a8a", "#6d9f5b"]
+COLOURS = ["#1b6ca8", "#e08e2b", "#b5563a", "#8a8a8a", "#8e5ea2", "#6d9f5b"]
 
 
 def svg(title, groups, engines):
