@@ -44,14 +44,18 @@ bool exists(const std::string& path) {
   return stat(path.c_str(), &status) == 0;
 }
 
+[[noreturn]] void throwNoTable(const std::string& prefix, const std::string& table, int code) {
+  throw Error(code == ENOENT ? ErrorCode::notFound : ErrorCode::notReadable,
+              "There is no classic index at " + prefix + ": " + table + " cannot be read (" +
+                  std::generic_category().message(code) + ").");
+}
+
 /// The tables' own failures are only lines in the log, so what can be told beforehand is told here.
 void checkThere(const std::string& prefix) {
   for (const auto& table : tablesAt(prefix)) {
     struct stat status = {};
     if (stat(table.c_str(), &status) != 0) {
-      const ErrorCode code = errno == ENOENT ? ErrorCode::notFound : ErrorCode::notReadable;
-      throw Error(code, "There is no classic index at " + prefix + ": " + table +
-                            " cannot be read (" + std::generic_category().message(errno) + ").");
+      throwNoTable(prefix, table, errno);
     }
     if (!S_ISREG(status.st_mode)) {
       throw Error(ErrorCode::notAnIndex, table + " is no file; index again.");
