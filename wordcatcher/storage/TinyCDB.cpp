@@ -214,8 +214,11 @@ void TinyCDB::_allocbuf(std::int32_t size) {
   if (blen >= size) {
     return;
   }
+  // `blen` is never negative, so the size is at least 1 here.
+  // NOLINTBEGIN(clang-analyzer-optin.portability.UnixAPI)
   auto* const grown =
       static_cast<unsigned char*>(std::realloc(buf, static_cast<std::size_t>(size)));
+  // NOLINTEND(clang-analyzer-optin.portability.UnixAPI)
   if (grown == nullptr) {
     std::free(buf);
     syslog(LOG_USER | LOG_ERR, "Unable to allocate %u bytes", static_cast<unsigned>(size));
