@@ -1,5 +1,6 @@
 #include "wordcatcher/fuzzy/LXFuzzyIndex.h"
 
+#include <algorithm>
 #include <utility>
 
 #include "wordcatcher/fuzzy/ImageSearch.h"
@@ -71,6 +72,7 @@ std::vector<LXFuzzyMatch> LXFuzzyIndex::search_withMaxDistance(
     for (const auto value : tree.postingsOf(hit.word)) {
       data.push_back(*fromUtf8(tree.valueText(value)));
     }
+    std::sort(data.begin(), data.end());
     matches.emplace_back(tree.textOf(hit.word), hit.distance, std::move(data));
   }
   return matches;

@@ -1,8 +1,10 @@
 #include "wordcatcher/fuzzy/TableImage.h"
 
+#include <set>
 #include <string_view>
 #include <unordered_map>
 #include <unordered_set>
+#include <vector>
 
 #include "wordcatcher/storage/PLXDFA.h"
 #include "wordcatcher/storage/SearchImageWriter.h"
@@ -56,26 +58,76 @@ class Edges {
   std::unordered_set<std::string_view> _edges;
 };
 
+/// The words of the index, by their keys, with the writer's numbers.
+using Words = std::unordered_map<std::string_view, std::uint32_t>;
+
+Words addWords(const TinyCDB& edgeTable, const TinyCDB& finalTable, SearchImageWriter& writer) {
+  constexpr std::string_view kFinalMark = "t";
+  Words words;
+  const Edges edges(edgeTable);
+  TableScan finals(finalTable);
+  while (const auto record = finals.next()) {
+    if (record->value == kFinalMark && !record->key.empty() && !words.contains(record->key) &&
+        edges.leadTo(record->key)) {
+      words.emplace(record->key, writer.addWord(*fromUtf8(record->key)));
+    }
+  }
+  return words;
+}
+
+/// The phrases of the values. The tables only tell which words carry a value. Where these are just
+/// the words of the text at the value's head, that is taken for the phrase; else they stand in the
+/// order in which they were added.
+class Phrases {
+ public:
+  /// Begins the phrase of the next value, which has the next number; returns how many counted words the value's text has.
+  std::uint32_t begin(std::u16string_view value, const Words& words) {
+    Phrase& phrase = _phrases.emplace_back();
+    std::uint32_t counted = 0;
+    _segmenter.start(phraseOf(value));
+    while (const auto token = _segmenter.next()) {
+      counted += static_cast<std::int64_t>(token->size()) > kUncountedWordLength ? 1 : 0;
+      const auto key = toUtf8(toLower(*token));
+      const auto word = key ? words.find(*key) : words.end();
+      phrase.expected.push_back(word == words.end() ? kNoWord : word->second);
+    }
+    return counted;
+  }
+
+  void addWord(SearchImageWriter::Value value, std::uint32_t word) {
+    _phrases[value].found.push_back(word);
+  }
+
+  void addTo(SearchImageWriter& writer) const {
+    for (std::uint32_t value = 0; value < _phrases.size(); ++value) {
+      const Phrase& phrase = _phrases[value];
+      const std::set<std::uint32_t> expected(phrase.expected.begin(), phrase.expected.end());
+      const std::set<std::uint32_t> found(phrase.found.begin(), phrase.found.end());
+      if (expected == found) {
+        writer.addPhrase(phrase.expected, value);
+      } else {
+        writer.addPhrase(std::vector<std::uint32_t>(found.begin(), found.end()), value);
+      }
+    }
+  }
+
+ private:
+  static constexpr std::uint32_t kNoWord = UINT32_MAX;
+  struct Phrase {
+    std::vector<std::uint32_t> expected;
+    std::vector<std::uint32_t> found;
+  };
+  std::vector<Phrase> _phrases;
+  WordSegmenter _segmenter;
+};
+
 }  // namespace
 
 std::shared_ptr<const SearchImage> makeTableImage(const PLXDFA& automaton) {
   constexpr std::uint32_t kNoMode = 0;
-  constexpr std::string_view kFinalMark = "t";
   SearchImageWriter writer(kNoMode);
-  std::unordered_map<std::string_view, std::u16string> words;
-  {
-    const Edges edges(automaton._edgeTable);
-    TableScan finals(automaton._finalTable);
-    while (const auto record = finals.next()) {
-      if (record->value != kFinalMark || record->key.empty() || words.contains(record->key) ||
-          !edges.leadTo(record->key)) {
-        continue;
-      }
-      const auto& word = words.emplace(record->key, *fromUtf8(record->key)).first->second;
-      writer.addWord(word);
-    }
-  }
-  WordSegmenter segmenter;
+  const auto words = addWords(automaton._edgeTable, automaton._finalTable, writer);
+  Phrases phrases;
   std::unordered_map<std::string_view, SearchImageWriter::Value> values;
   TableScan data(automaton._dataTable);
   while (const auto record = data.next()) {
@@ -89,12 +141,12 @@ std::shared_ptr<const SearchImage> makeTableImage(const PLXDFA& automaton) {
       if (!text) {
         continue;
       }
-      const auto counted =
-          static_cast<std::uint32_t>(countedWords(segmenter, phraseOf(std::u16string_view(*text))));
+      const std::uint32_t counted = phrases.begin(*text, words);
       value = values.emplace(record->value, writer.addValue(record->value, counted)).first;
     }
-    writer.addPosting(word->second, value->second);
+    phrases.addWord(value->second, word->second);
   }
+  phrases.addTo(writer);
   return SearchImage::fromBytes(writer.finish());
 }
 

@@ -13,6 +13,7 @@
 #include "wordcatcher/matcher/SpanQuery.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
 #include "wordcatcher/storage/SearchImage.h"
+#include "wordcatcher/text/CodeUnitOrder.h"
 #include "wordcatcher/text/PhraseLength.h"
 #include "wordcatcher/text/Unicode.h"
 
@@ -90,6 +91,7 @@ struct Index::State {
     for (const std::uint32_t value : image->postingsOf(word)) {
       data.emplace_back(image->valueText(value));
     }
+    std::sort(data.begin(), data.end(), &utf16Less);
     return data;
   }
 

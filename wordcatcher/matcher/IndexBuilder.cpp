@@ -52,7 +52,7 @@ struct IndexBuilder::State {
   void add(std::string_view phrase, std::optional<std::string_view> data);
   void cut(std::u16string_view text);
   SearchImageWriter::Value valueOf(std::string_view data, std::string_view phrase);
-  void addWord(std::u16string_view word, Value value);
+  std::uint32_t addWord(std::u16string_view word);
 
   std::string path;
   Options options;
@@ -60,6 +60,7 @@ struct IndexBuilder::State {
   WordSegmenter segmenter;
   KXMetaphone encoder;
   std::vector<std::u16string_view> tokens;
+  std::vector<std::uint32_t> words;
   std::u16string lowered;
 };
 
@@ -77,8 +78,12 @@ void IndexBuilder::State::add(std::string_view phrase, std::optional<std::string
   if (data) {
     value = valueOf(*data, phrase);
   }
+  words.clear();
   for (const auto& word : tokens) {
-    addWord(word, value);
+    words.push_back(addWord(word));
+  }
+  if (value) {
+    writer.addPhrase(words, *value);
   }
   writer.countPhrase();
 }
@@ -110,7 +115,7 @@ SearchImageWriter::Value IndexBuilder::State::valueOf(std::string_view data,
   return writer.addValue(data, static_cast<std::uint32_t>(length));
 }
 
-void IndexBuilder::State::addWord(std::u16string_view word, Value value) {
+std::uint32_t IndexBuilder::State::addWord(std::u16string_view word) {
   if (std::all_of(word.begin(), word.end(), &isAscii)) {
     lowered.assign(word);
     for (char16_t& unit : lowered) {
@@ -119,11 +124,7 @@ void IndexBuilder::State::addWord(std::u16string_view word, Value value) {
   } else {
     lowered = toLower(word);
   }
-  if (value) {
-    writer.addPosting(lowered, *value);
-  } else {
-    writer.addWord(lowered);
-  }
+  return writer.addWord(lowered);
 }
 
 IndexBuilder::IndexBuilder(std::string path) : IndexBuilder(std::move(path), Options()) {}

@@ -4,6 +4,7 @@
 #include <cstdlib>
 #include <utility>
 
+#include "wordcatcher/text/CodeUnitOrder.h"
 #include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher {
@@ -241,8 +242,10 @@ std::vector<ScoredValue> SpanQuery::scored() const {
       records.push_back({phrase.value, distance});
     }
   }
-  std::sort(records.begin(), records.end(), [](const ScoredValue& a, const ScoredValue& b) {
-    return a.distance != b.distance ? a.distance < b.distance : a.value < b.value;
+  std::sort(records.begin(), records.end(), [this](const ScoredValue& a, const ScoredValue& b) {
+    return a.distance != b.distance
+               ? a.distance < b.distance
+               : utf16Less(_image.valueText(a.value), _image.valueText(b.value));
   });
   return records;
 }

@@ -33,8 +33,7 @@ struct ScoredValue {
 /// One span query over the words of an image: looks up each word of a text, intersects the values
 /// that the words bring, and scores what is left. Used once.
 ///
-/// Values are numbers in ascending order of their strings, so that sets are sorted lists, and the
-/// order of results is that of the numbers. A word costs its search and the posting lists of its
+/// Values are numbers, so that sets are sorted lists. A word costs its search and the posting lists of its
 /// hits; memory is 16 bytes a posting of two words at a time, and two bytes a value of the image
 /// where posting lists are long. Arithmetic on scores wraps around: the host may set the running
 /// counter to any value. One thread at a time; throws Error (damaged) as the image does.

@@ -189,6 +189,9 @@ void SearchImage::bind(const std::string& name) {
   _valueOffsets = sectionOf<std::uint64_t>(SectionKind::valueOffsets);
   _valueText = sectionOf<char>(SectionKind::valueText);
   _countedWords = sectionOf<std::uint32_t>(SectionKind::countedWords);
+  _phraseOffsets = sectionOf<std::uint32_t>(SectionKind::phraseOffsets);
+  _phraseWords = sectionOf<std::uint32_t>(SectionKind::phraseWords);
+  _phraseClasses = sectionOf<image::PhraseClass>(SectionKind::phraseClasses);
   const std::size_t words = _wordCount;
   const std::size_t values = _valueCount;
   if (_labels.empty() || _labels.size() > image::kMaxLabels || _wordOffsets.size() != words + 1 ||
@@ -196,7 +199,8 @@ void SearchImage::bind(const std::string& name) {
       (!_forward.order.empty() && _forward.order.size() != words) ||
       _backward.order.size() != words || _forward.slots.empty() || _backward.slots.empty() ||
       _forward.slots.size() > TreeSlot::kIndex || _backward.slots.size() > TreeSlot::kIndex ||
-      _valueOffsets.size() != values + 1 || _countedWords.size() != values) {
+      _valueOffsets.size() != values + 1 || _countedWords.size() != values ||
+      _phraseOffsets.size() != values + 1 || _phraseClasses.size() > values) {
     throwDamaged("its sections do not have the lengths that its counts ask for");
   }
 }

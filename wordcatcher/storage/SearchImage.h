@@ -87,6 +87,29 @@ class SearchImage {
   std::string_view valueText(std::uint32_t value) const;
   std::uint32_t countedWordsOf(std::uint32_t value) const;
 
+  /// The phrases of a value, one after the other, each the words of a phrase in its order, the last
+  /// flagged with image::kPhraseEnd. A word may be anything in a damaged image. Throws Error
+  /// (damaged) for a value that is not there.
+  std::span<const std::uint32_t> phrasesOf(std::uint32_t value) const {
+    if (value >= _valueCount) {
+      throwDamaged("it refers to a data string that is not there");
+    }
+    const std::uint32_t begin = _phraseOffsets[value];
+    const std::uint32_t end = _phraseOffsets[value + 1];
+    if (begin > end || end > _phraseWords.size()) {
+      throwDamaged("a phrase lies outside its section");
+    }
+    return _phraseWords.subspan(begin, end - begin);
+  }
+  void prefetchPhrasesOf(std::uint32_t value) const noexcept {
+    if (value < _valueCount) {
+      __builtin_prefetch(&_phraseOffsets[value]);
+    }
+  }
+
+  /// The values by the lengths of their phrases: ascending, not empty unless there are no values.
+  std::span<const image::PhraseClass> phraseClasses() const noexcept { return _phraseClasses; }
+
   /// Checks everything: that the sections fill the file, checksums, orders, ranges, that both trees
   /// hold exactly the words. Throws Error (damaged) that says what is wrong. Linear in the file,
   /// whatever its bytes are.
@@ -107,6 +130,8 @@ class SearchImage {
   void verifyLabels() const;
   void verifyWords() const;
   void verifyValues() const;
+  image::PhraseShape verifyPhrases(std::uint32_t value) const;
+  void verifyPostings() const;
 
   std::vector<std::byte> _copy;
   void* _mapping = nullptr;
@@ -128,6 +153,9 @@ class SearchImage {
   std::span<const std::uint64_t> _valueOffsets;
   std::span<const char> _valueText;
   std::span<const std::uint32_t> _countedWords;
+  std::span<const std::uint32_t> _phraseOffsets;
+  std::span<const std::uint32_t> _phraseWords;
+  std::span<const image::PhraseClass> _phraseClasses;
 };
 
 }  // namespace wordcatcher

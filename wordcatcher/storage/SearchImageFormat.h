@@ -6,6 +6,7 @@
 
 #include <array>
 #include <bit>
+#include <compare>
 #include <cstddef>
 #include <cstdint>
 
@@ -15,7 +16,7 @@ static_assert(std::endian::native == std::endian::little,
               "Images are mapped as they stand: a big-endian machine needs a reader of its own.");
 
 inline constexpr std::array<char, 8> kMagic = {'W', 'C', 'I', 'M', 'A', 'G', 'E', '\0'};
-inline constexpr std::uint32_t kVersion = 1;
+inline constexpr std::uint32_t kVersion = 2;
 inline constexpr std::uint32_t kByteOrderMark = 0x01020304;
 inline constexpr std::size_t kSectionAlignment = 64;
 
@@ -30,10 +31,13 @@ enum class SectionKind : std::uint32_t {
   postingOffsets = 8,  // u64, words + 1: where each word's posting list begins in postings
   postings = 9,        // u32: the values of each word, ascending
   valueOffsets = 10,   // u64, values + 1: where each value begins in valueText
-  valueText = 11,      // UTF-8: the data strings, ascending by UTF-16 code units
+  valueText = 11,      // UTF-8: the data strings, in the order of PhraseShape
   countedWords = 12,   // u32: the counted words of each value's phrase
+  phraseOffsets = 13,  // u32, values + 1: where each value's phrases begin in phraseWords
+  phraseWords = 14,    // u32: the phrases of each value, as words in the phrase's order
+  phraseClasses = 15,  // PhraseClass: where values with phrases of other lengths begin
 };
-inline constexpr std::size_t kSectionKinds = 12;
+inline constexpr std::size_t kSectionKinds = 15;
 inline constexpr std::uint32_t kLastMode = 2;
 inline constexpr std::size_t kMaxLabels = 0x10000;  // label 0, and every code unit but U+0000
 
@@ -65,6 +69,32 @@ static_assert(sizeof(Section) == 32);
 inline constexpr std::size_t headerBytes(std::size_t sections) {
   return sizeof(Header) + sections * sizeof(Section) + sizeof(std::uint64_t);
 }
+
+/// Flags the last word of a phrase in phraseWords.
+inline constexpr std::uint32_t kPhraseEnd = 0x80000000U;
+
+/// Values are numbered by the shape of their phrases, and equal shapes by their text in UTF-16 code
+/// units: so every posting list, which ascends by value, begins with the shortest phrases. Each
+/// figure is at most kShapeCap, which stands for itself and all above. A value without words (a
+/// phrase in which there is nothing to find) has the shape 0, 0, 0.
+struct PhraseShape {
+  std::uint16_t fewestWords = 0;  // of the value's phrase with the fewest words
+  std::uint16_t mostWords = 0;    // of the one with the most
+  std::uint16_t units = 0;        // the least code units of the words of one of the former
+
+  friend auto operator<=>(const PhraseShape&, const PhraseShape&) = default;
+};
+inline constexpr std::uint32_t kShapeCap = 0xFFFF;
+
+/// The values from `firstValue` on, up to the next class, have these shapes.
+struct PhraseClass {
+  std::uint32_t firstValue = 0;
+  std::uint16_t fewestWords = 0;
+  std::uint16_t mostWords = 0;
+
+  friend bool operator==(const PhraseClass&, const PhraseClass&) = default;
+};
+static_assert(sizeof(PhraseClass) == 8);
 
 /// One place of a tree: the edge that leads to it, and what stands behind it. The root is slot 0;
 /// the children of a place stand together, ascending by label, behind their parent.

@@ -4,12 +4,12 @@
 
 #include <algorithm>
 #include <bitset>
-#include <optional>
 #include <utility>
 
 #define XXH_INLINE_ALL
 #include <xxhash.h>
 
+#include "wordcatcher/storage/PhraseWords.h"
 #include "wordcatcher/storage/SearchImage.h"
 #include "wordcatcher/text/CodeUnitOrder.h"
 #include "wordcatcher/text/Unicode.h"
@@ -174,6 +174,7 @@ void SearchImage::verify() const {
   TreeVerifier(*this, _forward, false).verify();
   TreeVerifier(*this, _backward, true).verify();
   verifyValues();
+  verifyPostings();
 }
 
 /// The sections have their checksums and, with less than an alignment of zeros before each, fill
@@ -229,12 +230,6 @@ void SearchImage::verifyWords() const {
       throwDamaged("its words are out of order");
     }
     previous = std::move(text);
-    const auto postings = postingsOf(word);
-    if (std::adjacent_find(postings.begin(), postings.end(), std::greater_equal<>()) !=
-            postings.end() ||
-        (!postings.empty() && postings.back() >= _valueCount)) {
-      throwDamaged("a posting list is out of order");
-    }
   }
 }
 
@@ -242,13 +237,72 @@ void SearchImage::verifyValues() const {
   if (_valueOffsets.front() != 0 || _valueOffsets.back() != _valueText.size()) {
     throwDamaged("its data strings do not fill their section");
   }
-  std::optional<std::string_view> previous;
+  if (_phraseOffsets.front() != 0 || _phraseOffsets.back() != _phraseWords.size()) {
+    throwDamaged("its phrases do not fill their section");
+  }
+  std::string_view previous;
+  image::PhraseShape previousShape;
+  std::size_t classes = 0;
   for (std::uint32_t value = 0; value < _valueCount; ++value) {
     const std::string_view text = valueText(value);
-    if (!fromUtf8(text) || (previous && !utf16Less(*previous, text))) {
+    const auto shape = verifyPhrases(value);
+    if (!fromUtf8(text) ||
+        (value > 0 && (shape < previousShape ||
+                       (shape == previousShape && !utf16Less(previous, text))))) {
       throwDamaged("its data strings are out of order or not UTF-8");
     }
+    if (value == 0 || shape.fewestWords != previousShape.fewestWords ||
+        shape.mostWords != previousShape.mostWords) {
+      const image::PhraseClass expected = {value, shape.fewestWords, shape.mostWords};
+      if (classes == _phraseClasses.size() || _phraseClasses[classes++] != expected) {
+        throwDamaged("its classes of phrases are not those of its phrases");
+      }
+    }
     previous = text;
+    previousShape = shape;
+  }
+  if (classes != _phraseClasses.size()) {
+    throwDamaged("its classes of phrases are not those of its phrases");
+  }
+}
+
+/// A value's phrases ascend, each ends, and all their words are there.
+image::PhraseShape SearchImage::verifyPhrases(std::uint32_t value) const {
+  const auto all = phrasesOf(value);
+  std::span<const std::uint32_t> previous;
+  for (auto rest = all; !rest.empty(); rest = rest.subspan(previous.size())) {
+    const auto phrase = image::firstPhrase(rest);
+    const bool ascends = std::lexicographical_compare(previous.begin(), previous.end(),
+                                                      phrase.begin(), phrase.end());
+    if (!ascends || (phrase.back() & image::kPhraseEnd) == 0) {
+      throwDamaged("its phrases are out of order");
+    }
+    previous = phrase;
+  }
+  return image::shapeOf(all, [this](std::uint32_t word) { return labelsOf(word).size(); });
+}
+
+/// Each word has just the values in whose phrases it stands.
+void SearchImage::verifyPostings() const {
+  const auto require = [this](bool holds) {
+    if (!holds) {
+      throwDamaged("its posting lists are not those of its phrases");
+    }
+  };
+  std::vector<std::uint32_t> read(_wordCount);
+  for (std::uint32_t value = 0; value < _valueCount; ++value) {
+    for (const std::uint32_t flagged : phrasesOf(value)) {
+      const std::uint32_t word = flagged & ~image::kPhraseEnd;
+      const auto postings = postingsOf(word);
+      if (read[word] > 0 && postings[read[word] - 1] == value) {
+        continue;
+      }
+      require(read[word] < postings.size() && postings[read[word]] == value);
+      ++read[word];
+    }
+  }
+  for (std::uint32_t word = 0; word < _wordCount; ++word) {
+    require(read[word] == postingsOf(word).size());
   }
 }
 

@@ -6,12 +6,13 @@
 #include <numeric>
 #include <random>
 #include <string>
+#include <utility>
 
 #define XXH_INLINE_ALL
 #include <xxhash.h>
 
 #include "wordcatcher/Error.h"
-#include "wordcatcher/storage/SearchImageFormat.h"
+#include "wordcatcher/storage/PhraseWords.h"
 #include "wordcatcher/text/CodeUnitOrder.h"
 
 namespace wordcatcher {
@@ -27,6 +28,9 @@ constexpr std::uint32_t kWordsALeaf = 2;
 
 // Word offsets have 32 bits.
 constexpr std::uint64_t kMaxWordUnits = std::numeric_limits<std::uint32_t>::max();
+
+// And so have the offsets of phrases.
+constexpr std::uint64_t kMaxPhraseWords = std::numeric_limits<std::uint32_t>::max();
 
 [[noreturn]] void tooMany(const char* what) {
   throw Error(ErrorCode::tooLarge,
@@ -292,6 +296,40 @@ class Assembler {
   std::vector<image::Section> _sections;
 };
 
+/// How much room a vector should have for `more` elements: at least twice as much as before, so that
+/// adding stays linear.
+std::size_t roomFor(const std::vector<std::uint32_t>& elements, std::size_t more) {
+  const std::size_t needed = elements.size() + more;
+  return needed <= elements.capacity() ? 0 : std::max(needed, 2 * elements.capacity());
+}
+
+/// Calls `use(value, words)` for each phrase of a writer's list.
+template <typename Use>
+void forEachPhrase(std::span<const std::uint32_t> stream, Use use) {
+  for (std::size_t begin = 0; begin < stream.size();) {
+    const std::size_t end = begin + 1 + image::firstPhrase(stream.subspan(begin + 1)).size();
+    use(stream[begin], stream.subspan(begin + 1, end - begin - 1));
+    begin = end;
+  }
+}
+
+/// A value's phrases, ascending by their words, each once.
+std::vector<std::uint32_t> distinctPhrases(std::span<const std::uint32_t> phrases) {
+  std::vector<std::vector<std::uint32_t>> list;
+  while (!phrases.empty()) {
+    const auto phrase = image::firstPhrase(phrases);
+    list.emplace_back(phrase.begin(), phrase.end());
+    phrases = phrases.subspan(phrase.size());
+  }
+  std::sort(list.begin(), list.end());
+  list.erase(std::unique(list.begin(), list.end()), list.end());
+  std::vector<std::uint32_t> kept;
+  for (const auto& phrase : list) {
+    kept.insert(kept.end(), phrase.begin(), phrase.end());
+  }
+  return kept;
+}
+
 std::array<std::uint64_t, 2> randomGeneration() {
   std::random_device source;
   const auto word = [&source] { return (std::uint64_t{source()} << 32U) | source(); };
@@ -319,14 +357,14 @@ SearchImageWriter::Value SearchImageWriter::addValue(std::string_view text,
   if (added) {
     _countedWords.push_back(countedWords);
     if (value >= _limit) {
-      rollBack({_words.size(), value, _postings.size(), _phrases});
+      rollBack({_words.size(), value, _phraseWords.size(), _phrases});
       tooMany("data strings");
     }
   }
   return value;
 }
 
-std::uint32_t SearchImageWriter::wordId(std::u16string_view word) {
+std::uint32_t SearchImageWriter::addWord(std::u16string_view word) {
   const auto [id, added] = _words.insert(word);
   if (added && (id >= _limit || _words.characters() > kMaxWordUnits)) {
     _words.truncate(id);
@@ -335,21 +373,45 @@ std::uint32_t SearchImageWriter::wordId(std::u16string_view word) {
   return id;
 }
 
-void SearchImageWriter::addWord(std::u16string_view word) { wordId(word); }
+void SearchImageWriter::addPhrase(std::span<const std::uint32_t> words, Value value) {
+  if (words.empty()) {
+    return;
+  }
+  if (words.size() >= kMaxPhraseWords - _phraseWords.size()) {
+    tooMany("words in its phrases");
+  }
+  _phraseWords.reserve(roomFor(_phraseWords, words.size() + 1));
+  _phraseWords.push_back(value);
+  _phraseWords.insert(_phraseWords.end(), words.begin(), words.end());
+  _phraseWords.back() |= image::kPhraseEnd;
+}
 
 void SearchImageWriter::addPosting(std::u16string_view word, Value value) {
-  _postings.emplace_back(wordId(word), value);
+  const std::uint32_t number = addWord(word);
+  addPhrase({&number, 1}, value);
 }
 
 void SearchImageWriter::rollBack(const Mark& mark) noexcept {
   _words.truncate(mark.words);
   _values.truncate(mark.values);
   _countedWords.resize(mark.values);
-  _postings.resize(mark.postings);
+  _phraseWords.resize(mark.phraseWords);
   _phrases = mark.phrases;
 }
 
 SearchImageWriter::Content SearchImageWriter::content() const { return Content(*this); }
+
+/// The phrases by the writer's numbers of their values, with the words' new numbers.
+struct SearchImageWriter::Content::Phrases {
+  std::vector<std::uint32_t> offsets;  // values + 1
+  std::vector<std::uint32_t> words;
+  std::vector<std::uint32_t> sizes;  // how much of each value's room is used
+  std::vector<image::PhraseShape> shapes;
+
+  std::span<const std::uint32_t> of(Value value) const {
+    return std::span(words).subspan(offsets[value], sizes[value]);
+  }
+};
 
 SearchImageWriter::Content::Content(const SearchImageWriter& writer) : _writer(writer) {
   const auto& words = writer._words;
@@ -359,42 +421,102 @@ SearchImageWriter::Content::Content(const SearchImageWriter& writer) : _writer(w
         return sortingKey<16>(words[word].begin(), words[word].end(), unitOf);
       },
       [&words](std::uint32_t a, std::uint32_t b) { return words[a] < words[b]; });
-  const auto& values = writer._values;
-  _values = sortedOrder(
-      values.size(),
-      [&values](Value value) {
-        return sortingKey<8>(values[value].begin(), values[value].end(), utf16Rank);
-      },
-      [&values](Value a, Value b) { return utf16Less(values[a], values[b]); });
+  numberValues(gatherPhrases());
   gatherPostings();
 }
 
-/// Deals the postings out to their words, sorts each word's, and closes the gaps that repeated ones
-/// leave.
-void SearchImageWriter::Content::gatherPostings() {
+/// Deals the phrases out to their values, and leaves out repeated ones.
+SearchImageWriter::Content::Phrases SearchImageWriter::Content::gatherPhrases() const {
   const auto placeOfWord = placesOf(_words);
-  const auto placeOfValue = placesOf(_values);
+  const auto& stream = _writer._phraseWords;
+  const std::uint32_t values = _writer._values.size();
+  Phrases phrases;
+  phrases.offsets.resize(std::size_t{values} + 1);
+  std::vector<std::uint32_t> counts(values);
+  forEachPhrase(stream, [&](Value value, std::span<const std::uint32_t> words) {
+    phrases.offsets[value + 1] += static_cast<std::uint32_t>(words.size());
+    ++counts[value];
+  });
+  std::partial_sum(phrases.offsets.begin(), phrases.offsets.end(), phrases.offsets.begin());
+  phrases.words.resize(phrases.offsets.back());
+  phrases.sizes.resize(values);
+  forEachPhrase(stream, [&](Value value, std::span<const std::uint32_t> words) {
+    std::uint32_t& size = phrases.sizes[value];
+    for (const std::uint32_t word : words) {
+      phrases.words[phrases.offsets[value] + size++] =
+          placeOfWord[word & ~image::kPhraseEnd] | (word & image::kPhraseEnd);
+    }
+  });
+  phrases.shapes.reserve(values);
+  for (Value value = 0; value < values; ++value) {
+    if (counts[value] > 1) {
+      const auto all = phrases.of(value);
+      const auto kept = distinctPhrases(all);
+      std::copy(kept.begin(), kept.end(), phrases.words.begin() + phrases.offsets[value]);
+      phrases.sizes[value] = static_cast<std::uint32_t>(kept.size());
+    }
+    phrases.shapes.push_back(image::shapeOf(phrases.of(value), [this](std::uint32_t word) {
+      return this->word(word).size();
+    }));
+  }
+  return phrases;
+}
+
+/// Sorts the values by shape and text, and lays down their phrases in that order.
+void SearchImageWriter::Content::numberValues(const Phrases& phrases) {
+  const auto& values = _writer._values;
+  const auto& shapes = phrases.shapes;
+  _values = sortedOrder(
+      values.size(),
+      [&](Value value) {
+        const auto& shape = shapes[value];
+        return std::uint64_t{shape.fewestWords} << 48 | std::uint64_t{shape.mostWords} << 32 |
+               std::uint64_t{shape.units} << 16 |
+               sortingKey<8>(values[value].begin(), values[value].end(), utf16Rank) >> 48;
+      },
+      [&](Value a, Value b) {
+        return shapes[a] != shapes[b] ? shapes[a] < shapes[b] : utf16Less(values[a], values[b]);
+      });
+  _phraseOffsets.reserve(_values.size() + 1);
+  _phraseOffsets.push_back(0);
+  for (const Value value : _values) {
+    const auto words = phrases.of(value);
+    _phraseWords.insert(_phraseWords.end(), words.begin(), words.end());
+    const image::PhraseClass own = {static_cast<std::uint32_t>(_phraseOffsets.size() - 1),
+                                    shapes[value].fewestWords, shapes[value].mostWords};
+    if (_classes.empty() || _classes.back().fewestWords != own.fewestWords ||
+        _classes.back().mostWords != own.mostWords) {
+      _classes.push_back(own);
+    }
+    _phraseOffsets.push_back(static_cast<std::uint32_t>(_phraseWords.size()));
+  }
+}
+
+/// Deals the values out to the words of their phrases: one after the other, so that each list
+/// ascends, and a value that repeats a word finds itself last in the word's list.
+void SearchImageWriter::Content::gatherPostings() {
+  const auto forEachWord = [this](auto use) {
+    for (std::uint32_t value = 0; value < _values.size(); ++value) {
+      for (std::uint32_t i = _phraseOffsets[value]; i < _phraseOffsets[value + 1]; ++i) {
+        use(_phraseWords[i] & ~image::kPhraseEnd, value);
+      }
+    }
+  };
+  constexpr std::uint32_t kNone = std::numeric_limits<std::uint32_t>::max();
+  std::vector<std::uint32_t> last(_words.size(), kNone);
   _offsets.resize(_words.size() + 1);
-  for (const auto& [word, value] : _writer._postings) {
-    ++_offsets[placeOfWord[word] + 1];
-  }
+  forEachWord([&](std::uint32_t word, std::uint32_t value) {
+    _offsets[word + 1] += std::exchange(last[word], value) != value ? 1 : 0;
+  });
   std::partial_sum(_offsets.begin(), _offsets.end(), _offsets.begin());
-  _postings.resize(_writer._postings.size());
+  _postings.resize(_offsets.back());
   std::vector<std::uint64_t> next(_offsets.begin(), _offsets.end() - 1);
-  for (const auto& [word, value] : _writer._postings) {
-    _postings[next[placeOfWord[word]]++] = placeOfValue[value];
-  }
-  auto kept = _postings.begin();
-  for (std::size_t word = 0; word < _words.size(); ++word) {
-    const auto begin = _postings.begin() + static_cast<std::ptrdiff_t>(_offsets[word]);
-    const auto end = _postings.begin() + static_cast<std::ptrdiff_t>(_offsets[word + 1]);
-    std::sort(begin, end);
-    _offsets[word] = static_cast<std::uint64_t>(kept - _postings.begin());
-    const auto last = std::unique(begin, end);
-    kept = kept == begin ? last : std::copy(begin, last, kept);
-  }
-  _offsets.back() = static_cast<std::uint64_t>(kept - _postings.begin());
-  _postings.erase(kept, _postings.end());
+  std::fill(last.begin(), last.end(), kNone);
+  forEachWord([&](std::uint32_t word, std::uint32_t value) {
+    if (std::exchange(last[word], value) != value) {
+      _postings[next[word]++] = value;
+    }
+  });
 }
 
 std::vector<std::byte> SearchImageWriter::finish() const {
@@ -422,6 +544,9 @@ std::vector<std::byte> SearchImageWriter::finish() const {
                       sizeof(TreeSlot) * (forward.slots().size() + backward.slots().size()) +
                       sizeof(std::uint32_t) * (labelled.offsets().size() + 2U * wordCount() +
                                                content.postings().size() + countedWords.size()) +
+                      sizeof(std::uint32_t) *
+                          (content.phraseOffsets().size() + content.phraseWords().size()) +
+                      sizeof(image::PhraseClass) * content.phraseClasses().size() +
                       sizeof(std::uint64_t) *
                           (content.postingOffsets().size() + valueOffsets.size()) +
                       valueTexts.size());
@@ -438,6 +563,9 @@ std::vector<std::byte> SearchImageWriter::finish() const {
   assembler.add(SectionKind::valueOffsets, valueOffsets);
   assembler.add(SectionKind::valueText, valueTexts);
   assembler.add(SectionKind::countedWords, countedWords);
+  assembler.add(SectionKind::phraseOffsets, content.phraseOffsets());
+  assembler.add(SectionKind::phraseWords, content.phraseWords());
+  assembler.add(SectionKind::phraseClasses, content.phraseClasses());
 
   image::Header header = {};
   header.generation = randomGeneration();

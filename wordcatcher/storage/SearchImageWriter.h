@@ -6,7 +6,6 @@
 #include <optional>
 #include <span>
 #include <string_view>
-#include <utility>
 #include <vector>
 
 #include "wordcatcher/storage/SearchImageFormat.h"
@@ -14,9 +13,10 @@
 
 namespace wordcatcher {
 
-/// Collects words and the values (data strings) that they carry, and makes the bytes of a search
-/// image of them. Memory: the distinct words, 8 bytes a posting, the distinct values; while the
-/// image is made, about twice the image beside them. One thread at a time.
+/// Collects words, and phrases of them with their values (data strings), and makes the bytes of a
+/// search image of them. Memory: the distinct words, 4 bytes a word of a phrase and 4 a phrase, the
+/// distinct values; while the image is made, about twice the image beside them. One thread at a
+/// time.
 class SearchImageWriter {
  public:
   /// An identifier of a value in this writer.
@@ -36,10 +36,17 @@ class SearchImageWriter {
   /// gives the same value. Throws Error (tooLarge) beyond the limit.
   Value addValue(std::string_view text, std::uint32_t countedWords);
 
-  /// Adds a word, or more values to it. The same posting twice counts once. The word must not be
-  /// empty, or hold U+0000. Throws Error (tooLarge) beyond the limit, or 2^32 - 1 code units of all
-  /// words.
-  void addWord(std::u16string_view word);
+  /// Adds a word; the same one has the same number, which is this writer's own. The word must not
+  /// be empty, or hold U+0000. Throws Error (tooLarge) beyond the limit, or 2^32 - 1 code units of
+  /// all words.
+  std::uint32_t addWord(std::u16string_view word);
+
+  /// Adds a phrase of these words, in its order: each carries the value. The same phrase with the
+  /// same value twice counts once; no words at all add nothing. Throws Error (tooLarge) for 2^32
+  /// words of all phrases.
+  void addPhrase(std::span<const std::uint32_t> words, Value value);
+
+  /// Adds a phrase of one word.
   void addPosting(std::u16string_view word, Value value);
 
   /// Counts one phrase, for the image's own figures.
@@ -53,10 +60,12 @@ class SearchImageWriter {
   struct Mark {
     std::uint32_t words;
     std::uint32_t values;
-    std::size_t postings;
+    std::size_t phraseWords;
     std::uint64_t phrases;
   };
-  Mark mark() const noexcept { return {_words.size(), _values.size(), _postings.size(), _phrases}; }
+  Mark mark() const noexcept {
+    return {_words.size(), _values.size(), _phraseWords.size(), _phrases};
+  }
   void rollBack(const Mark& mark) noexcept;
 
   /// Everything that was added, in the order of the image.
@@ -68,19 +77,17 @@ class SearchImageWriter {
   std::vector<std::byte> finish() const;
 
  private:
-  std::uint32_t wordId(std::u16string_view word);
-
   std::uint32_t _mode;
   std::uint32_t _limit;
   std::uint64_t _phrases = 0;
   StringPool<char16_t> _words;
-  std::vector<std::pair<std::uint32_t, Value>> _postings;  // a word's number, a value
+  std::vector<std::uint32_t> _phraseWords;  // of each phrase: its value, its words, the last flagged
   StringPool<char> _values;
   std::vector<std::uint32_t> _countedWords;
 };
 
-/// What a writer holds, numbered anew: words ascending by code units, values by the code units of
-/// their UTF-16 forms. Refers to the writer, which must not change meanwhile.
+/// What a writer holds, numbered anew: words ascending by code units, values by the shapes of their
+/// phrases, then the code units of their UTF-16 forms. Refers to the writer, which must not change meanwhile.
 class SearchImageWriter::Content {
  public:
   explicit Content(const SearchImageWriter& writer);
@@ -107,7 +114,16 @@ class SearchImageWriter::Content {
   const std::vector<std::uint32_t>& postings() const noexcept { return _postings; }
   const std::vector<std::uint64_t>& postingOffsets() const noexcept { return _offsets; }
 
+  /// The phrases of the values one after the other, as in the image, where each value's begin, and
+  /// the last one's end; and the classes of values.
+  const std::vector<std::uint32_t>& phraseWords() const noexcept { return _phraseWords; }
+  const std::vector<std::uint32_t>& phraseOffsets() const noexcept { return _phraseOffsets; }
+  const std::vector<image::PhraseClass>& phraseClasses() const noexcept { return _classes; }
+
  private:
+  struct Phrases;
+  Phrases gatherPhrases() const;
+  void numberValues(const Phrases& phrases);
   void gatherPostings();
 
   const SearchImageWriter& _writer;
@@ -115,6 +131,9 @@ class SearchImageWriter::Content {
   std::vector<std::uint32_t> _values;
   std::vector<std::uint64_t> _offsets;
   std::vector<std::uint32_t> _postings;
+  std::vector<std::uint32_t> _phraseOffsets;
+  std::vector<std::uint32_t> _phraseWords;
+  std::vector<image::PhraseClass> _classes;
 };
 
 }  // namespace wordcatcher

@@ -84,10 +84,9 @@ bool holdsValues(PLXDFA& tables, std::u16string_view word,
   }
   const auto values = tables.dataFor(word);
   return values.size() == postings.size() &&
-         std::equal(values.begin(), values.end(), postings.begin(),
-                    [&content](const std::u16string& value, std::uint32_t posting) {
-                      return value == textOf(content.value(posting));
-                    });
+         std::all_of(postings.begin(), postings.end(), [&](std::uint32_t posting) {
+           return values.contains(textOf(content.value(posting)));
+         });
 }
 
 void check(PLXDFA& tables, const std::string& prefix, const SearchImageWriter::Content& content) {
