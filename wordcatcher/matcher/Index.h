@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "wordcatcher/Export.h"
+#include "wordcatcher/matcher/Find.h"
 #include "wordcatcher/matcher/IndexBuilder.h"
 
 namespace wordcatcher {
@@ -86,6 +87,40 @@ class WORDCATCHER_EXPORT Index {
   /// Basic Multilingual Plane are found as well, each such character counting as two code units.
   /// Throws Error (badInput) for a word that is not UTF-8 or a distance above 16.
   SearchResult search(std::string_view word, std::int64_t maxDistance) const;
+
+  /// The phrases that a text holds, wholly or in part, the best one first.
+  ///
+  /// Every phrase is judged by itself. Its cost is the edits of its words, and 2 for each of its
+  /// words that the text lacks, and 2 for each word of the text that it leaves over, over the best
+  /// one-to-one pairing of the words of both; words are paired within the edit limits of the text's
+  /// word. Two neighbouring words that the other side writes as one, with the same letters, are
+  /// paired with it for one edit. A phrase is found when at least one of its words is paired.
+  ///
+  /// The order: the smaller cost; then more words of the phrase paired; then more of these without
+  /// edits; then fewer breaks (pairs that do not follow the one before them directly, in the phrase
+  /// and in the text); then the rarer paired words (fewer phrases under them in all); then the
+  /// shorter phrase (words, then code units); then the value by UTF-16 code units. Of several
+  /// best pairings the one with the fewest breaks counts, then the one that takes the text's
+  /// words earliest. A value that was stored with several phrases is found once, by the best.
+  ///
+  /// In an index of phonetic codes the codes are compared exactly; in one of whole texts the text
+  /// is one word, and so is each phrase.
+  ///
+  /// Ranges are of the text as given, in bytes, half-open. Words are those of Unicode's rules; at
+  /// most Options::maxQueryWords are looked at, a word of more than Options::maxWordUnits is not
+  /// looked up, and a budget of postings bounds the time. Throws Error (badInput) for edit limits
+  /// that are too large.
+  FindResult find(std::string_view text) const;
+  FindResult find(std::string_view text, const FindOptions& options) const;
+
+  /// Why a value has its cost for a text, or why find() does not list it. Linear in the index's
+  /// values. Throws as find() does.
+  FindExplanation explain(std::string_view text, std::string_view value) const;
+  FindExplanation explain(std::string_view text, std::string_view value,
+                          const FindOptions& options) const;
+
+  /// The same for the distance of query(), step by step.
+  QueryExplanation explainQuery(std::string_view text, std::string_view value) const;
 
   struct Info {
     MatchingMode mode;

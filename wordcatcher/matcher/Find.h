@@ -1,0 +1,147 @@
+#ifndef WORDCATCHER_MATCHER_FIND_H
+#define WORDCATCHER_MATCHER_FIND_H
+
+#include <cstddef>
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "wordcatcher/Export.h"
+
+namespace wordcatcher {
+
+/// How many edits a word of the text may be away from a stored word, by its length in UTF-16 code
+/// units when lower-cased. An edit is one code unit replaced, inserted or left out, the first one
+/// as any other. Words that hold a digit are only found exactly, as stored words that do. A limit
+/// above kMaxEdits is an error (badInput).
+struct EditLimits {
+  static constexpr std::uint32_t kMaxEdits = 3;
+
+  std::size_t shortLength = 2;    ///< a word of up to so many code units is short
+  std::size_t mediumLength = 5;   ///< a longer one of up to so many is medium; all others are long
+  std::uint32_t shortEdits = 0;   ///< edits of a short word
+  std::uint32_t mediumEdits = 1;  ///< of a medium one
+  std::uint32_t longEdits = 2;    ///< of a long one
+  std::uint32_t wholeTextEdits = 3;  ///< of a whole text, in an index of whole texts
+
+  friend bool operator==(const EditLimits&, const EditLimits&) = default;
+};
+
+/// What becomes of matches whose ranges in the text overlap.
+enum class Overlaps : std::uint32_t {
+  all = 0,      ///< every match
+  noSub = 1,    ///< no match whose range lies within the larger range of another match
+  longest = 2,  ///< of matches that overlap those with the longest range; then the first in order
+};
+
+/// What Index::find looks for and how much of it.
+struct FindOptions {
+  std::size_t limit = 10;                ///< matches at the most: the first ones of all
+  std::optional<std::uint64_t> maxCost;  ///< the greatest cost of a match; none: any cost
+  std::size_t minWords = 1;              ///< words of a phrase that the text must hold; at least 1
+  EditLimits edits;
+  bool transpositions = true;  ///< whether two neighbours swapped are one edit, not two
+  Overlaps overlaps = Overlaps::all;
+
+  /// How many postings (phrases under a word) are looked at, all words together; what lies beyond
+  /// is not found, and the result says so.
+  std::uint64_t maxPostings = 2'000'000;
+};
+
+/// A word of a phrase found in a text, or two in one piece.
+struct FoundWord {
+  std::size_t begin;    ///< where it begins in the text as the host gave it, in bytes
+  std::size_t end;      ///< where it ends: the byte behind its last one
+  std::string word;     ///< as stored; two words that the text joins stand with a space between
+  std::uint32_t edits;  ///< between the two
+
+  friend bool operator==(const FoundWord&, const FoundWord&) = default;
+};
+
+/// A phrase found in a text.
+struct FoundPhrase {
+  std::string value;   ///< its data string
+  std::uint64_t cost;  ///< see Index::find
+  std::size_t begin;   ///< the range of the text that spans the hits, in bytes
+  std::size_t end;
+  std::vector<FoundWord> hits;  ///< in the order of the text
+
+  friend bool operator==(const FoundPhrase&, const FoundPhrase&) = default;
+};
+
+/// What Index::find found.
+struct FindResult {
+  std::vector<FoundPhrase> matches;  ///< the best one first
+  bool truncated = false;            ///< whether a budget cut something off
+
+  friend bool operator==(const FindResult&, const FindResult&) = default;
+};
+
+/// Why a phrase has its cost for a text, or why it is not found; see Index::explain.
+struct WORDCATCHER_EXPORT FindExplanation {
+  /// A word of the phrase beside a word of the text.
+  struct Comparison {
+    std::string word;     ///< of the phrase
+    std::uint64_t edits;  ///< between the two
+    bool within;          ///< whether the two may be paired
+  };
+
+  /// A word of the text.
+  struct TextWord {
+    std::size_t begin;  ///< in the text, in bytes
+    std::size_t end;
+    std::string word;                     ///< as it is looked up
+    std::uint32_t limit;                  ///< edits that it may have
+    std::vector<Comparison> comparisons;  ///< with each word of the phrase, in its order
+  };
+
+  std::string text;   ///< the host's
+  std::string value;  ///< the host's
+
+  bool isStored = false;                ///< whether the index holds the value
+  bool isFound = false;                 ///< whether find() lists it, limit and overlaps aside
+  bool truncated = false;               ///< whether a budget cut words of the text off
+  std::vector<TextWord> words;          ///< of the text, in its order
+  std::vector<std::string> phrase;      ///< the words of the phrase that fits best
+  std::vector<FoundWord> pairs;         ///< what was paired, in the order of the text
+  std::vector<std::string> missing;     ///< words of the phrase that the text lacks
+  std::vector<std::string> surplus;     ///< words of the text that are left over
+  std::uint64_t edits = 0;              ///< of the pairs
+  std::uint64_t cost = 0;               ///< edits, and 2 for each missing and surplus word
+  std::vector<std::string> objections;  ///< sentences: which limit keeps it out; empty when found
+
+  /// One JSON object on one line, with the names above.
+  std::string toJson() const;
+
+  /// For people: several lines, each ended by a line feed.
+  std::string toText() const;
+};
+
+/// How the score of Index::query comes about for one value, step by step.
+struct WORDCATCHER_EXPORT QueryExplanation {
+  struct Step {
+    std::string sentence;   ///< what was looked at, and what came of it
+    std::int64_t distance;  ///< the value's distance after it
+  };
+
+  std::string text;   ///< the host's
+  std::string value;  ///< the host's
+
+  bool isStored = false;      ///< whether the index holds the value
+  bool isFound = false;       ///< whether query() lists it
+  bool truncated = false;     ///< whether a budget cut words of the text off
+  std::int64_t distance = 0;  ///< at the end; 0 for a value that was no candidate
+  std::int64_t bound = 0;     ///< the greatest distance that is listed
+  std::vector<Step> steps;    ///< in the order in which they are taken
+
+  /// One JSON object on one line, with the names above.
+  std::string toJson() const;
+
+  /// For people: several lines, each ended by a line feed.
+  std::string toText() const;
+};
+
+}  // namespace wordcatcher
+
+#endif
