@@ -94,7 +94,8 @@ class WORDCATCHER_EXPORT Index {
   /// words that the text lacks, and 2 for each word of the text that it leaves over, over the best
   /// one-to-one pairing of the words of both; words are paired within the edit limits of the text's
   /// word. Two neighbouring words that the other side writes as one, with the same letters, are
-  /// paired with it for one edit. A phrase is found when at least one of its words is paired.
+  /// paired with it for one edit, unless all edit limits of words are 0. A phrase is found when at
+  /// least one of its words is paired.
   ///
   /// The order: the smaller cost; then more words of the phrase paired; then more of these without
   /// edits; then fewer breaks (pairs that do not follow the one before them directly, in the phrase
