@@ -137,7 +137,7 @@ std::string shown(const Builder& builder) {
 
 void bindBuilder(py::module_& module) {
   py::class_<Builder>(
-      module, "IndexBuilder",
+      module, "IndexBuilder", py::is_final(),
       documented("IndexBuilder(path, mode='words', tables=None)", kBuilderDoc).c_str())
       .def(py::init(&makeBuilder), py::arg("path"), py::arg("mode") = "words",
            py::arg("tables") = py::none(),

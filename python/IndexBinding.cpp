@@ -291,7 +291,7 @@ void defineQuery(py::class_<OpenIndex>& type) {
 }  // namespace
 
 void bindIndex(py::module_& module) {
-  py::class_<OpenIndex> type(module, "Index", kIndexDoc);
+  py::class_<OpenIndex> type(module, "Index", py::is_final(), kIndexDoc);
   defineOpen(type);
   defineFind(type);
   defineQuery(type);

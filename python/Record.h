@@ -75,7 +75,7 @@ Field(const char*, Value Struct::*, const char*) -> Field<Struct, Value>;
 template <typename Struct, typename... Values>
 py::class_<Struct> bindRecord(py::module_& module, const char* name, const char* doc,
                               Field<Struct, Values>... fields) {
-  py::class_<Struct> type(module, name, doc);
+  py::class_<Struct> type(module, name, py::is_final(), doc);
   const auto values = [fields...](const Struct& self) {
     return py::make_tuple(toPython(self.*fields.member)...);
   };
@@ -124,7 +124,7 @@ void bindSequence(py::class_<Result>& type) {
     }
     return toPython(self.matches[static_cast<std::size_t>(index < 0 ? index + size : index)]);
   });
-  type.def("__getitem__", [](const Result& self, const py::slice& slice) {
+  type.def("__getitem__", [](const Result& self, const py::slice& slice) -> py::object {
     return toPython(self.matches)[slice];
   });
 }

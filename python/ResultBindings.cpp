@@ -31,12 +31,13 @@ Words that hold a digit are only found exactly.)";
 
 void bindLimits(py::module_& module) {
   const EditLimits limits;
-  const std::string signature = "EditLimits(*, short_length=" + std::to_string(limits.shortLength) +
-                                ", medium_length=" + std::to_string(limits.mediumLength) +
-                                ", short_edits=" + std::to_string(limits.shortEdits) +
-                                ", medium_edits=" + std::to_string(limits.mediumEdits) +
-                                ", long_edits=" + std::to_string(limits.longEdits) +
-                                ", whole_text_edits=" + std::to_string(limits.wholeTextEdits) + ")";
+  const std::string parameters = "*, short_length=" + std::to_string(limits.shortLength) +
+                                 ", medium_length=" + std::to_string(limits.mediumLength) +
+                                 ", short_edits=" + std::to_string(limits.shortEdits) +
+                                 ", medium_edits=" + std::to_string(limits.mediumEdits) +
+                                 ", long_edits=" + std::to_string(limits.longEdits) +
+                                 ", whole_text_edits=" + std::to_string(limits.wholeTextEdits) +
+                                 ")";
   const auto make = [](const py::object& shortLength, const py::object& mediumLength,
                        const py::object& shortEdits, const py::object& mediumEdits,
                        const py::object& longEdits, const py::object& wholeTextEdits) {
