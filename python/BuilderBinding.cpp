@@ -141,7 +141,7 @@ void bindBuilder(py::module_& module) {
       documented("IndexBuilder(path, mode='words', tables=None)", kBuilderDoc).c_str())
       .def(py::init(&makeBuilder), py::arg("path"), py::arg("mode") = "words",
            py::arg("tables") = py::none(),
-           documented("__init__($self, path, mode='words', tables=None)",
+           documented("__init__(self, path, mode='words', tables=None)",
                       "Makes a builder; nothing is touched yet.")
                .c_str())
       .def("add", &add, py::arg("phrase"), py::arg("data") = py::ellipsis(),

@@ -67,7 +67,7 @@ void bindLimits(py::module_& module) {
            py::arg("short_edits") = limits.shortEdits, py::arg("medium_edits") = limits.mediumEdits,
            py::arg("long_edits") = limits.longEdits,
            py::arg("whole_text_edits") = limits.wholeTextEdits,
-           documented("__init__($self, " + parameters, "Makes limits.").c_str());
+           documented("__init__(self, " + parameters, "Makes limits.").c_str());
 }
 
 void bindFind(py::module_& module) {
