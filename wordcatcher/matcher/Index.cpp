@@ -96,8 +96,10 @@ struct Index::State {
   WordSegmenter segmenter;
 
   std::vector<std::string> dataOf(std::uint32_t word) const {
+    const auto values = image->postingsOf(word);
     std::vector<std::string> data;
-    for (const std::uint32_t value : image->postingsOf(word)) {
+    data.reserve(values.size());
+    for (const std::uint32_t value : values) {
       data.emplace_back(image->valueText(value));
     }
     std::sort(data.begin(), data.end(), &utf16Less);
@@ -166,6 +168,7 @@ Index::QueryResult Index::State::queryWholeText(const std::u16string& text) cons
   std::sort(hits.begin(), hits.end(), [](const WordHit& a, const WordHit& b) {
     return a.distance != b.distance ? a.distance < b.distance : a.word < b.word;
   });
+  result.matches.reserve(hits.size());
   for (const auto& hit : hits) {
     result.matches.push_back({wordText(hit.word), hit.distance, dataOf(hit.word)});
   }
@@ -200,6 +203,7 @@ Index::QueryResult Index::State::queryWords(std::u16string_view text) const {
   result.truncated = truncated;
   result.found = scored.has_value();
   if (scored) {
+    result.matches.reserve(scored->size());
     for (const auto& [value, distance] : *scored) {
       result.matches.push_back({std::string(image->valueText(value)), distance, {}});
     }
@@ -222,7 +226,9 @@ Index::SearchResult Index::search(std::string_view word, std::int64_t maxDistanc
     result.truncated = true;
     return result;
   }
-  for (const auto& hit : searchImage(*_state->image, toLower(*units), maxDistance)) {
+  const auto hits = searchImage(*_state->image, toLower(*units), maxDistance);
+  result.matches.reserve(hits.size());
+  for (const auto& hit : hits) {
     result.matches.push_back({_state->wordText(hit.word), hit.distance, _state->dataOf(hit.word)});
   }
   return result;
