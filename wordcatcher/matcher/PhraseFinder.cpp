@@ -192,7 +192,7 @@ void PhraseFinder::judgeAll(std::span<const std::uint32_t> values) {
     if (!spendPosting()) {
       return;
     }
-    if (_judged.insert(value)) {
+    if (_judged.insert(value).isNew) {
       judgeAndKeep(value);
     }
   }
@@ -319,7 +319,7 @@ void PhraseFinder::read(const Segment& segment) {
     if (!spendPosting()) {
       return;
     }
-    if (_judged.insert(value) && !judgeAndKeep(value) && isAlone) {
+    if (_judged.insert(value).isNew && !judgeAndKeep(value) && isAlone) {
       return;
     }
   }

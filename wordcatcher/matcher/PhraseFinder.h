@@ -26,7 +26,7 @@
 
 #include "wordcatcher/matcher/Find.h"
 #include "wordcatcher/matcher/FindText.h"
-#include "wordcatcher/matcher/NumberSet.h"
+#include "wordcatcher/matcher/NumberIndex.h"
 #include "wordcatcher/matcher/Pairing.h"
 #include "wordcatcher/storage/SearchImage.h"
 
@@ -139,7 +139,7 @@ class PhraseFinder {
   std::uint64_t _postings;  // budgets that are left
   std::uint64_t _steps;
   bool _truncated = false;
-  NumberSet _judged;
+  NumberIndex _judged;
   std::vector<RankedPhrase> _kept;  // a heap, the last in order on top, once it is full
 };
 
