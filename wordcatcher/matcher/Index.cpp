@@ -13,6 +13,7 @@
 #include "wordcatcher/matcher/FindText.h"
 #include "wordcatcher/matcher/FoundPhrases.h"
 #include "wordcatcher/matcher/SpanQuery.h"
+#include "wordcatcher/matcher/SpanShortcut.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
 #include "wordcatcher/storage/SearchImage.h"
 #include "wordcatcher/text/CodeUnitOrder.h"
@@ -96,8 +97,10 @@ struct Index::State {
   WordSegmenter segmenter;
 
   std::vector<std::string> dataOf(std::uint32_t word) const {
+    const auto values = image->postingsOf(word);
     std::vector<std::string> data;
-    for (const std::uint32_t value : image->postingsOf(word)) {
+    data.reserve(values.size());
+    for (const std::uint32_t value : values) {
       data.emplace_back(image->valueText(value));
     }
     std::sort(data.begin(), data.end(), &utf16Less);
@@ -112,10 +115,6 @@ struct Index::State {
   QueryResult queryWholeText(const std::u16string& text) const;
   QueryResult queryWords(std::u16string_view text) const;
 
-  struct SpanAnswer {
-    std::optional<std::vector<ScoredValue>> scored;
-    bool truncated;
-  };
   SpanAnswer runSpanQuery(std::u16string_view text, SpanQueryTrace* trace) const;
 };
 
@@ -166,14 +165,14 @@ Index::QueryResult Index::State::queryWholeText(const std::u16string& text) cons
   std::sort(hits.begin(), hits.end(), [](const WordHit& a, const WordHit& b) {
     return a.distance != b.distance ? a.distance < b.distance : a.word < b.word;
   });
+  result.matches.reserve(hits.size());
   for (const auto& hit : hits) {
     result.matches.push_back({wordText(hit.word), hit.distance, dataOf(hit.word)});
   }
   return result;
 }
 
-Index::State::SpanAnswer Index::State::runSpanQuery(std::u16string_view text,
-                                                    SpanQueryTrace* trace) const {
+SpanAnswer Index::State::runSpanQuery(std::u16string_view text, SpanQueryTrace* trace) const {
   std::u16string codes;
   std::int64_t editDistance = kWordDistance;
   if (mode == MatchingMode::phoneticWords) {
@@ -183,10 +182,14 @@ Index::State::SpanAnswer Index::State::runSpanQuery(std::u16string_view text,
   }
   std::int64_t wordsMatched = 0;
   WordSegmenter words(segmenter);
-  SpanQuery query(*image, words,
-                  {editDistance, kIgnoredWordLength, kUncountedWordLength, options.maxQueryWords,
-                   options.maxWordUnits},
-                  wordsMatched);
+  const SpanQueryLimits limits = {editDistance, kIgnoredWordLength, kUncountedWordLength,
+                                  options.maxQueryWords, options.maxWordUnits};
+  if (trace == nullptr) {
+    if (auto answer = SpanShortcut(*image, words, limits).run(text)) {
+      return *std::move(answer);
+    }
+  }
+  SpanQuery query(*image, words, limits, wordsMatched);
   if (trace != nullptr) {
     query.tellTo(*trace);
   }
@@ -200,6 +203,7 @@ Index::QueryResult Index::State::queryWords(std::u16string_view text) const {
   result.truncated = truncated;
   result.found = scored.has_value();
   if (scored) {
+    result.matches.reserve(scored->size());
     for (const auto& [value, distance] : *scored) {
       result.matches.push_back({std::string(image->valueText(value)), distance, {}});
     }
@@ -222,7 +226,9 @@ Index::SearchResult Index::search(std::string_view word, std::int64_t maxDistanc
     result.truncated = true;
     return result;
   }
-  for (const auto& hit : searchImage(*_state->image, toLower(*units), maxDistance)) {
+  const auto hits = searchImage(*_state->image, toLower(*units), maxDistance);
+  result.matches.reserve(hits.size());
+  for (const auto& hit : hits) {
     result.matches.push_back({_state->wordText(hit.word), hit.distance, _state->dataOf(hit.word)});
   }
   return result;

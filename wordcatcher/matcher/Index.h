@@ -29,9 +29,10 @@ namespace wordcatcher {
 /// nothing worse, whatever the file holds.
 ///
 /// Budgets: a query looks at no more than the options allow and says when it left something out, so
-/// that texts of strangers cannot make it run away. Beside its result a query needs at most 64
-/// bytes for each code unit of a word, 32 for each byte of the text and 64 for each posting of the
-/// words that it finds.
+/// that texts of strangers cannot make it run away. Beside its result a query needs at most
+/// 64 bytes for each code unit of its longest word, 32 for each byte of the text and 64 for each
+/// posting of the words that it finds (a word without any counts as one), and, whatever the text,
+/// 16 KB, 16 bytes for each word of the index and one for each of its data strings.
 class WORDCATCHER_EXPORT Index {
  public:
   enum class Load {
