@@ -54,8 +54,9 @@ FindOptions findOptions(const py::kwargs& arguments, const std::string& method) 
     try {
       set(options, parameter, value, method);
     } catch (const py::cast_error&) {
-      throw py::type_error(method + "() cannot take this as " + parameter + ": " +
-                           std::string(py::repr(value)));
+      std::string sentence = method;
+      sentence.append("() cannot take this as ").append(parameter).append(": ");
+      throw py::type_error(sentence.append(py::repr(value)));
     }
   }
   return options;

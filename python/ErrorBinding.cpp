@@ -42,6 +42,8 @@ void bindError(py::module_& module) {
     throw py::error_already_set();
   }
   module.attr("Error") = py::handle(errorClass);
+  // pybind11 gives it by value.
+  // NOLINTNEXTLINE(performance-unnecessary-value-param)
   py::register_exception_translator([](std::exception_ptr thrown) {
     try {
       if (thrown) {
