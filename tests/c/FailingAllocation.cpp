@@ -28,7 +28,7 @@ extern "C" {
 
 void fail_allocations_after(long count) {
   left = count;
-  failed = false;
+  failed = failed && count < 0;
 }
 
 bool allocation_failed() { return failed; }

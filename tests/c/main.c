@@ -16,6 +16,7 @@ static int remove_entry(const char* path, const struct stat* status, int type,
 }
 
 int main(void) {
+  setvbuf(stdout, NULL, _IONBF, 0); /* what was found is told, however the program ends */
   char directory[] = "/tmp/wordcatcher-c-XXXXXX";
   if (mkdtemp(directory) == NULL || chdir(directory) != 0) {
     perror(directory);

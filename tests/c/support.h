@@ -42,7 +42,7 @@ wordcatcher_index* places(void);
 /* Lets the allocation of C++ memory fail after so many more; a negative number: never. */
 void fail_allocations_after(long count);
 
-/* Whether one has failed since. */
+/* Whether one has failed since they were last told to. */
 bool allocation_failed(void);
 
 /* The tests, one file each. */
