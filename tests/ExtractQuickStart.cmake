@@ -1,7 +1,8 @@
-# Writes the C++ example of the README to a source file. Arguments: README, OUTPUT.
-file(READ "${README}" page)
-string(REGEX MATCH "```cpp\n([^`]*)```" found "${page}")
+# Writes the first example of a page in a language to a source file. Arguments: PAGE, LANGUAGE,
+# OUTPUT.
+file(READ "${PAGE}" page)
+string(REGEX MATCH "```${LANGUAGE}\n([^`]*)```" found "${page}")
 if(NOT found)
-  message(FATAL_ERROR "the README has no C++ example")
+  message(FATAL_ERROR "${PAGE} has no example in ${LANGUAGE}")
 endif()
 file(WRITE "${OUTPUT}" "${CMAKE_MATCH_1}")
