@@ -59,13 +59,13 @@
    The functions have the meanings of the C++ interface, whose headers say more about what is found
    and how it is scored: matcher/Index.h, matcher/Find.h and matcher/IndexBuilder.h. */
 
+/* NOLINTBEGIN(modernize-*): this is C. */
 #include <stdbool.h>
 #include <stddef.h>
 #include <stdint.h>
 
 #include "wordcatcher/Export.h"
 
-/* NOLINTBEGIN(modernize-*): this is C. */
 #ifdef __cplusplus
 extern "C" {
 #endif

@@ -36,13 +36,11 @@ wordcatcher_code call(wordcatcher_error* error, const Action& action) noexcept {
 template <typename Handle, typename Action>
 wordcatcher_code make(Handle** result, const char* name, wordcatcher_error* error,
                       const Action& action) noexcept {
-  if (result != nullptr) {
-    *result = nullptr;
+  if (result == nullptr) {
+    return call(error, [name] { require(nullptr, name); });
   }
-  return call(error, [&] {
-    require(result, name);
-    *result = action().release();
-  });
+  *result = nullptr;
+  return call(error, [&] { *result = action().release(); });
 }
 
 }  // namespace wordcatcher::c
