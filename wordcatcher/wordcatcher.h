@@ -190,7 +190,7 @@ typedef struct wordcatcher_find_options {
   size_t size;               /* set by wordcatcher_find_options_init() */
   size_t limit;              /* matches at the most: the first ones of all; 10 */
   uint64_t max_cost;         /* the greatest cost of a match; WORDCATCHER_ANY_COST */
-  size_t min_words;          /* words of a phrase that the text must hold; 1, and at least 1 */
+  size_t min_words;          /* words of a phrase that the text must hold; 1, as for 0 */
   size_t short_length;       /* a word of up to so many code units is short; 2 */
   size_t medium_length;      /* a longer one of up to so many is medium, others are long; 5 */
   uint32_t short_edits;      /* edits that a short word of the text may have; 0 */
