@@ -66,6 +66,24 @@ static wordcatcher_code attempt_find(struct scene* scene, wordcatcher_error* err
   return code;
 }
 
+static wordcatcher_code attempt_explain(struct scene* scene, wordcatcher_error* error) {
+  wordcatcher_explanation* explanation = NULL;
+  const wordcatcher_code code =
+      wordcatcher_index_explain(scene->index, "niu zeeland", WORDCATCHER_NUL, "New Zealand{ NZ }",
+                                WORDCATCHER_NUL, NULL, &explanation, error);
+  wordcatcher_explanation_free(explanation);
+  return code;
+}
+
+static wordcatcher_code attempt_explain_query(struct scene* scene, wordcatcher_error* error) {
+  wordcatcher_explanation* explanation = NULL;
+  const wordcatcher_code code =
+      wordcatcher_index_explain_query(scene->index, "niu zeeland", WORDCATCHER_NUL,
+                                      "New Zealand{ NZ }", WORDCATCHER_NUL, &explanation, error);
+  wordcatcher_explanation_free(explanation);
+  return code;
+}
+
 static wordcatcher_code attempt_create(struct scene* scene, wordcatcher_error* error) {
   (void)scene;
   wordcatcher_builder* builder = NULL;
@@ -136,6 +154,8 @@ void test_memory(void) {
   starve("query", attempt_query, &scene);
   starve("search", attempt_search, &scene);
   starve("find", attempt_find, &scene);
+  starve("explain", attempt_explain, &scene);
+  starve("explain_query", attempt_explain_query, &scene);
   starve("create", attempt_create, &scene);
   starve("add", attempt_add, &scene);
   starve("commit", attempt_commit, &scene);
