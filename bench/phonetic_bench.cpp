@@ -11,16 +11,15 @@
 #include <unicode/ubrk.h>
 #include <unicode/ustring.h>
 
-#include <algorithm>
 #include <cstdio>
 #include <fstream>
 #include <iterator>
-#include <map>
 #include <stdexcept>
 #include <string>
 #include <string_view>
 #include <vector>
 
+#include "LeastTimeReporter.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
 
 namespace {
@@ -89,36 +88,6 @@ void icuWords(benchmark::State& state, std::size_t length) {
   state.SetBytesProcessed(static_cast<std::int64_t>(state.iterations() * length));
 }
 
-/// Prints the usual table and keeps the least processor time of each benchmark: what else runs on
-/// the machine can only add to it.
-class LeastTimeReporter : public benchmark::ConsoleReporter {
- public:
-  LeastTimeReporter() : ConsoleReporter(OO_None) {}
-
-  void ReportRuns(const std::vector<Run>& runs) override {
-    std::vector<Run> aggregates;
-    for (const Run& run : runs) {
-      if (run.run_type == Run::RT_Aggregate) {
-        aggregates.push_back(run);
-        continue;
-      }
-      const auto [least, isNew] =
-          _leastTimes.try_emplace(run.run_name.function_name, run.GetAdjustedCPUTime());
-      if (!isNew) {
-        least->second = std::min(least->second, run.GetAdjustedCPUTime());
-      }
-    }
-    ConsoleReporter::ReportRuns(aggregates);
-  }
-
-  double ratio(const char* name, const char* to) const {
-    return _leastTimes.at(name) / _leastTimes.at(to);
-  }
-
- private:
-  std::map<std::string, double> _leastTimes;
-};
-
 bool within(double bound, double ratio, const char* what) {
   std::printf("%-55s %.2f (at most %.1f)\n", what, ratio, bound);
   return ratio <= bound;
@@ -132,7 +101,8 @@ BENCHMARK_CAPTURE(icuWords, 1MB, kMegabyte)->Unit(benchmark::kMillisecond)->Repe
 
 int main(int argc, char** argv) {
   benchmark::Initialize(&argc, argv);
-  LeastTimeReporter reporter;
+  using wordcatcher::bench::LeastTimeReporter;
+  LeastTimeReporter reporter(LeastTimeReporter::Rows::aggregates);
   benchmark::RunSpecifiedBenchmarks(&reporter);
   const bool linear =
       within(kLinearBound, reporter.ratio(kEncode2, kEncode1), "2 MB against 1 MB of English:");

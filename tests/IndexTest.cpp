@@ -2,9 +2,7 @@
 
 #include <gtest/gtest.h>
 
-#include <atomic>
 #include <filesystem>
-#include <thread>
 
 #include "TestSupport.h"
 #include "wordcatcher/Error.h"
@@ -251,39 +249,6 @@ TEST_P(WordIndexTest, VerifyFindsAChangedByte) {
   writeFile(path, bytes);
   const Index index = Index::open(path);
   EXPECT_EQ(codeOf([&] { index.verify(); }), ErrorCode::damaged);
-}
-
-TEST_P(WordIndexTest, ManyThreadsUseOneWhileAnotherPublishes) {
-  const std::string path = buildWords();
-  const Index shared = Index::open(path);
-  const Rows expected = rowsOf(shared.query("trinidat and tobbago"));
-  ASSERT_EQ(expected.size(), 1U);
-  std::atomic<bool> stop = false;
-  std::atomic<int> wrong = 0;
-  std::vector<std::thread> readers;
-  for (int i = 0; i < 8; ++i) {
-    readers.emplace_back([&] {
-      for (int n = 0; n < 50 || !stop; ++n) {
-        const Index copy = shared;
-        wrong += rowsOf(copy.query("trinidat and tobbago")) != expected ? 1 : 0;
-        wrong += rowsOf(Index::open(path).query("trinidat and tobbago")) != expected ? 1 : 0;
-        wrong += copy.search("zeeland", 1).matches.size() != 1 ? 1 : 0;
-      }
-    });
-  }
-  for (int i = 0; i < 20; ++i) {
-    IndexBuilder builder(path);
-    for (const auto& value : kPhrases) {
-      builder.add(phraseOf(value), value);
-    }
-    builder.commit();
-    wrong += rowsOf(Index::open(path).query("trinidat and tobbago")) != expected ? 1 : 0;
-  }
-  stop = true;
-  for (auto& reader : readers) {
-    reader.join();
-  }
-  EXPECT_EQ(wrong, 0);
 }
 
 }  // namespace

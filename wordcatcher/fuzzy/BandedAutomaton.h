@@ -16,6 +16,7 @@
 // The method of rows is that of Wu and Manber, "Fast text searching allowing errors" (1992); moving
 // the columns along with the text is that of Ukkonen's band (1985).
 
+#include <array>
 #include <bit>
 #include <cstddef>
 #include <cstdint>
@@ -34,46 +35,75 @@ struct QueryUnit {
   bool matches(std::uint16_t other) const noexcept { return any || (label == other && other != 0); }
 };
 
-template <unsigned K>
+/// One or two sets of states side by side in a word: lane 0 decides where a walk goes on, lane 1
+/// goes along, stepped by the same instructions, where both fit (K up to 3).
+template <unsigned K, unsigned Lanes = 1>
 struct Band {
   static constexpr unsigned kColumns = 2 * K + 1;
+  static constexpr unsigned kLaneBits = (K + 1) * kColumns;
+  static_assert(Lanes * kLaneBits <= 64);
   static constexpr std::uint64_t kRow = (std::uint64_t{1} << kColumns) - 1;
+  static constexpr std::uint64_t kLane = (std::uint64_t{1} << kLaneBits) - 1;
 
-  /// One bit at the beginning of each row from `first` to `last`.
-  static constexpr std::uint64_t rowStarts(unsigned first, unsigned last) {
+  /// The same states in every lane.
+  static constexpr std::uint64_t inLanes(std::uint64_t lane) {
+    return Lanes == 1 ? lane : lane | lane << (kLaneBits % 64);
+  }
+
+  /// One bit at the beginning of each row from `first` to before `end`.
+  static constexpr std::uint64_t rowStarts(unsigned first, unsigned end) {
     std::uint64_t bits = 0;
-    for (unsigned e = first; e <= last && e <= K; ++e) {
+    for (unsigned e = first; e < end && e <= K; ++e) {
       bits |= std::uint64_t{1} << (e * kColumns);
     }
     return bits;
   }
 
-  static constexpr std::uint64_t kStarts = rowStarts(0, K);
-  static constexpr std::uint64_t kAll = kStarts * kRow;
-  static constexpr std::uint64_t kNotFirstColumn = kAll & ~kStarts;
-  static constexpr std::uint64_t kNotLastColumn = kAll & ~(kStarts << (kColumns - 1));
+  static constexpr std::uint64_t kStarts = inLanes(rowStarts(0, K + 1));
+  static constexpr std::uint64_t kBelowLastRow = inLanes(rowStarts(0, K) * kRow);
 
-  /// Adds what missing code units lead to.
+  /// The states that have room for so many more rows up, and columns up.
+  template <unsigned Moves>
+  static constexpr std::uint64_t kRoomFor = inLanes(rowStarts(0, K + 1 - Moves) * (kRow >> Moves));
+
+  /// Adds what `Moves` missing code units lead to.
+  template <unsigned Moves>
+  static constexpr std::uint64_t withMissing(std::uint64_t states) {
+    return states | (states & kRoomFor<Moves>) << (Moves * (kColumns + 1));
+  }
+
+  /// Adds what missing code units lead to, any number of them.
   static constexpr std::uint64_t closed(std::uint64_t states) {
-    for (unsigned i = 0; i < K; ++i) {
-      states |= ((states << 1) & kNotFirstColumn) << kColumns;
+    if constexpr (K > 0) {
+      states = withMissing<1>(states);
     }
-    return states & kAll;
+    if constexpr (K > 1) {
+      states = withMissing < K == 2 ? 1 : 2 > (states);
+    }
+    if constexpr (K > 3) {
+      states = withMissing<K - 3>(states);
+    }
+    return states;
   }
 
-  /// What reading any one code unit leads to by an edit.
+  /// What reading any one code unit leads to by an edit. Closed when `states` are: a code unit that
+  /// is missing behind the edit may as well be missing before it.
   static constexpr std::uint64_t edited(std::uint64_t states) {
-    return closed((states | ((states >> 1) & kNotLastColumn)) << kColumns);
+    if constexpr (K == 0) {
+      return 0;
+    } else {
+      return ((states & kBelowLastRow) | ((states >> 1) & kRoomFor<1>)) << kColumns;
+    }
   }
 
-  /// What reading a code unit leads to without an edit; bit c of `matching` says that the query's
-  /// code unit behind column c is that one. Together with edited() this is the whole step: missing
-  /// code units behind either are those behind both.
+  /// What reading a code unit leads to without an edit, or missing code units; bit c of `matching`
+  /// says that the query's code unit behind column c is that one. Together with edited() and, after
+  /// it, missing code units this is the whole step.
   static constexpr std::uint64_t matched(std::uint64_t states, std::uint64_t matching) {
-    return closed(states & (matching * kStarts));
+    return states & (matching * kStarts);
   }
 
-  /// The columns in use in any row.
+  /// The columns in use in any row of lane 0.
   static constexpr std::uint64_t columnsOf(std::uint64_t states) {
     std::uint64_t columns = states;
     for (unsigned e = 1; e <= K; ++e) {
@@ -106,6 +136,8 @@ struct Band {
           reach.notTooFarAhead[entry] |= lead <= ahead + spare ? bit : 0;
         }
       }
+      reach.notTooFarBehind[entry] = inLanes(reach.notTooFarBehind[entry]);
+      reach.notTooFarAhead[entry] = inLanes(reach.notTooFarAhead[entry]);
     }
     return reach;
   }
@@ -113,21 +145,26 @@ struct Band {
 };
 
 /// A query prepared for simulation at up to K edits.
-template <unsigned K>
+template <unsigned K, unsigned Lanes = 1>
 class BandedPattern {
  public:
-  using B = Band<K>;
+  using B = Band<K, Lanes>;
 
-  /// `restricted` code units at the head may only be passed with at most `edits` edits.
+  /// In lane 0 `restricted` code units at the head may only be passed with at most `edits` edits.
   BandedPattern(std::span<const QueryUnit> units, std::size_t restricted, unsigned edits)
-      : _units(units), _states(units.size() + K + 2) {
+      : _units(units) {
+    const std::size_t depths = units.size() + K + 2;
+    if (depths > _fewStates.size()) {
+      _manyStates.resize(depths);
+      _states = _manyStates.data();
+    }
     const auto length = static_cast<std::int64_t>(units.size());
-    for (std::size_t depth = 0; depth < _states.size(); ++depth) {
+    for (std::size_t depth = 0; depth < depths; ++depth) {
       const auto shift = static_cast<std::int64_t>(depth) - static_cast<std::int64_t>(K);
       // Column c stands for p = shift + c.
       const std::uint64_t inside = below(length + 1 - shift) & ~below(-shift);
       const std::uint64_t head = inside & below(static_cast<std::int64_t>(restricted) - shift);
-      _states[depth].valid = (inside * B::kStarts) & ~(head * B::rowStarts(edits + 1, K));
+      _states[depth].valid = (inside * B::kStarts) & ~(head * B::rowStarts(edits + 1, K + 1));
       const std::uint64_t end = below(length + 1 - shift) & ~below(length - shift);
       _states[depth].accepting = end * B::kStarts;
     }
@@ -139,29 +176,34 @@ class BandedPattern {
     }
   }
 
+  BandedPattern(const BandedPattern&) = delete;
+  BandedPattern& operator=(const BandedPattern&) = delete;
+
   std::size_t length() const noexcept { return _units.size(); }
   std::uint64_t validAt(std::size_t depth) const noexcept { return _states[depth].valid; }
   std::uint64_t acceptingAt(std::size_t depth) const noexcept { return _states[depth].accepting; }
 
   /// The states before anything is read: nothing is accounted for, and leaving out the head of the
   /// query is not allowed yet.
-  std::uint64_t start() const noexcept { return std::uint64_t{1} << K; }
+  std::uint64_t start() const noexcept { return B::inLanes(std::uint64_t{1} << K); }
 
   /// The same, with the head left out as well.
   std::uint64_t closedStart() const noexcept { return B::closed(start()) & validAt(0); }
 
   std::uint64_t step(std::uint64_t states, std::size_t depth, std::uint16_t label) const noexcept {
-    return (B::edited(states) | B::matched(states, matching(depth, label))) &
+    return (editedAt(states, depth) | B::closed(matchedAt(states, depth, label))) &
            _states[depth + 1].valid;
   }
 
-  /// The two parts of a step apart, for a place whose children share the first.
-  std::uint64_t stepByEdit(std::uint64_t states, std::size_t depth) const noexcept {
-    return B::edited(states) & _states[depth + 1].valid;
+  /// The two parts of a step apart, for a place whose children share the first; neither is masked
+  /// by what is valid at the next depth. No missing code units follow the second.
+  std::uint64_t editedAt(std::uint64_t states, std::size_t depth) const noexcept {
+    // The states before anything is read need not be closed.
+    return depth == 0 ? B::closed(B::edited(states)) : B::edited(states);
   }
-  std::uint64_t stepByMatch(std::uint64_t states, std::size_t depth,
-                            std::uint16_t label) const noexcept {
-    return B::matched(states, matching(depth, label)) & _states[depth + 1].valid;
+  std::uint64_t matchedAt(std::uint64_t states, std::size_t depth,
+                          std::uint16_t label) const noexcept {
+    return B::matched(states, matching(depth, label));
   }
 
   /// The bits, in a tree's sets of children, of the labels that match from these states.
@@ -224,7 +266,9 @@ class BandedPattern {
   }
 
   std::span<const QueryUnit> _units;
-  std::vector<AtDepth> _states;
+  std::array<AtDepth, 48> _fewStates;
+  std::vector<AtDepth> _manyStates;
+  AtDepth* _states = _fewStates.data();
   // For queries that fit: bit p + K of a label's row says that it is the query's code unit p.
   std::uint64_t _table[image::kRareBit] = {};
   bool _hasTable = false;

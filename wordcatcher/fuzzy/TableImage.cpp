@@ -80,7 +80,8 @@ Words addWords(const TinyCDB& edgeTable, const TinyCDB& finalTable, SearchImageW
 /// order in which they were added.
 class Phrases {
  public:
-  /// Begins the phrase of the next value, which has the next number; returns how many counted words the value's text has.
+  /// Begins the phrase of the next value, which has the next number; returns how many counted words
+  /// the value's text has.
   std::uint32_t begin(std::u16string_view value, const Words& words) {
     Phrase& phrase = _phrases.emplace_back();
     std::uint32_t counted = 0;

@@ -10,6 +10,8 @@
 #include "wordcatcher/Error.h"
 #include "wordcatcher/fuzzy/ImageSearch.h"
 #include "wordcatcher/fuzzy/LXFuzzyIndex.h"
+#include "wordcatcher/matcher/FindText.h"
+#include "wordcatcher/matcher/FoundPhrases.h"
 #include "wordcatcher/matcher/SpanQuery.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
 #include "wordcatcher/storage/SearchImage.h"
@@ -75,6 +77,13 @@ void checkFinished(const std::string& prefix) {
   }
 }
 
+/// Codes are compared exactly, and whole texts are one word.
+bool joinsWords(MatchingMode mode, const FindOptions& options) {
+  const EditLimits& edits = options.edits;
+  return mode == MatchingMode::words &&
+         std::max({edits.shortEdits, edits.mediumEdits, edits.longEdits}) > 0;
+}
+
 std::uint32_t modeNumber(MatchingMode mode) { return static_cast<std::uint32_t>(mode); }
 
 }  // namespace
@@ -87,8 +96,10 @@ struct Index::State {
   WordSegmenter segmenter;
 
   std::vector<std::string> dataOf(std::uint32_t word) const {
+    const auto values = image->postingsOf(word);
     std::vector<std::string> data;
-    for (const std::uint32_t value : image->postingsOf(word)) {
+    data.reserve(values.size());
+    for (const std::uint32_t value : values) {
       data.emplace_back(image->valueText(value));
     }
     std::sort(data.begin(), data.end(), &utf16Less);
@@ -98,8 +109,16 @@ struct Index::State {
   /// A word of the image as UTF-8; unpaired surrogates, which no text has, appear as U+FFFD.
   std::string wordText(std::uint32_t word) const { return displayUtf8(image->textOf(word)); }
 
+  FindText cut(std::string_view text, const EditLimits& limits) const;
+
   QueryResult queryWholeText(const std::u16string& text) const;
-  QueryResult queryWords(std::u16string_view text, std::int64_t editDistance) const;
+  QueryResult queryWords(std::u16string_view text) const;
+
+  struct SpanAnswer {
+    std::optional<std::vector<ScoredValue>> scored;
+    bool truncated;
+  };
+  SpanAnswer runSpanQuery(std::u16string_view text, SpanQueryTrace* trace) const;
 };
 
 Index::Index(std::shared_ptr<const State> state) : _state(std::move(state)) {}
@@ -134,14 +153,8 @@ Index Index::open(const std::string& path, const Options& options, MatchingMode 
 
 Index::QueryResult Index::query(std::string_view text) const {
   const std::u16string units = decodeUtf8(text);
-  switch (_state->mode) {
-    case MatchingMode::wholeText:
-      return _state->queryWholeText(units);
-    case MatchingMode::phoneticWords:
-      return _state->queryWords(KXMetaphone().translate(units), 0);
-    default:
-      return _state->queryWords(units, kWordDistance);
-  }
+  return _state->mode == MatchingMode::wholeText ? _state->queryWholeText(units)
+                                                 : _state->queryWords(units);
 }
 
 Index::QueryResult Index::State::queryWholeText(const std::u16string& text) const {
@@ -155,25 +168,42 @@ Index::QueryResult Index::State::queryWholeText(const std::u16string& text) cons
   std::sort(hits.begin(), hits.end(), [](const WordHit& a, const WordHit& b) {
     return a.distance != b.distance ? a.distance < b.distance : a.word < b.word;
   });
+  result.matches.reserve(hits.size());
   for (const auto& hit : hits) {
     result.matches.push_back({wordText(hit.word), hit.distance, dataOf(hit.word)});
   }
   return result;
 }
 
-Index::QueryResult Index::State::queryWords(std::u16string_view text,
-                                            std::int64_t editDistance) const {
+Index::State::SpanAnswer Index::State::runSpanQuery(std::u16string_view text,
+                                                    SpanQueryTrace* trace) const {
+  std::u16string codes;
+  std::int64_t editDistance = kWordDistance;
+  if (mode == MatchingMode::phoneticWords) {
+    codes = KXMetaphone().translate(text);
+    text = codes;
+    editDistance = 0;
+  }
   std::int64_t wordsMatched = 0;
   WordSegmenter words(segmenter);
   SpanQuery query(*image, words,
                   {editDistance, kIgnoredWordLength, kUncountedWordLength, options.maxQueryWords,
                    options.maxWordUnits},
                   wordsMatched);
-  const auto scored = query.run(text);
+  if (trace != nullptr) {
+    query.tellTo(*trace);
+  }
+  auto scored = query.run(text);
+  return {std::move(scored), query.truncated()};
+}
+
+Index::QueryResult Index::State::queryWords(std::u16string_view text) const {
+  const auto [scored, truncated] = runSpanQuery(text, nullptr);
   QueryResult result;
-  result.truncated = query.truncated();
+  result.truncated = truncated;
   result.found = scored.has_value();
   if (scored) {
+    result.matches.reserve(scored->size());
     for (const auto& [value, distance] : *scored) {
       result.matches.push_back({std::string(image->valueText(value)), distance, {}});
     }
@@ -196,10 +226,84 @@ Index::SearchResult Index::search(std::string_view word, std::int64_t maxDistanc
     result.truncated = true;
     return result;
   }
-  for (const auto& hit : searchImage(*_state->image, toLower(*units), maxDistance)) {
+  const auto hits = searchImage(*_state->image, toLower(*units), maxDistance);
+  result.matches.reserve(hits.size());
+  for (const auto& hit : hits) {
     result.matches.push_back({_state->wordText(hit.word), hit.distance, _state->dataOf(hit.word)});
   }
   return result;
+}
+
+FindText Index::State::cut(std::string_view text, const EditLimits& limits) const {
+  for (const std::uint32_t edits :
+       {limits.shortEdits, limits.mediumEdits, limits.longEdits, limits.wholeTextEdits}) {
+    if (edits > EditLimits::kMaxEdits) {
+      throw Error(ErrorCode::badInput, "An edit limit of " + std::to_string(edits) +
+                                           " finds almost anything; give at most " +
+                                           std::to_string(EditLimits::kMaxEdits) + ".");
+    }
+  }
+  WordSegmenter words(segmenter);
+  return {text, mode, limits, words, options.maxQueryWords, options.maxWordUnits};
+}
+
+FindResult Index::find(std::string_view text) const { return find(text, FindOptions()); }
+
+FindResult Index::find(std::string_view text, const FindOptions& options) const {
+  const FindText words = _state->cut(text, options.edits);
+  return findPhrases(*_state->image, words, options, joinsWords(_state->mode, options));
+}
+
+FindExplanation Index::explain(std::string_view text, std::string_view value) const {
+  return explain(text, value, FindOptions());
+}
+
+FindExplanation Index::explain(std::string_view text, std::string_view value,
+                               const FindOptions& options) const {
+  const FindText words = _state->cut(text, options.edits);
+  auto explanation =
+      explainFind(*_state->image, words, value, options, joinsWords(_state->mode, options));
+  explanation.text = text;
+  return explanation;
+}
+
+QueryExplanation Index::explainQuery(std::string_view text, std::string_view value) const {
+  const SearchImage& image = *_state->image;
+  QueryExplanation explanation;
+  explanation.text = text;
+  explanation.value = value;
+  const QueryResult result = query(text);
+  explanation.truncated = result.truncated;
+  if (_state->mode == MatchingMode::wholeText) {
+    explanation.bound = kWholeTextDistance;
+    for (const Match& match : result.matches) {
+      if (std::find(match.data.begin(), match.data.end(), value) != match.data.end()) {
+        explanation.isFound = true;
+        explanation.distance = match.distance;
+        explanation.steps.push_back({"The stored text \"" + match.value +
+                                         "\" carries the value and is " +
+                                         std::to_string(match.distance) + " edits from this one.",
+                                     match.distance});
+        break;
+      }
+    }
+    explanation.isStored = explanation.isFound || valueNumber(image, value).has_value();
+    return explanation;
+  }
+  const auto number = valueNumber(image, value);
+  explanation.isStored = number.has_value();
+  if (!number) {
+    return explanation;
+  }
+  SpanQueryTrace trace(image, *number);
+  _state->runSpanQuery(decodeUtf8(text), &trace);
+  const auto found = std::find_if(result.matches.begin(), result.matches.end(),
+                                  [value](const Match& match) { return match.value == value; });
+  explanation.isFound = found != result.matches.end();
+  explanation.distance = trace.distance();
+  explanation.bound = trace.bound();
+  explanation.steps = trace.steps();
+  return explanation;
 }
 
 Index::Info Index::info() const {

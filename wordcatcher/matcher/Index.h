@@ -29,9 +29,10 @@ namespace wordcatcher {
 /// nothing worse, whatever the file holds.
 ///
 /// Budgets: a query looks at no more than the options allow and says when it left something out, so
-/// that texts of strangers cannot make it run away. Beside its result a query needs at most 64
-/// bytes for each code unit of a word, 32 for each byte of the text and 64 for each posting of the
-/// words that it finds.
+/// that texts of strangers cannot make it run away. Beside its result a query needs at most
+/// 64 bytes for each code unit of its longest word, 32 for each byte of the text and 64 for each
+/// posting of the words that it finds (a word without any counts as one), and, whatever the text,
+/// 16 KB, 16 bytes for each word of the index and one for each of its data strings.
 class WORDCATCHER_EXPORT Index {
  public:
   enum class Load {
@@ -94,7 +95,8 @@ class WORDCATCHER_EXPORT Index {
   /// words that the text lacks, and 2 for each word of the text that it leaves over, over the best
   /// one-to-one pairing of the words of both; words are paired within the edit limits of the text's
   /// word. Two neighbouring words that the other side writes as one, with the same letters, are
-  /// paired with it for one edit. A phrase is found when at least one of its words is paired.
+  /// paired with it for one edit, unless all edit limits of words are 0. A phrase is found when at
+  /// least one of its words is paired.
   ///
   /// The order: the smaller cost; then more words of the phrase paired; then more of these without
   /// edits; then fewer breaks (pairs that do not follow the one before them directly, in the phrase

@@ -49,7 +49,13 @@ Iterator gallop(Iterator begin, Iterator end, std::uint32_t value) {
 std::optional<std::vector<ScoredValue>> SpanQuery::run(std::u16string_view text) {
   lookUpLongWords(text);
   if (_searchedWords == 0) {
+    if (_trace != nullptr) {
+      _trace->lookUpAll();
+    }
     lookUpEveryWord(text);
+  }
+  if (_trace != nullptr) {
+    _trace->count(_countedWords, _limits.ignoredWordLengthForEditDistance, !_candidates.empty());
   }
   if (_candidates.empty()) {
     return std::nullopt;
@@ -59,11 +65,21 @@ std::optional<std::vector<ScoredValue>> SpanQuery::run(std::u16string_view text)
   for (std::size_t i = 0; i < first.values.size(); ++i) {
     _phrases.push_back({first.values[i], first.distances[i]});
   }
+  if (_trace != nullptr) {
+    _trace->begin();
+  }
   penaliseMissingHits();
   for (std::size_t i = 1; i < _candidates.size(); ++i) {
     // Words that bring exactly the first word's phrases tell nothing new.
-    if (_candidates[i].values != first.values) {
-      intersect(_candidates[i]);
+    const bool isSame = _candidates[i].values == first.values;
+    const bool isCommon = !isSame && intersect(_candidates[i]);
+    if (_trace != nullptr) {
+      using Compared = SpanQueryTrace::Compared;
+      _trace->compare(i,
+                      isSame     ? Compared::same
+                      : isCommon ? Compared::common
+                                 : Compared::disjoint,
+                      disjointPenalty());
     }
   }
   return scored();
@@ -78,6 +94,9 @@ void SpanQuery::lookUpLongWords(std::u16string_view text) {
       return;
     }
     if (lengthOf(*word) <= _limits.ignoredWordLength) {
+      if (_trace != nullptr) {
+        _trace->leaveOut(*word, "too short");
+      }
       continue;
     }
     lookUp(*word);
@@ -106,11 +125,23 @@ void SpanQuery::lookUpEveryWord(std::u16string_view text) {
 void SpanQuery::lookUp(std::u16string_view word) {
   if (word.size() > _limits.maxWordUnits) {
     _truncated = true;
+    if (_trace != nullptr) {
+      _trace->leaveOut(word, "too long");
+    }
     return;
   }
   const auto hits = searchImage(_image, toLower(word), _limits.editDistance);
   _wordsMatched = wrappingAdd(_wordsMatched, static_cast<std::int64_t>(hits.size()));
   CandidateSet phrases = candidatesOf(hits);
+  if (_trace != nullptr) {
+    const auto at = std::lower_bound(phrases.values.begin(), phrases.values.end(), _trace->value());
+    const bool isIn = at != phrases.values.end() && *at == _trace->value();
+    _trace->lookUp(
+        word, hits,
+        isIn ? std::optional<std::int64_t>(
+                   phrases.distances[static_cast<std::size_t>(at - phrases.values.begin())])
+             : std::nullopt);
+  }
   if (!phrases.values.empty()) {
     _candidates.push_back(std::move(phrases));
   }
@@ -185,9 +216,19 @@ void SpanQuery::penaliseMissingHits() {
   }
   const auto missing = wrappingSubtract(_countedWords, _wordsMatched);
   _penalty = wrappingAdd(wrappingMultiply(missing, _limits.editDistance), 1);
+  if (_trace != nullptr) {
+    _trace->penaliseMissing(missing, _penalty);
+  }
 }
 
-void SpanQuery::intersect(const CandidateSet& others) {
+/// Twice the counted words whatever the edit distance is, so that a word that shares no phrase with
+/// the others counts against them in phonetic mode too.
+std::int64_t SpanQuery::disjointPenalty() const {
+  return wrappingAdd(wrappingMultiply(2, _countedWords), 1);
+}
+
+/// Cuts the phrases in play to those that these candidates hold as well; false when there are none.
+bool SpanQuery::intersect(const CandidateSet& others) {
   std::vector<ScoredValue> common;
   const auto begin = others.values.begin();
   const auto end = others.values.end();
@@ -221,17 +262,22 @@ void SpanQuery::intersect(const CandidateSet& others) {
     }
   }
   if (common.empty()) {
-    // Twice the counted words whatever the edit distance is, so that a word that shares no phrase
-    // with the others counts against them in phonetic mode too.
-    _penalty = wrappingAdd(_penalty, wrappingAdd(wrappingMultiply(2, _countedWords), 1));
-    return;
+    _penalty = wrappingAdd(_penalty, disjointPenalty());
+    return false;
   }
   _phrases = std::move(common);
   _wordsMatched = wrappingAdd(_wordsMatched, 1);
+  return true;
 }
 
 std::vector<ScoredValue> SpanQuery::scored() const {
   const std::int64_t bound = _limits.editDistance * _countedWords;
+  if (_trace != nullptr) {
+    const std::int64_t words = _image.countedWordsOf(_trace->value());
+    _trace->penaliseLength(words, _countedWords,
+                           _limits.editDistance * std::abs(words - _countedWords));
+    _trace->compareWithBound(bound);
+  }
   std::vector<ScoredValue> records;
   for (const auto& phrase : _phrases) {
     const std::int64_t difference =

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "wordcatcher/fuzzy/ImageSearch.h"
+#include "wordcatcher/matcher/SpanQueryTrace.h"
 #include "wordcatcher/storage/SearchImage.h"
 #include "wordcatcher/text/WordSegmenter.h"
 
@@ -33,10 +34,10 @@ struct ScoredValue {
 /// One span query over the words of an image: looks up each word of a text, intersects the values
 /// that the words bring, and scores what is left. Used once.
 ///
-/// Values are numbers, so that sets are sorted lists. A word costs its search and the posting lists of its
-/// hits; memory is 16 bytes a posting of two words at a time, and two bytes a value of the image
-/// where posting lists are long. Arithmetic on scores wraps around: the host may set the running
-/// counter to any value. One thread at a time; throws Error (damaged) as the image does.
+/// Values are numbers, so that sets are sorted lists. A word costs its search and the posting lists
+/// of its hits; memory is 16 bytes a posting of two words at a time, and two bytes a value of the
+/// image where posting lists are long. Arithmetic on scores wraps around: the host may set the
+/// running counter to any value. One thread at a time; throws Error (damaged) as the image does.
 class SpanQuery {
  public:
   /// `wordsMatched` is the running counter, which the query raises and takes into account.
@@ -47,6 +48,9 @@ class SpanQuery {
   /// The values within the bound, ascending by distance, then value; nothing when no word of the
   /// text brought a candidate.
   std::optional<std::vector<ScoredValue>> run(std::u16string_view text);
+
+  /// Has the query tell what becomes of the trace's value. To be called before run().
+  void tellTo(SpanQueryTrace& trace) noexcept { _trace = &trace; }
 
   /// Whether a budget cut something off.
   bool truncated() const noexcept { return _truncated; }
@@ -65,7 +69,8 @@ class SpanQuery {
   CandidateSet mergeShortLists(const std::vector<WordHit>& hits) const;
   CandidateSet markLongLists(const std::vector<WordHit>& hits) const;
   void penaliseMissingHits();
-  void intersect(const CandidateSet& others);
+  std::int64_t disjointPenalty() const;
+  bool intersect(const CandidateSet& others);
   std::vector<ScoredValue> scored() const;
 
   const SearchImage& _image;
@@ -76,6 +81,7 @@ class SpanQuery {
   std::int64_t _searchedWords = 0;
   std::int64_t _countedWords = 0;
   bool _truncated = false;
+  SpanQueryTrace* _trace = nullptr;
 
   // The values in play, and what every one of them has been penalised by.
   std::vector<ScoredValue> _phrases;

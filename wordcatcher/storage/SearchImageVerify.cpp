@@ -246,9 +246,8 @@ void SearchImage::verifyValues() const {
   for (std::uint32_t value = 0; value < _valueCount; ++value) {
     const std::string_view text = valueText(value);
     const auto shape = verifyPhrases(value);
-    if (!fromUtf8(text) ||
-        (value > 0 && (shape < previousShape ||
-                       (shape == previousShape && !utf16Less(previous, text))))) {
+    if (!fromUtf8(text) || (value > 0 && (shape < previousShape || (shape == previousShape &&
+                                                                    !utf16Less(previous, text))))) {
       throwDamaged("its data strings are out of order or not UTF-8");
     }
     if (value == 0 || shape.fewestWords != previousShape.fewestWords ||

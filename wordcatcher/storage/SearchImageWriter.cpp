@@ -296,8 +296,8 @@ class Assembler {
   std::vector<image::Section> _sections;
 };
 
-/// How much room a vector should have for `more` elements: at least twice as much as before, so that
-/// adding stays linear.
+/// How much room a vector should have for `more` elements: at least twice as much as before, so
+/// that adding stays linear.
 std::size_t roomFor(const std::vector<std::uint32_t>& elements, std::size_t more) {
   const std::size_t needed = elements.size() + more;
   return needed <= elements.capacity() ? 0 : std::max(needed, 2 * elements.capacity());
@@ -455,9 +455,8 @@ SearchImageWriter::Content::Phrases SearchImageWriter::Content::gatherPhrases() 
       std::copy(kept.begin(), kept.end(), phrases.words.begin() + phrases.offsets[value]);
       phrases.sizes[value] = static_cast<std::uint32_t>(kept.size());
     }
-    phrases.shapes.push_back(image::shapeOf(phrases.of(value), [this](std::uint32_t word) {
-      return this->word(word).size();
-    }));
+    phrases.shapes.push_back(image::shapeOf(
+        phrases.of(value), [this](std::uint32_t word) { return this->word(word).size(); }));
   }
   return phrases;
 }
@@ -540,16 +539,15 @@ std::vector<std::byte> SearchImageWriter::finish() const {
     countedWords.push_back(content.countedWords(value));
   }
 
-  Assembler assembler(sizeof(std::uint16_t) * (labels.size() + labelled.labels().size()) +
-                      sizeof(TreeSlot) * (forward.slots().size() + backward.slots().size()) +
-                      sizeof(std::uint32_t) * (labelled.offsets().size() + 2U * wordCount() +
-                                               content.postings().size() + countedWords.size()) +
-                      sizeof(std::uint32_t) *
-                          (content.phraseOffsets().size() + content.phraseWords().size()) +
-                      sizeof(image::PhraseClass) * content.phraseClasses().size() +
-                      sizeof(std::uint64_t) *
-                          (content.postingOffsets().size() + valueOffsets.size()) +
-                      valueTexts.size());
+  Assembler assembler(
+      sizeof(std::uint16_t) * (labels.size() + labelled.labels().size()) +
+      sizeof(TreeSlot) * (forward.slots().size() + backward.slots().size()) +
+      sizeof(std::uint32_t) * (labelled.offsets().size() + 2U * wordCount() +
+                               content.postings().size() + countedWords.size()) +
+      sizeof(std::uint32_t) * (content.phraseOffsets().size() + content.phraseWords().size()) +
+      sizeof(image::PhraseClass) * content.phraseClasses().size() +
+      sizeof(std::uint64_t) * (content.postingOffsets().size() + valueOffsets.size()) +
+      valueTexts.size());
   assembler.add(SectionKind::labels, labels);
   assembler.add(SectionKind::wordOffsets, labelled.offsets());
   assembler.add(SectionKind::wordText, labelled.labels());

@@ -81,13 +81,15 @@ class SearchImageWriter {
   std::uint32_t _limit;
   std::uint64_t _phrases = 0;
   StringPool<char16_t> _words;
-  std::vector<std::uint32_t> _phraseWords;  // of each phrase: its value, its words, the last flagged
+  std::vector<std::uint32_t>
+      _phraseWords;  // of each phrase: its value, its words, the last flagged
   StringPool<char> _values;
   std::vector<std::uint32_t> _countedWords;
 };
 
 /// What a writer holds, numbered anew: words ascending by code units, values by the shapes of their
-/// phrases, then the code units of their UTF-16 forms. Refers to the writer, which must not change meanwhile.
+/// phrases, then the code units of their UTF-16 forms. Refers to the writer, which must not change
+/// meanwhile.
 class SearchImageWriter::Content {
  public:
   explicit Content(const SearchImageWriter& writer);

@@ -1,0 +1,141 @@
+#include "wordcatcher/fuzzy/NearWords.h"
+
+#include <algorithm>
+#include <bit>
+
+#include "wordcatcher/fuzzy/EditDistance.h"
+
+namespace wordcatcher {
+
+namespace {
+
+using image::TreeSlot;
+
+constexpr std::size_t kMaxJoined = 64;
+
+std::vector<std::uint16_t> labelsOf(const SearchImage& image, std::u16string_view word) {
+  std::vector<std::uint16_t> labels;
+  labels.reserve(word.size());
+  for (const char16_t unit : word) {
+    labels.push_back(image.labelOf(unit));
+  }
+  return labels;
+}
+
+/// The child of a place behind an edge, or 0.
+std::size_t childOf(const SearchImage& image, const SearchImage::Tree& tree, const TreeSlot& place,
+                    std::uint16_t label) {
+  const unsigned bit = image::labelBit(label);
+  if ((place.children >> bit & 1U) == 0) {
+    return 0;
+  }
+  const std::uint64_t before = place.children & ((std::uint64_t{1} << bit) - 1);
+  std::size_t child = place.index() + static_cast<unsigned>(std::popcount(before));
+  for (;; ++child) {
+    if (child >= tree.slots.size()) {
+      image.throwDamaged("a tree leads out of its section");
+    }
+    if (tree.slots[child].label == label) {
+      return child;
+    }
+    if (tree.slots[child].label > label || tree.slots[child].isLastChild()) {
+      return 0;
+    }
+  }
+}
+
+/// Calls `visit(word, length)` for every word of the image that the labels begin with, or end with
+/// in the backward tree, where they stand in reverse.
+template <typename Visit>
+void forEachWordAlong(const SearchImage& image, bool backward,
+                      std::span<const std::uint16_t> labels, Visit visit) {
+  const auto& tree = backward ? image.backward() : image.forward();
+  const auto wordAt = [&](std::size_t place) {
+    if (place >= image.wordCount()) {
+      image.throwDamaged("a tree has more leaves than words");
+    }
+    return tree.order.empty() ? static_cast<std::uint32_t>(place) : tree.order[place];
+  };
+  std::size_t slot = 0;
+  for (std::size_t depth = 0;; ++depth) {
+    const TreeSlot& place = tree.slots[slot];
+    if (depth > 0 && place.isLeaf()) {
+      for (std::size_t i = 0; i < place.children; ++i) {
+        const std::uint32_t word = wordAt(place.index() + i);
+        const auto own = image.labelsOf(word);
+        const bool isAlong = own.size() <= labels.size() &&
+                             (backward ? std::equal(own.rbegin(), own.rend(), labels.begin())
+                                       : std::equal(own.begin(), own.end(), labels.begin()));
+        if (isAlong) {
+          visit(word, own.size());
+        }
+      }
+      return;
+    }
+    if (const std::size_t end = childOf(image, tree, place, 0)) {
+      visit(wordAt(tree.slots[end].index()), depth);
+    }
+    if (depth == labels.size() || labels[depth] == 0) {
+      return;
+    }
+    slot = childOf(image, tree, place, labels[depth]);
+    if (slot == 0) {
+      return;
+    }
+  }
+}
+
+}  // namespace
+
+std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view word,
+                                std::uint32_t maxEdits, bool transpositions) {
+  std::vector<NearWord> found;
+  for (std::uint32_t other = 0; other < image.wordCount(); ++other) {
+    const std::size_t length = image.labelsOf(other).size();
+    if (length > word.size() + maxEdits || word.size() > length + maxEdits) {
+      continue;
+    }
+    const std::uint64_t edits = editDistance(word, image.textOf(other), transpositions);
+    if (edits <= maxEdits) {
+      found.push_back({other, static_cast<std::uint32_t>(edits)});
+    }
+  }
+  return found;
+}
+
+std::optional<std::uint32_t> exactWord(const SearchImage& image, std::u16string_view word) {
+  const auto labels = labelsOf(image, word);
+  std::optional<std::uint32_t> found;
+  forEachWordAlong(image, false, labels, [&](std::uint32_t other, std::size_t length) {
+    if (length == labels.size()) {
+      found = other;
+    }
+  });
+  return found;
+}
+
+std::vector<std::pair<std::uint32_t, std::uint32_t>> wordsJoinedIn(const SearchImage& image,
+                                                                   std::u16string_view word) {
+  auto labels = labelsOf(image, word);
+  std::vector<std::pair<std::size_t, std::uint32_t>> heads;
+  forEachWordAlong(image, false, labels, [&](std::uint32_t other, std::size_t length) {
+    if (length > 0 && length < labels.size()) {
+      heads.emplace_back(length, other);
+    }
+  });
+  std::vector<std::pair<std::uint32_t, std::uint32_t>> joined;
+  if (heads.empty()) {
+    return joined;
+  }
+  std::reverse(labels.begin(), labels.end());
+  forEachWordAlong(image, true, labels, [&](std::uint32_t other, std::size_t length) {
+    for (const auto& [headLength, head] : heads) {
+      if (headLength + length == labels.size() && joined.size() < kMaxJoined) {
+        joined.emplace_back(head, other);
+      }
+    }
+  });
+  return joined;
+}
+
+}  // namespace wordcatcher

@@ -1,0 +1,83 @@
+#include "wordcatcher/matcher/FindText.h"
+
+#include <unicode/uchar.h>
+#include <unicode/utf16.h>
+
+#include <utility>
+
+#include "wordcatcher/phonetic/KXMetaphone.h"
+#include "wordcatcher/text/ByteOffsets.h"
+#include "wordcatcher/text/Unicode.h"
+
+namespace wordcatcher {
+
+namespace {
+
+std::uint32_t limitOf(std::u16string_view word, const EditLimits& limits) {
+  if (word.size() > limits.mediumLength && word.size() > limits.shortLength) {
+    return holdsDigit(word) ? 0 : limits.longEdits;
+  }
+  const bool isShort = word.size() <= limits.shortLength;
+  return holdsDigit(word) ? 0 : (isShort ? limits.shortEdits : limits.mediumEdits);
+}
+
+}  // namespace
+
+FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& limits,
+                   WordSegmenter& segmenter, std::size_t maxWords, std::size_t maxWordUnits) {
+  const std::u16string units = decodeUtf8(text);
+  const auto add = [&](std::u16string word, std::size_t begin, std::size_t end,
+                       std::uint32_t limit) {
+    const bool isLookedUp = word.size() <= maxWordUnits;
+    truncated = truncated || !isLookedUp;
+    words.push_back(
+        {isLookedUp ? std::move(word) : std::u16string(), begin, end, limit, isLookedUp});
+  };
+  if (mode == MatchingMode::wholeText) {
+    if (!units.empty()) {
+      add(units.size() <= maxWordUnits ? toLower(units) : units, 0, text.size(),
+          limits.wholeTextEdits);
+    }
+    return;
+  }
+  const ByteOffsets offsets(text);
+  KXMetaphone encoder;
+  WordSegmenter codes(segmenter);
+  segmenter.start(units);
+  while (const auto token = segmenter.next()) {
+    if (words.size() >= maxWords) {
+      truncated = true;
+      return;
+    }
+    const auto first = static_cast<std::size_t>(token->data() - units.data());
+    const std::size_t begin = offsets.of(first);
+    const std::size_t end = offsets.of(first + token->size());
+    if (mode == MatchingMode::words || token->size() > maxWordUnits) {
+      std::u16string word(*token);
+      if (token->size() <= maxWordUnits) {
+        word = toLower(*token);
+      }
+      const std::uint32_t limit = limitOf(word, limits);
+      add(std::move(word), begin, end, limit);
+      continue;
+    }
+    const std::u16string code = encoder.translate(*token);
+    codes.start(code);
+    while (const auto word = codes.next()) {
+      add(toLower(*word), begin, end, 0);
+    }
+  }
+}
+
+bool holdsDigit(std::u16string_view word) noexcept {
+  for (std::size_t i = 0; i < word.size();) {
+    UChar32 character = 0;
+    U16_NEXT(word.data(), i, word.size(), character);
+    if (u_isdigit(character) != 0) {
+      return true;
+    }
+  }
+  return false;
+}
+
+}  // namespace wordcatcher

@@ -1,0 +1,41 @@
+#ifndef WORDCATCHER_MATCHER_FINDTEXT_H
+#define WORDCATCHER_MATCHER_FINDTEXT_H
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "wordcatcher/matcher/Find.h"
+#include "wordcatcher/matcher/IndexBuilder.h"
+#include "wordcatcher/text/WordSegmenter.h"
+
+namespace wordcatcher {
+
+/// A word of a text in which phrases are looked for.
+struct FindWord {
+  std::u16string word;  // as it is looked up: lower-cased, or a code, lower-cased
+  std::size_t begin;    // in the text, in bytes
+  std::size_t end;
+  std::uint32_t limit;  // edits
+  bool isLookedUp;      // false for a word beyond the budget
+};
+
+/// A text cut into the words that an index of some mode is asked for.
+struct FindText {
+  std::vector<FindWord> words;
+  bool truncated = false;  // whether a budget cut words off, or left one out
+
+  /// Budgets as in Index::Options. Linear in the text.
+  FindText(std::string_view text, MatchingMode mode, const EditLimits& limits, WordSegmenter& words,
+           std::size_t maxWords, std::size_t maxWordUnits);
+};
+
+/// Whether a string holds a decimal digit of any script: such words name numbers, of which one that
+/// is a digit off is another.
+bool holdsDigit(std::u16string_view word) noexcept;
+
+}  // namespace wordcatcher
+
+#endif

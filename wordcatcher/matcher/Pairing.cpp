@@ -1,0 +1,258 @@
+#include "wordcatcher/matcher/Pairing.h"
+
+#include <algorithm>
+#include <tuple>
+
+namespace wordcatcher {
+
+namespace {
+
+// Longer phrases are paired word by word: trying all goes as deep as there are words.
+constexpr std::size_t kMaxTriedWords = 256;
+
+auto quality(const PairingScore& score) {
+  return std::make_tuple(score.gain, score.words, score.exact, ~score.breaks);
+}
+
+std::uint64_t exactWords(const PairOption& option) {
+  return option.edits == 0 ? option.phraseWords : 0;
+}
+
+}  // namespace
+
+void Pairing::start() {
+  _options.clear();
+  _words.clear();
+  _phraseWords = 0;
+  _hasJoins = false;
+  _best.clear();
+  _bestScore = {};
+}
+
+void Pairing::nextWord() { ++_phraseWords; }
+
+void Pairing::add(const PairOption& option) {
+  const std::uint32_t position = _phraseWords - 1;
+  const auto number = static_cast<std::uint32_t>(_options.size());
+  if (_words.empty() || _words.back().position != position) {
+    _words.push_back({position, number, number, 0});
+  }
+  Word& word = _words.back();
+  word.endOption = number + 1;
+  word.bestGain = std::max(word.bestGain, option.gain());
+  _hasJoins = _hasJoins || option.textWords + option.phraseWords > 2;
+  _options.push_back(option);
+}
+
+PairingScore Pairing::solve(std::uint64_t& steps) {
+  if (_words.empty()) {
+    return {};
+  }
+  steps -= std::min<std::uint64_t>(steps, _options.size());
+  if (_hasJoins || !pairEachByItself()) {
+    tryAll(steps);
+  }
+  return _bestScore;
+}
+
+bool Pairing::follows(const Pair& last, std::uint32_t phrasePosition,
+                      const PairOption& option) const {
+  return last.phrasePosition + last.option.phraseWords == phrasePosition &&
+         last.option.position + last.option.textWords == option.position;
+}
+
+PairingScore Pairing::scoreOf(std::span<const Pair> pairs) const {
+  PairingScore score;
+  const Pair* last = nullptr;
+  for (const Pair& pair : pairs) {
+    score.gain += pair.option.gain();
+    score.words += pair.option.phraseWords;
+    score.exact += exactWords(pair.option);
+    score.breaks += last != nullptr && !follows(*last, pair.phrasePosition, pair.option) ? 1 : 0;
+    last = &pair;
+  }
+  return score;
+}
+
+/// Each word takes an option of its least edits; of these the ones with the fewest breaks. False
+/// when two words come to want the same word of the text.
+bool Pairing::pairEachByItself() {
+  _onward.assign(_options.size(), {0, kNone});
+  std::uint32_t bestOfNext = kNone;
+  for (std::size_t w = _words.size(); w-- > 0;) {
+    const Word& word = _words[w];
+    std::uint32_t best = kNone;
+    for (std::uint32_t i = word.firstOption; i < word.endOption; ++i) {
+      if (_options[i].gain() != word.bestGain) {
+        continue;
+      }
+      if (bestOfNext != kNone) {
+        const Word& next = _words[w + 1];
+        _onward[i] = {_onward[bestOfNext].breaks + 1, bestOfNext};
+        const auto begin = _options.begin() + next.firstOption;
+        const auto end = _options.begin() + next.endOption;
+        const auto adjacent = std::lower_bound(
+            begin, end, _options[i].position + 1,
+            [](const PairOption& option, std::uint32_t at) { return option.position < at; });
+        if (next.position == word.position + 1 && adjacent != end &&
+            adjacent->position == _options[i].position + 1 && adjacent->gain() == next.bestGain) {
+          const auto number = static_cast<std::uint32_t>(adjacent - _options.begin());
+          const std::uint64_t breaks = _onward[number].breaks;
+          if (breaks < _onward[i].breaks ||
+              (breaks == _onward[i].breaks && adjacent->position < _options[bestOfNext].position)) {
+            _onward[i] = {breaks, number};
+          }
+        }
+      }
+      if (best == kNone || _onward[i].breaks < _onward[best].breaks) {
+        best = i;
+      }
+    }
+    bestOfNext = best;
+  }
+  bool isFree = true;
+  std::uint32_t option = bestOfNext;
+  for (const Word& word : _words) {
+    _best.push_back({word.position, _options[option]});
+    isFree = isFree && _used[_options[option].position] == 0;
+    _used[_options[option].position] = 1;
+    option = _onward[option].next;
+  }
+  for (const Pair& pair : _best) {
+    _used[pair.option.position] = 0;
+  }
+  if (isFree) {
+    _bestScore = scoreOf(_best);
+  } else {
+    _best.clear();
+  }
+  return isFree;
+}
+
+void Pairing::tryAll(std::uint64_t& steps) {
+  _current.clear();
+  _currentScore = {};
+  if (_words.size() > kMaxTriedWords) {
+    _isExact = false;
+    for (const Word& word : _words) {
+      const std::uint32_t begin =
+          _current.empty() ? 0
+                           : _current.back().phrasePosition + _current.back().option.phraseWords;
+      const auto first = _options.begin() + word.firstOption;
+      const auto last = _options.begin() + word.endOption;
+      const auto found =
+          std::find_if(first, last, [this](const PairOption& option) { return isFree(option); });
+      if (word.position >= begin && found != last) {
+        use(*found, true);
+        _current.push_back({word.position, *found});
+      }
+    }
+    for (const Pair& pair : _current) {
+      use(pair.option, false);
+    }
+    _best = _current;
+    _bestScore = scoreOf(_best);
+    return;
+  }
+  _reachableFrom.assign(_words.size() + 1, {});
+  for (std::size_t w = _words.size(); w-- > 0;) {
+    PairingScore& reachable = _reachableFrom[w];
+    reachable = _reachableFrom[w + 1];
+    std::uint64_t words = 0;
+    std::uint64_t exact = 0;
+    for (std::uint32_t i = _words[w].firstOption; i < _words[w].endOption; ++i) {
+      words = std::max<std::uint64_t>(words, _options[i].phraseWords);
+      exact = std::max(exact, exactWords(_options[i]));
+    }
+    reachable.gain += _words[w].bestGain;
+    reachable.words += words;
+    reachable.exact += exact;
+  }
+  tryFrom(0, steps);
+}
+
+/// Whether the pairs in hand take later words of the text than the best ones, as far as they go.
+bool Pairing::isLater() const {
+  const std::size_t common = std::min(_current.size(), _best.size());
+  for (std::size_t i = 0; i < common; ++i) {
+    if (_current[i].option.position != _best[i].option.position) {
+      return _current[i].option.position > _best[i].option.position;
+    }
+  }
+  return _current.size() > _best.size();
+}
+
+bool Pairing::isFree(const PairOption& option) const {
+  return _used[option.position] == 0 && (option.textWords == 1 || _used[option.position + 1U] == 0);
+}
+
+void Pairing::use(const PairOption& option, bool isUsed) {
+  _used[option.position] = isUsed ? 1 : 0;
+  if (option.textWords == 2) {
+    _used[option.position + 1U] = isUsed ? 1 : 0;
+  }
+}
+
+void Pairing::tryFrom(std::size_t word, std::uint64_t& steps) {
+  if (steps == 0) {
+    _isExact = false;
+    return;
+  }
+  --steps;
+  if (word == _words.size()) {
+    if (quality(_currentScore) > quality(_bestScore) ||
+        (quality(_currentScore) == quality(_bestScore) && !isLater())) {
+      _best = _current;
+      _bestScore = _currentScore;
+    }
+    return;
+  }
+  const PairingScore& rest = _reachableFrom[word];
+  const PairingScore reachable = {_currentScore.gain + rest.gain, _currentScore.words + rest.words,
+                                  _currentScore.exact + rest.exact, _currentScore.breaks};
+  if (quality(reachable) < quality(_bestScore) ||
+      (quality(reachable) == quality(_bestScore) && isLater())) {
+    return;
+  }
+  const Word& at = _words[word];
+  const bool isTaken =
+      !_current.empty() &&
+      _current.back().phrasePosition + _current.back().option.phraseWords > at.position;
+  if (!isTaken) {
+    // First what follows the pair before, then the best of the others, the earliest first.
+    for (std::uint32_t i = at.firstOption; i < at.endOption; ++i) {
+      if (!_current.empty() && follows(_current.back(), at.position, _options[i])) {
+        tryOption(word, _options[i], steps);
+      }
+    }
+    for (const std::uint64_t gain : {6U, 5U, 4U, 3U, 2U, 1U}) {
+      for (std::uint32_t i = at.firstOption; i < at.endOption; ++i) {
+        if (_options[i].gain() == gain &&
+            (_current.empty() || !follows(_current.back(), at.position, _options[i]))) {
+          tryOption(word, _options[i], steps);
+        }
+      }
+    }
+  }
+  tryFrom(word + 1, steps);
+}
+
+void Pairing::tryOption(std::size_t word, const PairOption& option, std::uint64_t& steps) {
+  if (!isFree(option)) {
+    return;
+  }
+  const PairingScore before = _currentScore;
+  const std::uint32_t position = _words[word].position;
+  _currentScore.gain += option.gain();
+  _currentScore.words += option.phraseWords;
+  _currentScore.exact += exactWords(option);
+  _currentScore.breaks += !_current.empty() && !follows(_current.back(), position, option) ? 1 : 0;
+  use(option, true);
+  _current.push_back({position, option});
+  tryFrom(word + 1, steps);
+  _current.pop_back();
+  use(option, false);
+  _currentScore = before;
+}
+
+}  // namespace wordcatcher
