@@ -10,7 +10,7 @@ namespace wordcatcher::cli {
 namespace {
 
 constexpr const char* kSummary =
-    "Finds stored phrases in free text, tolerating spelling mistakes.\n";
+    "Finds stored phrases in free text, tolerating spelling mistakes\n";
 
 constexpr const char* kFooter = R"(
 Exit codes: 0 matches were found (or the index was written or is whole, or codes or a
