@@ -3,6 +3,7 @@
 #include <CLI/CLI.hpp>
 #include <array>
 #include <charconv>
+#include <cstdint>
 #include <map>
 #include <string>
 
@@ -14,6 +15,23 @@ constexpr std::size_t kFewestLimits = 3;
 
 const std::map<std::string, Overlaps> kOverlaps{
     {"all", Overlaps::all}, {"no-sub", Overlaps::noSub}, {"longest", Overlaps::longest}};
+
+/// Adds an option for a number from `least` on. CLI11 would take -1 for the largest of all.
+template <typename Number>
+CLI::Option* addCount(CLI::App& verb, const std::string& name, Number& number, std::uint64_t least,
+                      const std::string& description) {
+  const auto take = [&number, name, least](const std::string& text) {
+    std::uint64_t value = 0;
+    const char* const end = text.data() + text.size();
+    const auto [stop, error] = std::from_chars(text.data(), end, value);
+    if (error != std::errc() || stop != end || value < least) {
+      throw CLI::ValidationError(
+          name, "give a whole number from " + std::to_string(least) + " on, of 19 digits or fewer");
+    }
+    number = value;
+  };
+  return verb.add_option_function<std::string>(name, take, description)->type_name("N");
+}
 
 [[noreturn]] void throwBadEdits() {
   throw CLI::ValidationError("--edits", "give 3 or 4 numbers from 0 to " +
@@ -56,14 +74,11 @@ std::string editsDescription() {
 }  // namespace
 
 std::vector<CLI::Option*> addMatchOptions(CLI::App& verb, FindOptions& options) {
-  auto* const maxCost =
-      verb.add_option("--max-cost", options.maxCost, "The greatest cost of a match; default: any")
-          ->type_name("N");
-  auto* const minWords =
-      verb.add_option("--min-words", options.minWords, "Words of a phrase that the text must hold")
-          ->check(CLI::PositiveNumber)
-          ->type_name("N")
-          ->capture_default_str();
+  auto* const maxCost = addCount(verb, "--max-cost", options.maxCost, 0,
+                                 "The greatest cost of a match; default: any");
+  auto* const minWords = addCount(verb, "--min-words", options.minWords, 1,
+                                  "Words of a phrase that the text must hold")
+                             ->default_str(std::to_string(options.minWords));
   auto* const edits =
       verb.add_option_function<std::string>(
               "--edits", [&options](const std::string& list) { setEdits(list, options.edits); },
@@ -76,9 +91,8 @@ std::vector<CLI::Option*> addMatchOptions(CLI::App& verb, FindOptions& options) 
 }
 
 void addListOptions(CLI::App& verb, FindOptions& options) {
-  verb.add_option("--limit", options.limit, "Matches a text at the most, the best ones")
-      ->type_name("N")
-      ->capture_default_str();
+  addCount(verb, "--limit", options.limit, 0, "Matches a text at the most, the best ones")
+      ->default_str(std::to_string(options.limit));
   verb.add_option_function<std::string>(
           "--overlaps",
           [&options](const std::string& name) { options.overlaps = kOverlaps.at(name); },
@@ -87,10 +101,9 @@ void addListOptions(CLI::App& verb, FindOptions& options) {
           "\nlongest: those with the longest range\nDefault: all")
       ->check(CLI::IsMember(std::vector<std::string>{"all", "no-sub", "longest"}))
       ->type_name("WHICH");
-  verb.add_option("--max-postings", options.maxPostings,
-                  "Phrases under the words of a text that are looked at")
-      ->type_name("N")
-      ->capture_default_str();
+  addCount(verb, "--max-postings", options.maxPostings, 0,
+           "Phrases under the words of a text that are looked at")
+      ->default_str(std::to_string(options.maxPostings));
 }
 
 }  // namespace wordcatcher::cli

@@ -12,27 +12,28 @@ namespace wordcatcher::cli {
 
 namespace {
 
+std::string numbered(UChar32 character) {
+  std::ostringstream text;
+  text << "U+" << std::uppercase << std::hex << std::setfill('0') << std::setw(4) << character;
+  return text.str();
+}
+
 /// A label in quotes. Graphviz takes a backslash for the begin of an escape, and "&amp;" for what
-/// it is in HTML.
+/// it is in HTML; control characters have no place in a drawing.
 std::string quotedLabel(std::string_view label) {
   std::string text = "\"";
   for (const char c : label) {
     if (c == '&') {
       text += "&amp;";
-      continue;
+    } else if (c == '"' || c == '\\') {
+      text += {'\\', c};
+    } else if (u_iscntrl(static_cast<unsigned char>(c)) != 0 && static_cast<signed char>(c) >= 0) {
+      text += numbered(c);
+    } else {
+      text += c;
     }
-    if (c == '"' || c == '\\') {
-      text += '\\';
-    }
-    text += c;
   }
   return text += '"';
-}
-
-std::string numbered(UChar32 character) {
-  std::ostringstream text;
-  text << "U+" << std::uppercase << std::hex << std::setfill('0') << std::setw(4) << character;
-  return text.str();
 }
 
 }  // namespace

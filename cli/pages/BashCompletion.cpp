@@ -49,7 +49,7 @@ _wordcatcher() {
     if ((place >= ${#places[@]})) && [[ ${places[*]: -1} == *... ]]; then
       place=$((${#places[@]} - 1))
     fi
-    if [[ ${places[place]} == path* ]]; then
+    if [[ ${places[place]-} == path* ]]; then
       compopt -o filenames 2>/dev/null
       mapfile -t COMPREPLY < <(compgen -f -- "$current")
     fi

@@ -83,14 +83,11 @@ class Body {
     } else if (line.starts_with(kExitCodes)) {
       _troff +=
           ".SH EXIT STATUS\n" + escaped(std::string_view(line).substr(kExitCodes.size())) + '\n';
-    } else {
+    } else if (_troff.empty() && !line.empty()) {
+      _troff += ".SH DESCRIPTION\n" + escaped(line) + '\n';
+    } else if (!line.empty()) {
       // Two paragraph requests in a row, and one before a section, are one too many.
-      if (!line.empty()) {
-        _troff += (_troff.empty() ? ".SH DESCRIPTION\n"
-                   : _wasBlank    ? ".PP\n"
-                                  : "") +
-                  escaped(line) + '\n';
-      }
+      _troff += (_wasBlank ? ".PP\n" : "") + escaped(line) + '\n';
     }
     _wasBlank = line.empty();
   }
