@@ -578,7 +578,7 @@ class InfoTest(CommandTest):
         told = json.loads(self.succeed("info", "--json", self.dogs))
         self.assertRegex(told.pop("generation"), "^[0-9a-f]{32}$")
         self.assertEqual(told, {"mode": "words", "phrases": 2, "words": 5, "data": 2,
-                                "bytes": os.path.getsize(self.dogs), "version": 1})
+                                "bytes": os.path.getsize(self.dogs), "version": 2})
         lines = self.succeed("info", self.dogs).splitlines()
         self.assertEqual(lines[:4], ["mode\twords", "phrases\t2", "words\t5", "data\t2"])
         self.assertEqual(len(lines), 7)
