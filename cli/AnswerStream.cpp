@@ -15,6 +15,7 @@
 #include <map>
 #include <mutex>
 #include <optional>
+#include <system_error>
 #include <thread>
 #include <utility>
 
@@ -43,10 +44,15 @@ class Signal {
   Signal& operator=(const Signal&) = delete;
 
   int descriptor() const noexcept { return _descriptor; }
-  void raise() const noexcept { static_cast<void>(eventfd_write(_descriptor, 1)); }
+  bool raised() const noexcept { return _raised; }
+  void raise() noexcept {
+    _raised = true;
+    static_cast<void>(eventfd_write(_descriptor, 1));
+  }
 
  private:
   int _descriptor;
+  bool _raised = false;
 };
 
 /// Where the texts come from. One thread at a time.
@@ -88,18 +94,15 @@ class AnswerStream {
 
   /// One thread's share of the work; returns when nothing is left to do.
   void work() {
-    while (auto taken = take()) {
-      Answered answered;
-      answered.textBytes = taken->text.size();
-      answered.failure = taken->failure;
-      if (!answered.failure) {
-        try {
-          answered.answer = _answer(taken->text);
-        } catch (...) {
-          answered.failure = std::current_exception();
-        }
+    try {
+      while (auto taken = take()) {
+        handIn(taken->number, answerTo(*taken));
       }
-      handIn(taken->number, std::move(answered));
+    } catch (const OutputClosed&) {
+      // Whoever reads the answers has seen enough.
+      stop(nullptr);
+    } catch (...) {
+      stop(std::current_exception());
     }
   }
 
@@ -157,23 +160,30 @@ class AnswerStream {
     return _taken == _written || (_taken - _written < _ahead && _bytes < kBytesAhead);
   }
 
+  Answered answerTo(const Taken& taken) const {
+    Answered answered{taken.text.size(), {}, taken.failure};
+    if (!answered.failure) {
+      try {
+        answered.answer = _answer(taken.text);
+      } catch (...) {
+        answered.failure = std::current_exception();
+      }
+    }
+    return answered;
+  }
+
   void handIn(std::uint64_t number, Answered answered) {
     const std::lock_guard lock(_state);
     _bytes += answered.answer.output.size();
     _waiting.emplace(number, std::move(answered));
-    try {
-      while (!_stopped && !_waiting.empty() && _waiting.begin()->first == _written) {
-        write(_waiting.begin()->second);
-        _bytes -= _waiting.begin()->second.bytes();
-        _waiting.erase(_waiting.begin());
-        ++_written;
-      }
-    } catch (const OutputClosed&) {
-      // Whoever reads the answers has seen enough.
-      stop();
-    } catch (...) {
-      _failure = std::current_exception();
-      stop();
+    while (!_stopped && !_waiting.empty() && _waiting.begin()->first == _written) {
+      // Until all of it is written nothing more is.
+      _stopped = true;
+      write(_waiting.begin()->second);
+      _stopped = false;
+      _bytes -= _waiting.begin()->second.bytes();
+      _waiting.erase(_waiting.begin());
+      ++_written;
     }
     _room.notify_all();
   }
@@ -190,9 +200,14 @@ class AnswerStream {
     }
   }
 
-  void stop() {
-    _stopped = true;
-    _stopReading.raise();
+  void stop(const std::exception_ptr& failure) {
+    const std::lock_guard lock(_state);
+    if (!_stopReading.raised()) {
+      _failure = failure;
+      _stopped = true;
+      _stopReading.raise();
+      _room.notify_all();
+    }
   }
 
   Signal _stopReading;
@@ -225,8 +240,12 @@ ExitCode answerInOrder(const std::vector<std::string>& texts, const AnswerText& 
   AnswerStream stream(texts, answer, threads);
   {
     std::vector<std::jthread> others;
-    while (others.size() + 1 < threads) {
-      others.emplace_back([&stream] { stream.work(); });
+    try {
+      while (others.size() + 1 < threads) {
+        others.emplace_back([&stream] { stream.work(); });
+      }
+    } catch (const std::system_error&) {
+      // No more threads are to be had: those that there are do the same.
     }
     stream.work();
   }
