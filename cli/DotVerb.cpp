@@ -11,10 +11,10 @@
 #include "cli/Failure.h"
 #include "cli/Graph.h"
 #include "cli/Output.h"
-#include "cli/Utf8.h"
 #include "cli/Verbs.h"
 #include "cli/WordTree.h"
 #include "wordcatcher/fuzzy/LXFuzzyIndex.h"
+#include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher::cli {
 
@@ -104,7 +104,7 @@ Graph drawn(const Automaton& automaton, const std::string& title, const Targets&
     }
     pending.push_back(name);
     const std::size_t node =
-        graph.addNode(toUtf8(name.description()), automaton.isFinalState(name));
+        graph.addNode(displayUtf8(name.description()), automaton.isFinalState(name));
     return nodes.emplace(name, node).first->second;
   };
   graph.markStart(nodeOf(*automaton.startState()));

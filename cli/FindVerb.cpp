@@ -12,7 +12,7 @@
 #include "cli/Highlight.h"
 #include "cli/Modes.h"
 #include "cli/OpenIndex.h"
-#include "cli/Utf8.h"
+#include "cli/Substitutes.h"
 #include "cli/Verbs.h"
 
 namespace wordcatcher::cli {

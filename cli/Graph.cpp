@@ -6,7 +6,7 @@
 #include <iomanip>
 #include <sstream>
 
-#include "cli/Utf8.h"
+#include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher::cli {
 
@@ -66,7 +66,7 @@ std::string visible(std::u16string_view units) {
     U16_NEXT(units.data(), i, units.size(), character);
     text += U_IS_SURROGATE(character) || u_isgraph(character) == 0
                 ? numbered(character)
-                : toUtf8(units.substr(begin, i - begin));
+                : displayUtf8(units.substr(begin, i - begin));
   }
   return text;
 }

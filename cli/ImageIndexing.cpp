@@ -1,3 +1,6 @@
+#include <filesystem>
+#include <system_error>
+
 #include "cli/Failure.h"
 #include "cli/Indexing.h"
 #include "cli/InterruptGuard.h"
@@ -22,6 +25,12 @@ void checkNamesFile(const std::string& target) {
         quoted(target) +
         " is a directory: name a file such as \"names.wci\", or give --tables to write the "
         "tables of a classic index there.");
+  }
+  const auto parent = std::filesystem::path(target).parent_path();
+  std::error_code unknown;  // what cannot be told now is told when the file is written
+  if (!parent.empty() && !std::filesystem::is_directory(parent, unknown)) {
+    throw Failure("There is no directory " + quoted(parent.string()) +
+                  " for the index: create it, or choose another place.");
   }
 }
 

@@ -11,7 +11,7 @@
 #include <utility>
 
 #include "cli/Failure.h"
-#include "cli/Utf8.h"
+#include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher::cli {
 

@@ -63,7 +63,7 @@ std::string phraseOf(const std::string& value) { return value.substr(0, value.fi
 class IndexTest : public ::testing::TestWithParam<MatchingMode> {
  protected:
   std::string build(MatchingMode mode) {
-    const std::string path = directory.file("names.wci");
+    std::string path = directory.file("names.wci");
     IndexBuilder builder(path, {.mode = mode, .tables = directory.path()});
     for (const auto& value : kPhrases) {
       builder.add(phraseOf(value), value);

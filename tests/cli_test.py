@@ -275,7 +275,11 @@ class ImageIndexTest(IndexTest):
         self.assertEqual(sorted(os.listdir(self.path("kennel"))), sorted(TABLES))
 
     def test_place_that_cannot_be_written(self):
-        self.fail_with("its directory", of=["index", self.path("no", "dogs.wci")], stdin=DOGS)
+        self.write("names.txt", DOGS)
+        for place in ("no", "names.txt"):
+            # Before any input is looked at.
+            self.fail_with("no directory", f'{place}"', "create it",
+                           of=["index", self.path(place, "dogs.wci"), self.path("missing")])
         os.mkfifo(self.path("pipe"))
         self.fail_with("regular file", of=["index", self.path("pipe")], stdin=DOGS)
 

@@ -125,13 +125,13 @@ struct WalkMemory {
 /// With two lanes, a word is accepted when lane 0 accepts it, at the distance in lane 1, if that
 /// accepts it, too: forward as from the start; backward so that nothing is left out behind the last
 /// code unit read, which is the word's first.
-template <unsigned K, unsigned Lanes>
+template <unsigned K, unsigned Lanes, typename Pattern = BandedPattern<K, Lanes>>
 class BandedWalk {
  public:
-  using B = Band<K, Lanes>;
+  using B = typename Pattern::B;
 
   BandedWalk(const SearchImage& image, const SearchImage::Tree& tree, bool backward,
-             const BandedPattern<K, Lanes>& pattern, WalkMemory& memory)
+             const Pattern& pattern, WalkMemory& memory)
       : _image(image),
         _tree(tree),
         _backward(backward),
@@ -384,7 +384,7 @@ class BandedWalk {
   const SearchImage& _image;
   const SearchImage::Tree& _tree;
   bool _backward;
-  const BandedPattern<K, Lanes>& _pattern;
+  const Pattern& _pattern;
   WalkMemory& _memory;
   VisitBudget _budget;
   std::array<LeafWord, kLeafWords> _leafWords;

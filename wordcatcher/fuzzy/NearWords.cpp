@@ -3,7 +3,8 @@
 #include <algorithm>
 #include <bit>
 
-#include "wordcatcher/fuzzy/EditDistance.h"
+#include "wordcatcher/fuzzy/BandedWalk.h"
+#include "wordcatcher/fuzzy/SwapAutomaton.h"
 
 namespace wordcatcher {
 
@@ -85,21 +86,64 @@ void forEachWordAlong(const SearchImage& image, bool backward,
   }
 }
 
+/// Two walks, each with few edits in the half of the query that it reads first; see
+/// ImageSearch.cpp. A swap across the middle is allowed to both. Walks along the whole query count
+/// the least edits that their limits allow, so a word that both meet has the lesser of its two
+/// counts: with all edits in reach of one half, that is the distance.
+template <unsigned K>
+void searchWithin(const SearchImage& image, const std::vector<std::uint16_t>& labels, bool swaps,
+                  std::vector<NearWord>& found) {
+  constexpr std::size_t kMinSplitLength = 2 + 2 * std::size_t{K};
+  const auto accept = [&found](std::uint32_t word, std::uint32_t edits, std::size_t) {
+    found.push_back({word, edits});
+  };
+  WalkMemory memory;
+  using Walk = BandedWalk<K, 1, SwapPattern<K>>;
+  if (labels.size() < kMinSplitLength) {
+    const SwapPattern<K> whole(labels, swaps, 0, K);
+    Walk(image, image.forward(), false, whole, memory).run(whole.start(), accept);
+    return;
+  }
+  constexpr unsigned kInFirst = K / 2;
+  constexpr unsigned kInSecond = K - kInFirst - 1;
+  const std::size_t half = (labels.size() + kInFirst - kInSecond) / 2;
+  const std::vector<std::uint16_t> reversed(labels.rbegin(), labels.rend());
+  const SwapPattern<K> first(labels, swaps, half, kInFirst);
+  const SwapPattern<K> second(reversed, swaps, labels.size() - half, kInSecond);
+  Walk(image, image.forward(), false, first, memory).run(first.start(), accept);
+  Walk(image, image.backward(), true, second, memory).run(second.start(), accept);
+}
+
 }  // namespace
 
 std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view word,
                                 std::uint32_t maxEdits, bool transpositions) {
   std::vector<NearWord> found;
-  for (std::uint32_t other = 0; other < image.wordCount(); ++other) {
-    const std::size_t length = image.labelsOf(other).size();
-    if (length > word.size() + maxEdits || word.size() > length + maxEdits) {
-      continue;
-    }
-    const std::uint64_t edits = editDistance(word, image.textOf(other), transpositions);
-    if (edits <= maxEdits) {
-      found.push_back({other, static_cast<std::uint32_t>(edits)});
-    }
+  if (word.empty()) {
+    return found;
   }
+  const auto labels = labelsOf(image, word);
+  switch (maxEdits) {
+    case 0:
+      if (const auto same = exactWord(image, word)) {
+        found.push_back({*same, 0});
+      }
+      return found;
+    case 1:
+      searchWithin<1>(image, labels, transpositions, found);
+      break;
+    case 2:
+      searchWithin<2>(image, labels, transpositions, found);
+      break;
+    default:
+      searchWithin<3>(image, labels, transpositions, found);
+      break;
+  }
+  std::sort(found.begin(), found.end(), [](const NearWord& a, const NearWord& b) {
+    return a.word != b.word ? a.word < b.word : a.edits < b.edits;
+  });
+  const auto sameWord = [](const NearWord& a, const NearWord& b) { return a.word == b.word; };
+  found.erase(std::unique(found.begin(), found.end(), sameWord), found.end());
   return found;
 }
 

@@ -3,6 +3,7 @@
 #include <unicode/uchar.h>
 #include <unicode/utf16.h>
 
+#include <optional>
 #include <utility>
 
 #include "wordcatcher/phonetic/KXMetaphone.h"
@@ -12,6 +13,26 @@
 namespace wordcatcher {
 
 namespace {
+
+/// The codes of words, as an index of codes holds them.
+class CodeWords {
+ public:
+  explicit CodeWords(const WordSegmenter& rules) : _segmenter(rules) {}
+
+  std::vector<std::u16string> of(std::u16string_view word) {
+    std::vector<std::u16string> codes;
+    const std::u16string translated = _encoder.translate(word);
+    _segmenter.start(translated);
+    while (const auto code = _segmenter.next()) {
+      codes.push_back(toLower(*code));
+    }
+    return codes;
+  }
+
+ private:
+  KXMetaphone _encoder;
+  WordSegmenter _segmenter;
+};
 
 std::uint32_t limitOf(std::u16string_view word, const EditLimits& limits) {
   if (word.size() > limits.mediumLength && word.size() > limits.shortLength) {
@@ -41,8 +62,10 @@ FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& l
     return;
   }
   const ByteOffsets offsets(text);
-  KXMetaphone encoder;
-  WordSegmenter codes(segmenter);
+  std::optional<CodeWords> codes;
+  if (mode == MatchingMode::phoneticWords) {
+    codes.emplace(segmenter);
+  }
   segmenter.start(units);
   while (const auto token = segmenter.next()) {
     if (words.size() >= maxWords) {
@@ -61,10 +84,8 @@ FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& l
       add(std::move(word), begin, end, limit);
       continue;
     }
-    const std::u16string code = encoder.translate(*token);
-    codes.start(code);
-    while (const auto word = codes.next()) {
-      add(toLower(*word), begin, end, 0);
+    for (const auto& code : codes->of(*token)) {
+      add(code, begin, end, 0);
     }
   }
 }

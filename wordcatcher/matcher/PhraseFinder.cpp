@@ -22,7 +22,11 @@ constexpr std::uint64_t kStepsAPosting = 1;
 
 std::uint64_t apart(std::uint64_t a, std::uint64_t b) { return a < b ? b - a : a - b; }
 
-std::uint32_t hashOf(std::uint32_t word) { return word * 0x9E3779B1U; }
+/// All of the order but the code units and the value.
+auto keyOf(const RankedPhrase& phrase) {
+  return std::make_tuple(phrase.cost, ~phrase.words, ~phrase.exact, phrase.breaks, phrase.rarity,
+                         phrase.length);
+}
 
 }  // namespace
 
@@ -74,7 +78,6 @@ void PhraseFinder::lookUpJoins() {
     }
     if (const auto word = exactWord(_image, first.word + second.word)) {
       _wordOptions.push_back({*word, {position, 2, 1, kJoinEdits}});
-      _joins = true;
     }
   }
 }
@@ -83,7 +86,6 @@ void PhraseFinder::lookUpSplits() {
   for (std::uint32_t position = 0; position < _text.words.size(); ++position) {
     for (const auto& [head, tail] : wordsJoinedIn(_image, _text.words[position].word)) {
       _splits.push_back({head, tail, position});
-      _joins = true;
     }
   }
   std::sort(_splits.begin(), _splits.end(), [](const Split& a, const Split& b) {
@@ -101,7 +103,7 @@ void PhraseFinder::makeTable() {
     if (i > 0 && _wordOptions[i].word == _wordOptions[i - 1].word) {
       continue;
     }
-    std::size_t slot = hashOf(_wordOptions[i].word) & (_table.size() - 1);
+    std::size_t slot = hashOfNumber(_wordOptions[i].word) & (_table.size() - 1);
     while (_table[slot] != 0) {
       slot = (slot + 1) & (_table.size() - 1);
     }
@@ -110,7 +112,7 @@ void PhraseFinder::makeTable() {
 }
 
 std::span<const PhraseFinder::WordOption> PhraseFinder::optionsOf(std::uint32_t word) const {
-  for (std::size_t slot = hashOf(word) & (_table.size() - 1); _table[slot] != 0;
+  for (std::size_t slot = hashOfNumber(word) & (_table.size() - 1); _table[slot] != 0;
        slot = (slot + 1) & (_table.size() - 1)) {
     const auto first = _wordOptions.begin() + (_table[slot] - 1);
     if (first->word == word) {
@@ -146,37 +148,64 @@ void PhraseFinder::makeSources() {
     Source source = {UINT32_MAX, UINT32_MAX, _image.postingsOf(word)};
     for (; each != _wordOptions.end() && each->word == word; ++each) {
       const PairOption& option = each->option;
-      source.rank = std::min(source.rank, _ranks[option.position]);
-      if (option.textWords == 2) {
-        source.rank = std::min(source.rank, _ranks[option.position + 1U]);
+      if (option.textWords == 1) {
+        source.rank = std::min(source.rank, _ranks[option.position]);
+        source.edits = std::min<std::uint32_t>(source.edits, option.edits);
       }
-      // The edit of a join is part of the bound already.
-      source.edits =
-          std::min<std::uint32_t>(source.edits, option.textWords == 2 ? 0U : option.edits);
     }
-    _sources.push_back(source);
+    if (source.edits != UINT32_MAX) {
+      _sources.push_back(source);
+    }
   }
-  _joinedLists.reserve(_splits.size());
+}
+
+/// Phrases in which words are joined or split are judged before all others, for which the bounds
+/// hold then.
+void PhraseFinder::judgeJoined() {
+  for (const WordOption& each : _wordOptions) {
+    if (each.option.textWords == 2) {
+      judgeAll(_image.postingsOf(each.word));
+    }
+  }
   for (const Split& split : _splits) {
     const auto heads = _image.postingsOf(split.head);
     const auto tails = _image.postingsOf(split.tail);
-    auto& list = _joinedLists.emplace_back();
     const auto& few = heads.size() < tails.size() ? heads : tails;
     const auto& many = heads.size() < tails.size() ? tails : heads;
-    if (few.size() > _postings) {
-      _truncated = true;
-      continue;
-    }
-    _postings -= few.size();
+    std::vector<std::uint32_t> both;
     auto from = many.begin();
     for (const std::uint32_t value : few) {
+      if (!spendPosting()) {
+        return;
+      }
       from = std::lower_bound(from, many.end(), value);
       if (from != many.end() && *from == value) {
-        list.push_back(value);
+        both.push_back(value);
       }
     }
-    _sources.push_back({_ranks[split.position], 0, list});
+    judgeAll(both);
   }
+}
+
+void PhraseFinder::judgeAll(std::span<const std::uint32_t> values) {
+  for (const std::uint32_t value : values) {
+    if (!spendPosting()) {
+      return;
+    }
+    if (_judged.insert(value).isNew) {
+      judgeAndKeep(value);
+    }
+  }
+}
+
+/// False when the budget is used up.
+bool PhraseFinder::spendPosting() {
+  if (_postings == 0) {
+    _truncated = true;
+    return false;
+  }
+  --_postings;
+  return true;
 }
 
 /// The least cost of a phrase that this source is the first to bring.
@@ -187,7 +216,7 @@ std::uint64_t PhraseFinder::leastCost(const Source& source,
       phraseClass.mostWords == image::kShapeCap ? UINT64_MAX : phraseClass.mostWords;
   const std::uint64_t nearest = std::clamp<std::uint64_t>(
       left, phraseClass.fewestWords, std::max<std::uint64_t>(most, phraseClass.fewestWords));
-  return 2 * std::uint64_t{source.rank} + (_joins ? 1U : 2U) * apart(nearest, left) + source.edits;
+  return 2 * std::uint64_t{source.rank} + 2 * apart(nearest, left) + source.edits;
 }
 
 void PhraseFinder::addSegments(std::uint32_t number, std::vector<Segment>& segments) const {
@@ -235,6 +264,7 @@ std::vector<RankedPhrase> PhraseFinder::run(std::size_t limit) {
   }
   rankWords();
   makeSources();
+  judgeJoined();
   for (const Segment& segment : segments()) {
     if ((_options.maxCost && segment.bound > *_options.maxCost) ||
         (isFull() && segment.bound > _kept.front().cost)) {
@@ -249,35 +279,64 @@ std::vector<RankedPhrase> PhraseFinder::run(std::size_t limit) {
   return std::move(_kept);
 }
 
+/// Whether a source is of the text's most frequent word: what it is the first to bring has no
+/// other.
+bool PhraseFinder::isLast(const Source& source) const {
+  return source.rank + 1U == _text.words.size();
+}
+
+bool PhraseFinder::isOfOneLength(const Segment& segment) const {
+  const auto& phraseClass = _image.phraseClasses()[segment.phraseClass];
+  return phraseClass.fewestWords == phraseClass.mostWords &&
+         phraseClass.mostWords < image::kShapeCap;
+}
+
 /// Whether a phrase that costs just the segment's bound could come before the last one kept. It has
 /// no more words of the text than are left, nor than it has itself.
 bool PhraseFinder::canImprove(const Segment& segment) const {
-  if (!isFull() || segment.bound < _kept.front().cost || _joins) {
+  if (!isFull() || segment.bound < _kept.front().cost) {
     return true;
   }
-  const std::uint64_t left = _text.words.size() - _sources[segment.source].rank;
+  const Source& source = _sources[segment.source];
   const auto& phraseClass = _image.phraseClasses()[segment.phraseClass];
-  return std::min<std::uint64_t>(left, phraseClass.mostWords) >= _kept.front().words;
+  RankedPhrase best;
+  best.cost = segment.bound;
+  best.words = std::min<std::uint64_t>(_text.words.size() - source.rank, phraseClass.mostWords);
+  best.exact = best.words;
+  if (isLast(source)) {
+    best.exact = source.edits == 0 ? 1 : 0;
+    best.rarity = source.values.size();
+  }
+  best.length = phraseClass.fewestWords;
+  return !(keyOf(_kept.front()) < keyOf(best));
 }
 
 void PhraseFinder::read(const Segment& segment) {
-  const auto values =
-      _sources[segment.source].values.subspan(segment.begin, segment.end - segment.begin);
+  const Source& source = _sources[segment.source];
+  const auto values = source.values.subspan(segment.begin, segment.end - segment.begin);
+  const bool isAlone = isLast(source) && isOfOneLength(segment);
   for (const std::uint32_t value : values) {
-    if (_postings == 0) {
-      _truncated = true;
+    if (!spendPosting()) {
       return;
     }
-    --_postings;
-    if (_judged.insert(value).second) {
-      if (const auto phrase = judge(value)) {
-        keep(*phrase);
-      }
+    if (_judged.insert(value).isNew && !judgeAndKeep(value) && isAlone) {
+      return;
     }
   }
 }
 
-void PhraseFinder::keep(const RankedPhrase& phrase) {
+/// False when the value is not kept, nor would be any value behind it of the same class that shares
+/// the same one word with the text: one with several phrases says nothing about those.
+bool PhraseFinder::judgeAndKeep(std::uint32_t value) {
+  const auto phrase = judge(value);
+  if (!phrase) {
+    return true;
+  }
+  return keep(*phrase) || phrase->phrase.size() != _image.phrasesOf(value).size();
+}
+
+/// Whether the phrase is among the best so far.
+bool PhraseFinder::keep(const RankedPhrase& phrase) {
   const auto before = [this](const RankedPhrase& a, const RankedPhrase& b) {
     return comesBefore(a, b);
   };
@@ -286,11 +345,15 @@ void PhraseFinder::keep(const RankedPhrase& phrase) {
     if (isFull()) {
       std::make_heap(_kept.begin(), _kept.end(), before);
     }
-  } else if (comesBefore(phrase, _kept.front())) {
-    std::pop_heap(_kept.begin(), _kept.end(), before);
-    _kept.back() = phrase;
-    std::push_heap(_kept.begin(), _kept.end(), before);
+    return true;
   }
+  if (!comesBefore(phrase, _kept.front())) {
+    return false;
+  }
+  std::pop_heap(_kept.begin(), _kept.end(), before);
+  _kept.back() = phrase;
+  std::push_heap(_kept.begin(), _kept.end(), before);
+  return true;
 }
 
 std::uint64_t PhraseFinder::unitsOf(std::span<const std::uint32_t> phrase) const {
@@ -302,12 +365,13 @@ std::uint64_t PhraseFinder::unitsOf(std::span<const std::uint32_t> phrase) const
 }
 
 bool PhraseFinder::comesBefore(const RankedPhrase& a, const RankedPhrase& b) const {
-  const auto key = [](const RankedPhrase& phrase) {
-    return std::make_tuple(phrase.cost, ~phrase.words, ~phrase.exact, phrase.breaks, phrase.rarity,
-                           phrase.length);
-  };
-  if (key(a) != key(b)) {
-    return key(a) < key(b);
+  if (keyOf(a) != keyOf(b)) {
+    return keyOf(a) < keyOf(b);
+  }
+  // Values are numbered by shape and text: of two with one phrase each, this decides.
+  if (a.phrase.size() == _image.phrasesOf(a.value).size() &&
+      b.phrase.size() == _image.phrasesOf(b.value).size()) {
+    return a.value < b.value;
   }
   const std::uint64_t aUnits = unitsOf(a.phrase);
   const std::uint64_t bUnits = unitsOf(b.phrase);

@@ -10,22 +10,23 @@
 // brings leaves these r words over; with n words in the text and m in the phrase it then costs at
 // least
 //
-//     2 (n - q) + 2 |m - q|  for q = n - r, or 2 (n - q) + |m - q| where words may be joined,
+//     2 (n - q) + 2 |m - q|  for q = n - r
 //
-// and the edits of the source that brings it. Phrases stand in every posting list by their lengths,
-// so a list falls into segments, each with one such bound. Segments are read in the order of their
-// bounds, until the bound exceeds the cost of the last of the best k: nothing that is left can be
-// among them. So a text that holds a phrase is answered from its rare words' lists, and frequent
-// words only lend their shortest phrases.
+// and the edits of the source that brings it. (Phrases of which words are joined or split may cost
+// less. There are few, and all of them are judged first.) Phrases stand in every posting list by
+// their lengths, so a list falls into segments, each with one such bound. Segments are read in the
+// order of their bounds, until the bound exceeds the cost of the last of the best k: nothing that
+// is left can be among them. So a text that holds a phrase is answered from its rare words' lists,
+// and frequent words only lend their shortest phrases.
 
 #include <cstdint>
 #include <optional>
 #include <span>
-#include <unordered_set>
 #include <vector>
 
 #include "wordcatcher/matcher/Find.h"
 #include "wordcatcher/matcher/FindText.h"
+#include "wordcatcher/matcher/NumberIndex.h"
 #include "wordcatcher/matcher/Pairing.h"
 #include "wordcatcher/storage/SearchImage.h"
 
@@ -70,7 +71,7 @@ class PhraseFinder {
   bool comesBefore(const RankedPhrase& a, const RankedPhrase& b) const;
 
  private:
-  /// A stored word near words of the text, or two that stand in one: a list of candidates.
+  /// A stored word near words of the text, with a list of candidates.
   struct Source {
     std::uint32_t rank = 0;  // of the first word of the text that it is near to
     std::uint32_t edits = 0;
@@ -107,7 +108,13 @@ class PhraseFinder {
   std::uint64_t leastCost(const Source& source, const image::PhraseClass& phraseClass) const;
   bool canImprove(const Segment& segment) const;
   void read(const Segment& segment);
-  void keep(const RankedPhrase& phrase);
+  bool isLast(const Source& source) const;
+  bool isOfOneLength(const Segment& segment) const;
+  void judgeJoined();
+  void judgeAll(std::span<const std::uint32_t> values);
+  bool judgeAndKeep(std::uint32_t value);
+  bool spendPosting();
+  bool keep(const RankedPhrase& phrase);
   bool isFull() const noexcept { return _kept.size() >= _limit; }
   void namePairs(std::span<const std::uint32_t> phrase);
   template <typename Admit>
@@ -120,7 +127,6 @@ class PhraseFinder {
   const SearchImage& _image;
   const FindText& _text;
   const FindOptions& _options;
-  bool _joins = false;  // whether words of this text may be joined or split
   std::size_t _limit = 0;
 
   std::vector<WordOption> _wordOptions;  // ascending by word, then position
@@ -128,13 +134,12 @@ class PhraseFinder {
   std::vector<std::uint32_t> _table;     // hash table: where a word's options begin, and one
   std::vector<std::uint32_t> _ranks;     // of the text's words
   std::vector<Source> _sources;
-  std::vector<std::vector<std::uint32_t>> _joinedLists;
 
   Pairing _pairing;
   std::uint64_t _postings;  // budgets that are left
   std::uint64_t _steps;
   bool _truncated = false;
-  std::unordered_set<std::uint32_t> _judged;
+  NumberIndex _judged;
   std::vector<RankedPhrase> _kept;  // a heap, the last in order on top, once it is full
 };
 
