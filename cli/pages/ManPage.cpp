@@ -173,8 +173,8 @@ std::string manPage(const Command& command) {
   for (char& c : title) {
     c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
   }
-  return ".TH " + escaped(title) + " 1 \"\" \"wordcatcher " + versionString +
-         "\" \"User Commands\"\n.SH NAME\n" + escaped(pageName(command)) + " \\- " +
+  return ".TH " + escaped(title) + R"( 1 "" "wordcatcher )" + versionString +
+         R"(" "User Commands")" + "\n.SH NAME\n" + escaped(pageName(command)) + " \\- " +
          escaped(command.summary) + "\n.SH SYNOPSIS\n" + synopsis(command) + arguments(command) +
          verbs(command) + options(command) + Body().of(command.footer) + seeAlso(command);
 }

@@ -31,8 +31,9 @@ std::string specified(const Command::Option& option) {
   const std::string value = option.value.empty() ? "" : ':' + option.value + ':' + choices;
   std::string text;
   for (const auto& name : option.names) {
-    text += " \\\n    '" + name + (option.value.empty() ? "" : "=") + '[' +
-            message(option.description) + ']' + value + '\'';
+    text += " \\\n    '" + name;
+    text += option.value.empty() ? "[" : "=[";
+    text += message(option.description) + ']' + value + '\'';
   }
   return text;
 }
