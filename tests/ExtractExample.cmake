@@ -1,10 +1,10 @@
-# Writes a C++ example of the README to a source file: the first with the fence FENCE. One without a
-# main() gets one, and the output that it needs. Arguments: README, FENCE, OUTPUT.
-file(READ "${README}" page)
+# Writes an example of a page to a source file: the first with the fence FENCE. One in C++ without a
+# main() gets one, and the output that it needs. Arguments: PAGE, FENCE, OUTPUT.
+file(READ "${PAGE}" page)
 string(REPLACE "+" "[+]" fence "${FENCE}")
 string(REGEX MATCH "```${fence}\n([^`]*)```" found "${page}")
 if(NOT found)
-  message(FATAL_ERROR "the README has no example with the fence ${FENCE}")
+  message(FATAL_ERROR "${PAGE} has no example with the fence ${FENCE}")
 endif()
 set(source "${CMAKE_MATCH_1}")
 if(NOT source MATCHES "int main")

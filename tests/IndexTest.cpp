@@ -236,7 +236,7 @@ TEST_P(WordIndexTest, InfoTellsWhatIsThere) {
   EXPECT_EQ(info.words, 24U);
   EXPECT_EQ(info.bytes, std::filesystem::file_size(path));
   EXPECT_EQ(info.generation.size(), 32U);
-  EXPECT_EQ(info.version, 1U);
+  EXPECT_EQ(info.version, 2U);
   buildWords();
   EXPECT_NE(Index::open(path).info().generation, info.generation);
 }

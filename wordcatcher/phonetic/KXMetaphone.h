@@ -34,6 +34,11 @@ class WORDCATCHER_EXPORT KXMetaphone {
   /// Loads the word-boundary rules, which takes far longer than encoding a word: keep the encoder.
   /// Throws std::runtime_error if ICU's data, which holds them, is missing.
   KXMetaphone();
+
+  /// The same, with a copy of rules that are loaded already, at a tenth of the cost. Several threads
+  /// may make theirs from the same rules while nobody uses these.
+  explicit KXMetaphone(const WordSegmenter& rules);
+
   ~KXMetaphone();
   KXMetaphone(const KXMetaphone&) = delete;
   KXMetaphone& operator=(const KXMetaphone&) = delete;
