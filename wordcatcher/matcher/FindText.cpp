@@ -55,6 +55,7 @@ FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& l
         {isLookedUp ? std::move(word) : std::u16string(), begin, end, limit, isLookedUp});
   };
   if (mode == MatchingMode::wholeText) {
+    hasNumbers = false;
     if (!units.empty()) {
       add(units.size() <= maxWordUnits ? toLower(units) : units, 0, text.size(),
           limits.wholeTextEdits);

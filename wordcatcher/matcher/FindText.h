@@ -27,6 +27,9 @@ struct FindText {
   std::vector<FindWord> words;
   bool truncated = false;  // whether a budget cut words off, or left one out
 
+  // Whether words that hold a digit are only found exactly. A whole text is more than a number.
+  bool hasNumbers = true;
+
   /// Budgets as in Index::Options. Linear in the text.
   FindText(std::string_view text, MatchingMode mode, const EditLimits& limits, WordSegmenter& words,
            std::size_t maxWords, std::size_t maxWordUnits);

@@ -116,8 +116,8 @@ std::vector<FindExplanation::TextWord> comparedWords(const SearchImage& image, c
     for (const std::uint32_t flagged : phrase.phrase) {
       const std::u16string other = image.textOf(flagged & ~image::kPhraseEnd);
       const std::uint64_t edits = editDistance(word.word, other, transpositions);
-      const bool within = word.isLookedUp && edits <= word.limit &&
-                          (edits == 0 || !(holdsDigit(word.word) || holdsDigit(other)));
+      const bool isNumber = text.hasNumbers && (holdsDigit(word.word) || holdsDigit(other));
+      const bool within = word.isLookedUp && edits <= word.limit && (edits == 0 || !isNumber);
       compared.comparisons.push_back({displayUtf8(other), edits, within});
     }
   }

@@ -56,7 +56,7 @@ void PhraseFinder::lookUpWords() {
     const auto [place, isNew] = known.try_emplace(word.word);
     if (isNew) {
       place->second = nearWords(_image, word.word, word.limit, _options.transpositions);
-      if (!holdsDigit(word.word)) {
+      if (_text.hasNumbers && !holdsDigit(word.word)) {
         std::erase_if(place->second, [this](const NearWord& near) {
           return near.edits > 0 && holdsDigit(_image.textOf(near.word));
         });
