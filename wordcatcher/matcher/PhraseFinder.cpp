@@ -200,7 +200,7 @@ void PhraseFinder::judgeAll(std::span<const std::uint32_t> values) {
 
 /// False when the budget is used up.
 bool PhraseFinder::spendPosting() {
-  if (_postings == 0) {
+  if (_postings == 0 || _steps == 0) {
     _truncated = true;
     return false;
   }
@@ -405,8 +405,9 @@ void PhraseFinder::namePairs(std::span<const std::uint32_t> phrase) {
 
 RankedPhrase PhraseFinder::judgePhrase(std::uint32_t value, std::span<const std::uint32_t> phrase) {
   namePairs(phrase);
-  const PairingScore score = _pairing.solve(_steps);
   RankedPhrase ranked;
+  ranked.steps = _steps;
+  const PairingScore score = _pairing.solve(_steps);
   ranked.cost = 2 * (_text.words.size() + phrase.size()) - score.gain;
   ranked.words = score.words;
   ranked.exact = score.exact;
@@ -454,7 +455,8 @@ RankedPhrase PhraseFinder::judgeAnyway(std::uint32_t value) {
 
 std::vector<Pair> PhraseFinder::pairsOf(const RankedPhrase& phrase) {
   namePairs(phrase.phrase);
-  _pairing.solve(_steps);
+  std::uint64_t steps = phrase.steps;
+  _pairing.solve(steps);
   return {_pairing.pairs().begin(), _pairing.pairs().end()};
 }
 
