@@ -91,9 +91,10 @@ struct WORDCATCHER_EXPORT FindExplanation {
   struct TextWord {
     std::size_t begin;  ///< in the text, in bytes
     std::size_t end;
-    std::string word;                     ///< as it is looked up
+    std::string word;                     ///< as it is looked up, or as it is if it is too long
     std::uint32_t limit;                  ///< edits that it may have
-    std::vector<Comparison> comparisons;  ///< with each word of the phrase, in its order
+    std::vector<Comparison> comparisons;  ///< with each word of the phrase, in its order; none
+                                          ///< if the word is too long
   };
 
   std::string text;   ///< the host's

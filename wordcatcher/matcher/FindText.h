@@ -15,7 +15,7 @@ namespace wordcatcher {
 
 /// A word of a text in which phrases are looked for.
 struct FindWord {
-  std::u16string word;  // as it is looked up: lower-cased, or a code, lower-cased
+  std::u16string word;  // as it is looked up: lower-cased, or a code, lower-cased; else as it is
   std::size_t begin;    // in the text, in bytes
   std::size_t end;
   std::uint32_t limit;  // edits

@@ -128,11 +128,14 @@ std::vector<FindExplanation::TextWord> comparedWords(const SearchImage& image, c
     compared.end = word.end;
     compared.word = displayUtf8(word.word);
     compared.limit = word.limit;
+    if (!word.isLookedUp) {
+      continue;
+    }
     for (const std::uint32_t flagged : phrase.phrase) {
       const std::u16string other = image.textOf(flagged & ~image::kPhraseEnd);
       const std::uint64_t edits = editDistance(word.word, other, transpositions);
       const bool isNumber = text.hasNumbers && (holdsDigit(word.word) || holdsDigit(other));
-      const bool within = word.isLookedUp && edits <= word.limit && (edits == 0 || !isNumber);
+      const bool within = edits <= word.limit && (edits == 0 || !isNumber);
       compared.comparisons.push_back({displayUtf8(other), edits, within});
     }
   }

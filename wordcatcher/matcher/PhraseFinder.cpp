@@ -84,7 +84,11 @@ void PhraseFinder::lookUpJoins() {
 
 void PhraseFinder::lookUpSplits() {
   for (std::uint32_t position = 0; position < _text.words.size(); ++position) {
-    for (const auto& [head, tail] : wordsJoinedIn(_image, _text.words[position].word)) {
+    const FindWord& word = _text.words[position];
+    if (!word.isLookedUp) {
+      continue;
+    }
+    for (const auto& [head, tail] : wordsJoinedIn(_image, word.word)) {
       _splits.push_back({head, tail, position});
     }
   }
