@@ -15,8 +15,8 @@ Index indexOf(const Entries& entries, MatchingMode mode, const Index::Options& o
   return Index::open(path, options);
 }
 
-Index indexOf(const std::vector<std::string>& phrases, MatchingMode mode,
-              const Index::Options& options) {
+Index indexOfPhrases(const std::vector<std::string>& phrases, MatchingMode mode,
+                     const Index::Options& options) {
   Entries entries;
   for (const auto& phrase : phrases) {
     entries.emplace_back(phrase, phrase);

@@ -18,8 +18,8 @@ Index indexOf(const Entries& entries, MatchingMode mode = MatchingMode::words,
               const Index::Options& options = {});
 
 /// An index in which every phrase is its own data string.
-Index indexOf(const std::vector<std::string>& phrases, MatchingMode mode = MatchingMode::words,
-              const Index::Options& options = {});
+Index indexOfPhrases(const std::vector<std::string>& phrases,
+                     MatchingMode mode = MatchingMode::words, const Index::Options& options = {});
 
 /// One line a match, for comparisons that tell what differs: value, cost and hits.
 std::vector<std::string> linesOf(const std::vector<FoundPhrase>& matches);
