@@ -3,7 +3,10 @@
 #include <sys/resource.h>
 
 #include <algorithm>
+#include <exception>
+#include <filesystem>
 #include <fstream>
+#include <iostream>
 #include <numeric>
 #include <stdexcept>
 
@@ -38,6 +41,16 @@ nlohmann::json latency(std::vector<double> seconds) {
   return {{"mean", sum / count * kMicroseconds},
           {"p50", seconds[seconds.size() / 2] * kMicroseconds},
           {"p99", seconds[seconds.size() * 99 / 100] * kMicroseconds}};
+}
+
+int runDriver(int argc, char** argv, nlohmann::json (*run)(const std::vector<std::string>&)) {
+  try {
+    std::cout << run({argv + 1, argv + argc}) << '\n';
+    return 0;
+  } catch (const std::exception& error) {
+    std::cerr << std::filesystem::path(argv[0]).filename().string() << ": " << error.what() << '\n';
+    return 1;
+  }
 }
 
 std::size_t peakMemory() {

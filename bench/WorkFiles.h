@@ -36,6 +36,10 @@ class Stopwatch {
 /// Mean, median and 99th percentile, in microseconds, of how long queries took, in seconds.
 nlohmann::json latency(std::vector<double> seconds);
 
+/// What a driver's main() does: prints the JSON object that `run` makes of the arguments on one
+/// line, or the failure on standard error, under the name of the program. Returns the exit code.
+int runDriver(int argc, char** argv, nlohmann::json (*run)(const std::vector<std::string>&));
+
 /// The most memory that the process ever held, in bytes.
 std::size_t peakMemory();
 

@@ -9,8 +9,6 @@
 // of them.
 
 #include <algorithm>
-#include <exception>
-#include <iostream>
 
 #include "WorkFiles.h"
 #include "wordcatcher/matcher/Index.h"
@@ -35,7 +33,7 @@ class FindWork {
     result["buildSeconds"] = watch.seconds();
   }
 
-  void ask(const std::string& path, bool printMisses) {
+  void ask(const std::string& path) {
     const Index index = Index::open(path);
     std::size_t first = 0;
     std::size_t withinTen = 0;
@@ -51,10 +49,6 @@ class FindWork {
       first += at == matches.begin() && at != matches.end() ? 1 : 0;
       withinTen += at != matches.end() ? 1 : 0;
       truncated += answer.truncated ? 1 : 0;
-      if (printMisses && (at == matches.end() || at != matches.begin())) {
-        std::cerr << question.text << " <- " << source << ": "
-                  << (matches.empty() ? "nothing" : matches.front().value) << '\n';
-      }
     }
     std::vector<double> seconds;
     for (const auto& question : _questions) {
@@ -62,7 +56,7 @@ class FindWork {
       index.find(question.text);
       seconds.push_back(watch.seconds());
     }
-    result["find"] = latency(std::move(seconds));
+    result["query"] = latency(std::move(seconds));
     result["questions"] = _questions.size();
     result["foundFirst"] = first;
     result["foundWithinTen"] = withinTen;
@@ -78,22 +72,17 @@ class FindWork {
   bool _numbered;
 };
 
-void run(const std::vector<std::string>& arguments) {
+nlohmann::json run(const std::vector<std::string>& arguments) {
   FindWork work(linesOf(arguments.at(0)), questionsOf(arguments.at(1)),
                 arguments.at(3) == "numbered");
   work.build(arguments.at(2));
-  work.ask(arguments.at(2), arguments.size() > 4);
-  std::cout << work.result << '\n';
+  work.ask(arguments.at(2));
+  return work.result;
 }
 
 }  // namespace
 }  // namespace wordcatcher::bench
 
 int main(int argc, char** argv) {
-  try {
-    wordcatcher::bench::run({argv + 1, argv + argc});
-  } catch (const std::exception& error) {
-    std::cerr << "find_work: " << error.what() << '\n';
-    return 1;
-  }
+  return wordcatcher::bench::runDriver(argc, argv, &wordcatcher::bench::run);
 }

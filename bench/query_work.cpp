@@ -9,8 +9,6 @@
 // of their own.
 
 #include <algorithm>
-#include <exception>
-#include <iostream>
 
 #include "WorkFiles.h"
 #include "wordcatcher/matcher/Index.h"
@@ -93,22 +91,17 @@ class QueryWork {
   std::size_t _matches = 0;
 };
 
-void run(const std::vector<std::string>& arguments) {
+nlohmann::json run(const std::vector<std::string>& arguments) {
   QueryWork work(linesOf(arguments.at(0)), questionsOf(arguments.at(1)),
                  arguments.at(3) == "numbered");
   work.build(arguments.at(2));
   work.ask(arguments.at(2));
-  std::cout << work.result << '\n';
+  return work.result;
 }
 
 }  // namespace
 }  // namespace wordcatcher::bench
 
 int main(int argc, char** argv) {
-  try {
-    wordcatcher::bench::run({argv + 1, argv + argc});
-  } catch (const std::exception& error) {
-    std::cerr << "query_work: " << error.what() << '\n';
-    return 1;
-  }
+  return wordcatcher::bench::runDriver(argc, argv, &wordcatcher::bench::run);
 }

@@ -9,9 +9,7 @@
 
 #include <array>
 #include <cstdint>
-#include <exception>
 #include <fstream>
-#include <iostream>
 
 #include "WorkFiles.h"
 #include "wordcatcher/fuzzy/ImageSearch.h"
@@ -98,7 +96,7 @@ void writeResults(const SearchImage& image, const std::vector<std::u16string>& q
   }
 }
 
-void run(const std::vector<std::string>& arguments) {
+nlohmann::json run(const std::vector<std::string>& arguments) {
   const auto words = wordsOf(arguments.at(0));
   const auto queries = wordsOf(arguments.at(1));
   const std::string& path = arguments.at(2);
@@ -119,17 +117,12 @@ void run(const std::vector<std::string>& arguments) {
   if (arguments.size() > 3) {
     writeResults(*image, queries, arguments[3]);
   }
-  std::cout << result << '\n';
+  return result;
 }
 
 }  // namespace
 }  // namespace wordcatcher::bench
 
 int main(int argc, char** argv) {
-  try {
-    wordcatcher::bench::run({argv + 1, argv + argc});
-  } catch (const std::exception& error) {
-    std::cerr << "search_work: " << error.what() << '\n';
-    return 1;
-  }
+  return wordcatcher::bench::runDriver(argc, argv, &wordcatcher::bench::run);
 }

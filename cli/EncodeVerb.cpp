@@ -8,9 +8,9 @@
 #include "cli/Failure.h"
 #include "cli/Output.h"
 #include "cli/Questions.h"
-#include "cli/Utf8.h"
 #include "cli/Verbs.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
+#include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher::cli {
 
@@ -41,7 +41,7 @@ std::vector<std::string> codesOf(const std::u16string& translation) {
   std::size_t begin = 0;
   while ((begin = translation.find_first_not_of(u' ', begin)) != std::u16string::npos) {
     const std::size_t end = translation.find(u' ', begin);
-    codes.push_back(toUtf8(translation.substr(begin, end - begin)));
+    codes.push_back(displayUtf8(translation.substr(begin, end - begin)));
     begin = end;
   }
   return codes;

@@ -1,3 +1,6 @@
+#include <filesystem>
+#include <system_error>
+
 #include "cli/Failure.h"
 #include "cli/Indexing.h"
 #include "cli/InterruptGuard.h"
@@ -5,6 +8,7 @@
 #include "cli/OpenIndex.h"
 #include "cli/Phrases.h"
 #include "cli/ProgressBar.h"
+#include "cli/WaitingNote.h"
 #include "cli/WordCounter.h"
 
 namespace wordcatcher::cli {
@@ -21,6 +25,12 @@ void checkNamesFile(const std::string& target) {
         quoted(target) +
         " is a directory: name a file such as \"names.wci\", or give --tables to write the "
         "tables of a classic index there.");
+  }
+  const auto parent = std::filesystem::path(target).parent_path();
+  std::error_code unknown;  // what cannot be told now is told when the file is written
+  if (!parent.empty() && !std::filesystem::is_directory(parent, unknown)) {
+    throw Failure("There is no directory " + quoted(parent.string()) +
+                  " for the index: create it, or choose another place.");
   }
 }
 
@@ -40,6 +50,7 @@ IndexingReport indexIntoImage(const IndexingTask& task) {
   progress.say("Writing the index ...");
   NewImage image(task.target);
   const InterruptGuard guard([&image] { image.discardForGood(); });
+  const WaitingNote note("Writing the index");
   report.bytes = image.write(builder);
   return report;
 }

@@ -1,15 +1,22 @@
 #include "cli/Phrases.h"
 
+#include <unicode/uchar.h>
+
+#include <algorithm>
 #include <utility>
 
 #include "cli/Failure.h"
 #include "cli/InputLines.h"
-#include "cli/Utf8.h"
 #include "wordcatcher/Error.h"
 
 namespace wordcatcher::cli {
 
 namespace {
+
+/// Whether nothing but white space is in it; every white-space character is one code unit.
+bool isBlank(std::u16string_view text) {
+  return std::all_of(text.begin(), text.end(), [](char16_t unit) { return u_isUWhiteSpace(unit); });
+}
 
 template <typename Unit>
 PhraseOf<Unit> splitAtTab(const std::basic_string<Unit>& line) {

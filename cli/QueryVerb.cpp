@@ -5,6 +5,7 @@
 #include <string>
 #include <vector>
 
+#include "cli/Answers.h"
 #include "cli/Arguments.h"
 #include "cli/Failure.h"
 #include "cli/Modes.h"
@@ -86,15 +87,8 @@ ExitCode runQuery(const Arguments& arguments) {
   const MatchingMode mode = index.info().mode;
   return questions.answerEach([&](const InputLine& question, Output& output) {
     const auto result = index.query(question.utf8);
-    if (arguments.json) {
-      output.write(jsonLine(question.utf8, result, mode));
-    } else {
-      output.write(plainLines(result));
-      if (result.truncated) {
-        noteTruncated();
-      }
-    }
-    return !result.matches.empty();
+    const auto lines = arguments.json ? jsonLine(question.utf8, result, mode) : plainLines(result);
+    return writeAnswer(output, result, lines, arguments.json);
   });
 }
 

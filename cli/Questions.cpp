@@ -3,7 +3,7 @@
 #include <utility>
 
 #include "cli/Output.h"
-#include "cli/Utf8.h"
+#include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher::cli {
 

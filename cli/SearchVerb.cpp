@@ -6,6 +6,7 @@
 #include <string>
 #include <vector>
 
+#include "cli/Answers.h"
 #include "cli/Arguments.h"
 #include "cli/Failure.h"
 #include "cli/OpenIndex.h"
@@ -77,15 +78,8 @@ ExitCode runSearch(const Arguments& arguments) {
   const Index index = openIndex(arguments.index, std::nullopt, arguments.verbose);
   return questions.answerEach([&](const InputLine& question, Output& output) {
     const auto result = index.search(question.utf8, arguments.maxDistance);
-    if (arguments.json) {
-      output.write(jsonLine(question.utf8, result));
-    } else {
-      output.write(plainLines(result));
-      if (result.truncated) {
-        noteTruncated();
-      }
-    }
-    return !result.matches.empty();
+    const auto lines = arguments.json ? jsonLine(question.utf8, result) : plainLines(result);
+    return writeAnswer(output, result, lines, arguments.json);
   });
 }
 

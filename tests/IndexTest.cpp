@@ -63,7 +63,7 @@ std::string phraseOf(const std::string& value) { return value.substr(0, value.fi
 class IndexTest : public ::testing::TestWithParam<MatchingMode> {
  protected:
   std::string build(MatchingMode mode) {
-    const std::string path = directory.file("names.wci");
+    std::string path = directory.file("names.wci");
     IndexBuilder builder(path, {.mode = mode, .tables = directory.path()});
     for (const auto& value : kPhrases) {
       builder.add(phraseOf(value), value);
@@ -236,7 +236,7 @@ TEST_P(WordIndexTest, InfoTellsWhatIsThere) {
   EXPECT_EQ(info.words, 24U);
   EXPECT_EQ(info.bytes, std::filesystem::file_size(path));
   EXPECT_EQ(info.generation.size(), 32U);
-  EXPECT_EQ(info.version, 1U);
+  EXPECT_EQ(info.version, 2U);
   buildWords();
   EXPECT_NE(Index::open(path).info().generation, info.generation);
 }

@@ -47,6 +47,7 @@ std::vector<std::u16string> sample(const std::vector<std::u16string>& all, std::
     places.insert(random() % all.size());
   }
   std::vector<std::u16string> chosen;
+  chosen.reserve(places.size());
   for (const std::size_t place : places) {
     chosen.push_back(all[place]);
   }

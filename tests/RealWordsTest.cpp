@@ -29,7 +29,6 @@ using testing::literalSearch;
 using testing::LiteralSpanQuery;
 using testing::misspelled;
 using testing::sample;
-using testing::spacedWords;
 using testing::TemporaryDirectory;
 
 constexpr std::int32_t kReading = 1;
@@ -105,8 +104,6 @@ TEST(RealWordsTest, MisspelledWordsFindWhatTheLiteralWalkFinds) {
 struct Answer {
   std::optional<std::vector<std::pair<std::u16string, std::int64_t>>> records;
   std::int64_t wordsMatched = 0;
-
-  friend bool operator==(const Answer&, const Answer&) = default;
 };
 
 void add(Answer& answer, const std::vector<KXWordcatch>& records) {

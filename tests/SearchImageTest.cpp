@@ -19,6 +19,7 @@
 #include "TestSupport.h"
 #include "wordcatcher/Error.h"
 #include "wordcatcher/fuzzy/ImageSearch.h"
+#include "wordcatcher/storage/LeafTails.h"
 #include "wordcatcher/storage/SearchImageWriter.h"
 
 namespace wordcatcher {
@@ -177,7 +178,7 @@ TEST(SearchImageTest, TellsOtherVersionsAndMachines) {
     return openError(altered);
   };
   EXPECT_EQ(errorOfHeader(header), std::nullopt);
-  for (const std::uint32_t version : {0U, 2U, 0x01000000U}) {
+  for (const std::uint32_t version : {0U, 1U, 3U, 0x02000000U}) {
     image::Header other = header;
     other.version = version;
     EXPECT_EQ(errorOfHeader(other), ErrorCode::notAnIndex);
@@ -223,10 +224,9 @@ TEST(SearchImageTest, KeepsWordsInOrderWhenLabelsAreNot) {
   const auto longest = searchImage(*image, std::u16string(299, u'e') + u't', 1);
   ASSERT_EQ(longest.size(), 1U);
   EXPECT_EQ(longest[0].length, 301U);
-  // As UTF-16, a pair of surrogates comes before U+FFFD.
-  EXPECT_EQ(image->valueText(0), "");
-  EXPECT_EQ(image->valueText(1), "\U0001F6000");
-  EXPECT_EQ(image->valueText(image->valueCount() - 1), "\uFFFD");
+  // Values ascend by the lengths of their words: the longest word's comes last, though its text is
+  // the first of all.
+  EXPECT_EQ(image->valueText(image->valueCount() - 1), "");
 }
 
 TEST(DamagedImageTest, NoShorterImageIsOpened) {
@@ -301,12 +301,11 @@ std::map<SectionKind, std::size_t> unseenFlips(const ImageBytes& good) {
 }
 
 TEST(DamagedImageTest, OnlyContentNeedsItsChecksum) {
-  // Another letter, value or number of words, or a border between two of them elsewhere, makes
-  // another image that is as good. What has one right value, given the rest, is checked against it.
-  const std::set<SectionKind> content = {SectionKind::labels,         SectionKind::wordText,
-                                         SectionKind::postingOffsets, SectionKind::postings,
-                                         SectionKind::valueOffsets,   SectionKind::valueText,
-                                         SectionKind::countedWords};
+  // Another letter or number of words, or a border between two data strings elsewhere, makes another
+  // image that is as good. What has one right value, given the rest, is checked against it; so are
+  // words whose letters all stand in the trees, as they do here.
+  const std::set<SectionKind> content = {SectionKind::labels, SectionKind::valueOffsets,
+                                         SectionKind::valueText, SectionKind::countedWords};
   const ImageBytes bytes = testing::riverImage();
   for (const auto& [kind, count] : unseenFlips(bytes)) {
     EXPECT_EQ(count != 0, content.contains(kind)) << static_cast<unsigned>(kind) << ": " << count;
@@ -452,7 +451,7 @@ TEST(HostileImageTest, OneLongWordAtEveryPlace) {
   SearchImageWriter writer(0);
   std::u16string text(kBroad, u'a');
   for (std::uint32_t i = 0; i < kBroad; ++i) {
-    writer.addPosting(std::u16string(1, static_cast<char16_t>(0x4E00 + i)) + u"ab",
+    writer.addPosting(std::u16string(1, static_cast<char16_t>(0x4E00 + i)) + u"abcdefghijk",
                       writer.addValue("x", 1));
   }
   writer.addWord(text);
@@ -479,9 +478,24 @@ TEST(HostileImageTest, OneLongWordAtEveryPlace) {
   EXPECT_EQ(openOrVerifyError(bytes), ErrorCode::damaged);
 }
 
+TEST(HostileImageTest, TailsThatShareMoreThanThereIs) {
+  using Tails = image::LeafTails;
+  ForgedImage image(testing::riverImage());
+  auto slots = image.get<TreeSlot>(SectionKind::forwardTree);
+  const auto leaf = std::find_if(slots.begin(), slots.end(), [](const TreeSlot& slot) {
+    return slot.isLeaf() && image::hasTails(slot) && image::leafWords(slot) == 2;
+  });
+  ASSERT_NE(leaf, slots.end());
+  leaf->children =
+      std::uint64_t{2} << Tails::kCountShift | 1U | std::uint64_t{2} << (2 * Tails::kCodeBits);
+  image.set(SectionKind::forwardTree, slots);
+  EXPECT_FALSE(examine(image.bytes(), u"***", 3).answered);
+  EXPECT_EQ(openOrVerifyError(image.bytes()), ErrorCode::damaged);
+}
+
 TEST(HostileImageTest, AllPostingsInEveryList) {
   ForgedImage image = broadImage(300);
-  auto offsets = image.get<std::uint64_t>(SectionKind::postingOffsets);
+  auto offsets = image.get<std::uint32_t>(SectionKind::postingOffsets);
   for (std::size_t i = 0; i < offsets.size(); ++i) {
     offsets[i] = i % 2 == 0 ? 0 : 300;
   }
@@ -550,7 +564,7 @@ TEST(VerifyTest, FindsWhatASearchWouldMiss) {
               auto order = image.get<std::uint32_t>(SectionKind::backwardOrder);
               const auto slots = image.get<TreeSlot>(SectionKind::backwardTree);
               const auto leaf = std::find_if(slots.begin(), slots.end(), [](const TreeSlot& s) {
-                return s.isLeaf() && s.children == 2 && s.shortest == s.longest;
+                return s.isLeaf() && image::leafWords(s) == 2;
               });
               ASSERT_NE(leaf, slots.end());
               order[leaf->index()] = order[leaf->index() + 1];
@@ -558,6 +572,17 @@ TEST(VerifyTest, FindsWhatASearchWouldMiss) {
             }),
             ErrorCode::damaged)
       << "one word at two places of a leaf";
+  EXPECT_EQ(verifyError([](ForgedImage& image) {
+              auto slots = image.get<TreeSlot>(SectionKind::forwardTree);
+              const auto leaf = std::find_if(slots.begin(), slots.end(), [](const TreeSlot& s) {
+                return s.isLeaf() && image::hasTails(s) && s.longest > 0;
+              });
+              ASSERT_NE(leaf, slots.end());
+              leaf->children ^= 1U;
+              image.set(SectionKind::forwardTree, slots);
+            }),
+            ErrorCode::damaged)
+      << "another letter in a leaf than in its word";
   EXPECT_EQ(verifyError([](ForgedImage& image) {
               auto labels = image.get<std::uint16_t>(SectionKind::labels);
               labels[0] = u'q';

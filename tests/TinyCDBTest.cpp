@@ -464,7 +464,7 @@ TEST_F(TinyCDBTest, AKeyLongerThanTheFileIsNotCompared) {
     put32(bytes, slot, hash);
     put32(bytes, slot + 4, 2048);
   }
-  put32(bytes, (hash & 255U) * 8, static_cast<std::uint32_t>(hashTable));
+  put32(bytes, std::size_t{hash & 255U} * 8, static_cast<std::uint32_t>(hashTable));
   put32(bytes, (hash & 255U) * 8 + 4, 2);
   writeFile(path, bytes);
   TinyCDB table(path);
@@ -520,7 +520,7 @@ TEST_F(TinyCDBTest, AMissTellsTheErrorCodeAsItStands) {
 
 TEST_F(TinyCDBTest, OldMappingsAreReleased) {
   write({{u"Graz", u"Mur"}});
-  const auto mappings = [this] {
+  const auto mappings = [] {
     const std::string maps = readFile("/proc/self/maps");
     std::size_t count = 0;
     for (std::size_t at = 0; (at = maps.find("/table.tdb", at)) != std::string::npos; ++at) {

@@ -24,6 +24,8 @@ VERSION = ""
 EDGES, DATA, FINALS = TABLES = ("edgeTable.tdb", "dataTable.tdb", "finalTable.tdb")
 PATIENCE = 30
 
+VERBS = ("index", "find", "explain", "query", "search", "info", "verify", "encode", "dot")
+
 DOGS = "golden retriever puppy\t7\ngolden gate bridge\t8\n"
 PUPPY = "golden retriever puppy{ 7 }"
 BRIDGE = "golden gate bridge{ 8 }"
@@ -125,10 +127,10 @@ class CommandTest(unittest.TestCase):
 
 
 class ProgramTest(CommandTest):
-    def test_without_arguments_shows_help_on_standard_error(self):
+    def test_without_arguments_shows_what_to_do_on_standard_error(self):
         self.assertEqual(self.run_it(), 2)
         self.assertEqual(self.out, "")
-        for verb in ("index", "query", "search", "info", "verify"):
+        for verb in VERBS:
             self.assertIn(verb, self.err)
 
     def test_version(self):
@@ -136,7 +138,7 @@ class ProgramTest(CommandTest):
 
     def test_help_has_examples(self):
         self.assertIn("Examples:", self.succeed("--help"))
-        for verb in ("index", "query", "search", "info", "verify"):
+        for verb in VERBS:
             help_text = self.succeed(verb, "--help")
             self.assertIn(f"Usage: wordcatcher {verb}", help_text)
             self.assertIn(f"  wordcatcher {verb} ", help_text.split("Examples:")[1])
@@ -273,7 +275,11 @@ class ImageIndexTest(IndexTest):
         self.assertEqual(sorted(os.listdir(self.path("kennel"))), sorted(TABLES))
 
     def test_place_that_cannot_be_written(self):
-        self.fail_with("its directory", of=["index", self.path("no", "dogs.wci")], stdin=DOGS)
+        self.write("names.txt", DOGS)
+        for place in ("no", "names.txt"):
+            # Before any input is looked at.
+            self.fail_with("no directory", f'{place}"', "create it",
+                           of=["index", self.path(place, "dogs.wci"), self.path("missing")])
         os.mkfifo(self.path("pipe"))
         self.fail_with("regular file", of=["index", self.path("pipe")], stdin=DOGS)
 
@@ -576,7 +582,7 @@ class InfoTest(CommandTest):
         told = json.loads(self.succeed("info", "--json", self.dogs))
         self.assertRegex(told.pop("generation"), "^[0-9a-f]{32}$")
         self.assertEqual(told, {"mode": "words", "phrases": 2, "words": 5, "data": 2,
-                                "bytes": os.path.getsize(self.dogs), "version": 1})
+                                "bytes": os.path.getsize(self.dogs), "version": 2})
         lines = self.succeed("info", self.dogs).splitlines()
         self.assertEqual(lines[:4], ["mode\twords", "phrases\t2", "words\t5", "data\t2"])
         self.assertEqual(len(lines), 7)

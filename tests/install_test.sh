@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# Installs a build into a temporary prefix, and builds and runs a host against it: once found by
-# CMake, once by pkg-config. Arguments: source directory, build directory, 1 if the wordcatcher
+# Installs a build into a temporary prefix, and builds and runs hosts against it, in C++ and in C: once
+# found by CMake, once by pkg-config. Arguments: source directory, build directory, 1 if the wordcatcher
 # command was built, compiler flags.
 set -euo pipefail
 source=$1 build=$2 with_cli=$3 flags=$4
@@ -33,6 +33,14 @@ if [ "$with_cli" = 1 ]; then
     exit 1
   }
   echo "the installed wordcatcher works"
+  for page in man/man1/wordcatcher.1 man/man1/wordcatcher-find.1 \
+    bash-completion/completions/wordcatcher zsh/vendor-completions/_wordcatcher; do
+    [ -s "$prefix/share/$page" ] || {
+      echo "nothing was installed at share/$page" >&2
+      exit 1
+    }
+  done
+  echo "its pages and completions are there"
 fi
 
 export LD_LIBRARY_PATH=$libdir
@@ -60,9 +68,35 @@ g++ -std=c++20 $flags "$source/examples/installed_host/host.cpp" -o "$work/by_pk
   $(pkg-config --cflags --libs wordcatcher)
 check pkg-config "$work/by_pkg_config"
 
+# A host in C: it reads the index that the last host in C++ built.
+cc=${CC:-cc}
+cmake -S "$source/examples/installed_c_host" -B "$work/c_host" -DCMAKE_PREFIX_PATH="$prefix" \
+  -DCMAKE_C_COMPILER="$cc" -DCMAKE_C_FLAGS="$flags -Wall -Wextra -Wpedantic -Werror" --log-level=WARNING
+cmake --build "$work/c_host" >/dev/null
+# shellcheck disable=SC2046
+"$cc" -std=c99 -Wall -Wextra -Wpedantic -Werror $flags \
+  "$source/examples/installed_c_host/host.c" -o "$work/c_by_pkg_config" \
+  $(pkg-config --cflags --libs wordcatcher)
+for host in "$work/c_host/host" "$work/c_by_pkg_config"; do
+  output=$("$host" "$work/pkg-config/" <<<"My goldn retriver barks")
+  [ "$output" = $'6\tgolden retriever\tgoldn retriver' ] || {
+    echo "the host in C printed: $output" >&2
+    exit 1
+  }
+  if "$host" "$work/nowhere.wci" </dev/null 2>"$work/complaint"; then
+    echo "the host in C found an index where there is none" >&2
+    exit 1
+  fi
+  grep -q "There is no index at $work/nowhere.wci" "$work/complaint"
+done
+echo "the hosts in C work"
+
 # Every public header stands on its own.
 find "$prefix/include" -name '*.h' | while read -r header; do
   echo "#include \"${header#"$prefix/include/"}\"" |
     g++ -std=c++20 -Wall -Wextra -Wpedantic -Werror -fsyntax-only -I"$prefix/include" -x c++ -
 done
 echo "every installed header compiles by itself"
+echo '#include <wordcatcher/wordcatcher.h>' |
+  "$cc" -std=c99 -Wall -Wextra -Wpedantic -Werror -fsyntax-only -I"$prefix/include" -x c -
+echo "the C header compiles as C"

@@ -10,9 +10,7 @@
 #include <algorithm>
 #include <array>
 #include <cstdint>
-#include <exception>
 #include <fstream>
-#include <iostream>
 #include <string_view>
 
 #include "WorkFiles.h"
@@ -88,7 +86,7 @@ std::vector<Hit> scan(const std::vector<std::string>& words, const std::string& 
   return hits;
 }
 
-void run(const std::vector<std::string>& arguments) {
+nlohmann::json run(const std::vector<std::string>& arguments) {
   const auto words = linesOf(arguments.at(0));
   const auto queries = linesOf(arguments.at(1));
   std::ofstream results;
@@ -121,17 +119,12 @@ void run(const std::vector<std::string>& arguments) {
     output[name] = latency(std::move(seconds));
     output[name]["found"] = found;
   }
-  std::cout << output << '\n';
+  return output;
 }
 
 }  // namespace
 }  // namespace wordcatcher::bench
 
 int main(int argc, char** argv) {
-  try {
-    wordcatcher::bench::run({argv + 1, argv + argc});
-  } catch (const std::exception& error) {
-    std::cerr << "brute_force: " << error.what() << '\n';
-    return 1;
-  }
+  return wordcatcher::bench::runDriver(argc, argv, &wordcatcher::bench::run);
 }

@@ -15,7 +15,7 @@ from collections import Counter
 from pathlib import Path
 
 from debian_texts import lemmas, require_packages, word_frequencies, write_lines
-from mistakes import questions
+from mistakes import one_word_each, questions
 
 ASKED_FOR = 1_000_000
 QUERIES = 2000
@@ -41,7 +41,9 @@ def main(directory, count):
     source = lemmas()
     phrases = made(count, source)
     words = sorted(word_frequencies(source))
-    asked = questions(phrases[:ASKED_FOR], words, QUERIES, random.Random(QUERY_SEED))
+    asked = questions(
+        phrases[:ASKED_FOR], one_word_each(words), QUERIES, random.Random(QUERY_SEED)
+    )
     write_lines(directory / f"w3-{count}.txt", phrases)
     write_lines(directory / "w3-queries.tsv", asked)
     print(f"W3: {count} phrases, {len(set(phrases))} distinct", file=sys.stderr)

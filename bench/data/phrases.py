@@ -2,7 +2,8 @@
 """Work W2: WordNet's lemmas as phrases, and misspelled ones to ask for.
 
 Writes w2-phrases.txt, one phrase a line, and w2-queries.tsv, lines of the number of a phrase (the
-first is 0), a tab and a question, into the directory given.
+first is 0), a tab and a question, into the directory given; and w2-other-queries.tsv, the same with
+mistakes of other kinds, on which nothing is tuned.
 """
 
 import random
@@ -10,19 +11,22 @@ import sys
 from pathlib import Path
 
 from debian_texts import lemmas, require_packages, word_frequencies, write_lines
-from mistakes import questions
+from mistakes import one_word_each, other_questions, questions
 
 QUERIES = 2000
 SEED = 2
+OTHER_SEED = 5
 
 
 def main(directory):
     require_packages()
     phrases = lemmas()
     words = sorted(word_frequencies(phrases))
-    asked = questions(phrases, words, QUERIES, random.Random(SEED))
+    asked = questions(phrases, one_word_each(words), QUERIES, random.Random(SEED))
+    others = other_questions(phrases, QUERIES, random.Random(OTHER_SEED))
     write_lines(directory / "w2-phrases.txt", phrases)
     write_lines(directory / "w2-queries.tsv", asked)
+    write_lines(directory / "w2-other-queries.tsv", others)
     print(f"W2: {len(phrases)} phrases of {len(words)} words", file=sys.stderr)
 
 

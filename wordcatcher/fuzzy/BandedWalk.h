@@ -17,6 +17,7 @@
 #include <vector>
 
 #include "wordcatcher/fuzzy/BandedAutomaton.h"
+#include "wordcatcher/storage/LeafTails.h"
 #include "wordcatcher/storage/SearchImage.h"
 
 namespace wordcatcher {
@@ -326,7 +327,11 @@ class BandedWalk {
 
   void enterLeaf(const TreeSlot& slot, std::uint64_t states, std::uint64_t unclosed,
                  std::size_t depth) {
-    _budget.spendPlaces(slot.index(), slot.children);
+    _budget.spendPlaces(slot.index(), image::leafWords(slot));
+    if (image::hasTails(slot)) {
+      readTails(slot, states, unclosed, depth);
+      return;
+    }
     for (std::uint64_t i = 0; i < slot.children; ++i) {
       const auto place = static_cast<std::uint32_t>(slot.index() + i);
       if (_tree.order.empty()) {
@@ -337,6 +342,56 @@ class BandedWalk {
       _leafWords[_leafWordCount++] = {place, 0, depth, states, unclosed};
       if (_leafWordCount == kLeafWords) {
         readLeafWords();
+      }
+    }
+  }
+
+  /// The words of a leaf by what its slot says of them.
+  void readTails(const TreeSlot& leaf, std::uint64_t states, std::uint64_t unclosed,
+                 std::size_t depth) {
+    using Tails = image::LeafTails;
+    // Where the automaton was after so many labels, for the words that share them.
+    struct {
+      std::uint64_t states;
+      std::uint64_t unclosed;
+    } reached[Tails::kCodes + 1];
+    reached[0] = {states, unclosed};
+    std::size_t alive = 0;
+    std::size_t length = 0;
+    std::uint64_t codes = leaf.children & Tails::kAllCodes;
+    const std::uint64_t words = image::leafWords(leaf);
+    for (std::uint32_t word = 0; word < words; ++word) {
+      std::size_t position = 0;
+      if (word > 0) {
+        position = codes & Tails::kCodeMask;
+        codes >>= Tails::kCodeBits;
+        if (position > length) {
+          _image.throwDamaged("a leaf shares more than there is");
+        }
+        alive = std::min(alive, position);
+      }
+      bool isAlive = position == alive;
+      for (; (codes & Tails::kCodeMask) != 0; codes >>= Tails::kCodeBits, ++position) {
+        if (isAlive) {
+          const auto& from = reached[position];
+          const auto label = static_cast<std::uint16_t>(codes & Tails::kCodeMask);
+          const std::uint64_t byEdit = _pattern.editedAt(from.states, depth + position);
+          const std::uint64_t match = _pattern.matchedAt(from.states, depth + position, label);
+          auto& to = reached[position + 1];
+          to.unclosed = byEdit | match;
+          to.states = (byEdit | B::closed(match)) & _pattern.validAt(depth + position + 1);
+          isAlive = (to.states & B::kLane) != 0;
+          alive += isAlive ? 1 : 0;
+        }
+      }
+      codes >>= Tails::kCodeBits;
+      length = position;
+      if (!isAlive) {
+        continue;
+      }
+      const auto& end = reached[position];
+      if (const auto accepted = acceptedAt(end.states, end.unclosed, depth + position)) {
+        addFound(leaf.index() + word, distanceOf<K>(accepted), depth + position);
       }
     }
   }

@@ -211,9 +211,11 @@ class ColumnSearch {
   }
 
   /// Reads a word; false when it is beyond the distance.
-  bool read(std::span<const std::uint16_t> labels) {
-    const auto parted = std::mismatch(labels.begin(), labels.end(), _last.begin(), _last.end());
-    const auto shared = static_cast<std::size_t>(parted.first - labels.begin());
+  bool read(const SearchImage::Labels& labels) {
+    std::size_t shared = 0;
+    while (shared < labels.size() && shared < _last.size() && labels[shared] == _last[shared]) {
+      ++shared;
+    }
     if (shared == _last.size() && _lastIsBeyond) {
       return false;
     }
@@ -223,7 +225,7 @@ class ColumnSearch {
       within = readOne(labels[depth], depth + 1);
       ++depth;
     }
-    _last = labels.first(depth);
+    _last = labels.subspan(0, depth);
     _lastIsBeyond = !within;
     return within && !labels.empty() &&
            columnAt(labels.size()).costAt(_query.units.size()) <= _maxDistance;
@@ -265,7 +267,7 @@ class ColumnSearch {
   std::size_t _kept = 0;
   std::vector<Column> _columns;
   // What the columns were made of: a word, or the head of one at which nothing was within reach.
-  std::span<const std::uint16_t> _last;
+  SearchImage::Labels _last;
   bool _lastIsBeyond = false;
 };
 

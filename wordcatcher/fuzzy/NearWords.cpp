@@ -5,6 +5,7 @@
 
 #include "wordcatcher/fuzzy/BandedWalk.h"
 #include "wordcatcher/fuzzy/SwapAutomaton.h"
+#include "wordcatcher/storage/LeafTails.h"
 
 namespace wordcatcher {
 
@@ -61,12 +62,13 @@ void forEachWordAlong(const SearchImage& image, bool backward,
   for (std::size_t depth = 0;; ++depth) {
     const TreeSlot& place = tree.slots[slot];
     if (depth > 0 && place.isLeaf()) {
-      for (std::size_t i = 0; i < place.children; ++i) {
+      for (std::size_t i = 0; i < image::leafWords(place); ++i) {
         const std::uint32_t word = wordAt(place.index() + i);
         const auto own = image.labelsOf(word);
-        const bool isAlong = own.size() <= labels.size() &&
-                             (backward ? std::equal(own.rbegin(), own.rend(), labels.begin())
-                                       : std::equal(own.begin(), own.end(), labels.begin()));
+        bool isAlong = own.size() <= labels.size();
+        for (std::size_t at = 0; isAlong && at < own.size(); ++at) {
+          isAlong = labels[at] == own[backward ? own.size() - 1 - at : at];
+        }
         if (isAlong) {
           visit(word, own.size());
         }

@@ -1,6 +1,11 @@
 // The two forms of an explanation: for programs and for people.
 
+#include <concepts>
+#include <initializer_list>
 #include <nlohmann/json.hpp>
+#include <string>
+#include <utility>
+#include <vector>
 
 #include "wordcatcher/matcher/Find.h"
 
@@ -8,11 +13,68 @@ namespace wordcatcher {
 
 namespace {
 
-using Json = nlohmann::ordered_json;
+// The text is put together piece by piece: the library's trees of values allocate memory in their
+// destructors, which would end the process where memory runs out.
 
-// Strings that are not UTF-8, as a host may pass any, appear with U+FFFD.
-std::string oneLine(const Json& json) {
-  return json.dump(-1, ' ', false, Json::error_handler_t::replace);
+/// Strings that are not UTF-8, as a host may pass any, appear with U+FFFD.
+std::string json(const std::string& text) {
+  using Json = nlohmann::json;
+  return Json(text).dump(-1, ' ', false, Json::error_handler_t::replace);
+}
+
+std::string json(bool value) { return value ? "true" : "false"; }
+
+template <std::integral Number>
+std::string json(Number number) {
+  return std::to_string(number);
+}
+
+using Members = std::initializer_list<std::pair<const char*, std::string>>;
+
+/// An object of members whose values are JSON already; their names need no escapes.
+std::string object(const Members& members) {
+  std::string text;
+  for (const auto& [name, value] : members) {
+    text.append(text.empty() ? "{\"" : ",\"").append(name).append("\":").append(value);
+  }
+  return text + '}';
+}
+
+template <typename Element, typename Form>
+std::string array(const std::vector<Element>& elements, const Form& form) {
+  std::string text = "[";
+  for (const auto& element : elements) {
+    text.append(&element == &elements.front() ? "" : ",").append(form(element));
+  }
+  return text + ']';
+}
+
+std::string array(const std::vector<std::string>& texts) {
+  return array(texts, [](const std::string& text) { return json(text); });
+}
+
+std::string comparison(const FindExplanation::Comparison& each) {
+  return object(
+      {{"word", json(each.word)}, {"edits", json(each.edits)}, {"within", json(each.within)}});
+}
+
+std::string textWord(const FindExplanation::TextWord& word) {
+  return object({{"begin", json(word.begin)},
+                 {"end", json(word.end)},
+                 {"word", json(word.word)},
+                 {"limit", json(word.limit)},
+                 {"comparisons", array(word.comparisons, &comparison)}});
+}
+
+std::string foundWord(const FoundWord& word) {
+  return object({{"begin", json(word.begin)},
+                 {"end", json(word.end)},
+                 {"word", json(word.word)},
+                 {"edits", json(word.edits)}});
+}
+
+std::string queryStep(const QueryExplanation::Step& step) {
+  return object({{"sentence", json(step.sentence)}, {"distance", json(step.distance)}});
 }
 
 std::string listed(const std::vector<std::string>& words) {
@@ -32,31 +94,19 @@ constexpr const char* kCutOff = "Some words of the text were left out: it is bey
 }  // namespace
 
 std::string FindExplanation::toJson() const {
-  Json json = {{"text", text},       {"value", value}, {"isStored", isStored},
-               {"isFound", isFound}, {"cost", cost},   {"edits", edits}};
-  json["words"] = Json::array();
-  for (const auto& word : words) {
-    Json compared = Json::array();
-    for (const auto& each : word.comparisons) {
-      compared.push_back({{"word", each.word}, {"edits", each.edits}, {"within", each.within}});
-    }
-    json["words"].push_back({{"begin", word.begin},
-                             {"end", word.end},
-                             {"word", word.word},
-                             {"limit", word.limit},
-                             {"comparisons", std::move(compared)}});
-  }
-  json["phrase"] = phrase;
-  json["pairs"] = Json::array();
-  for (const auto& pair : pairs) {
-    json["pairs"].push_back(
-        {{"begin", pair.begin}, {"end", pair.end}, {"word", pair.word}, {"edits", pair.edits}});
-  }
-  json["missing"] = missing;
-  json["surplus"] = surplus;
-  json["objections"] = objections;
-  json["truncated"] = truncated;
-  return oneLine(json);
+  return object({{"text", json(text)},
+                 {"value", json(value)},
+                 {"isStored", json(isStored)},
+                 {"isFound", json(isFound)},
+                 {"cost", json(cost)},
+                 {"edits", json(edits)},
+                 {"words", array(words, &textWord)},
+                 {"phrase", array(phrase)},
+                 {"pairs", array(pairs, &foundWord)},
+                 {"missing", array(missing)},
+                 {"surplus", array(surplus)},
+                 {"objections", array(objections)},
+                 {"truncated", json(truncated)}});
 }
 
 std::string FindExplanation::toText() const {
@@ -89,14 +139,14 @@ std::string FindExplanation::toText() const {
 }
 
 std::string QueryExplanation::toJson() const {
-  Json json = {{"text", text},       {"value", value},       {"isStored", isStored},
-               {"isFound", isFound}, {"distance", distance}, {"bound", bound}};
-  json["steps"] = Json::array();
-  for (const auto& step : steps) {
-    json["steps"].push_back({{"sentence", step.sentence}, {"distance", step.distance}});
-  }
-  json["truncated"] = truncated;
-  return oneLine(json);
+  return object({{"text", json(text)},
+                 {"value", json(value)},
+                 {"isStored", json(isStored)},
+                 {"isFound", json(isFound)},
+                 {"distance", json(distance)},
+                 {"bound", json(bound)},
+                 {"steps", array(steps, &queryStep)},
+                 {"truncated", json(truncated)}});
 }
 
 std::string QueryExplanation::toText() const {

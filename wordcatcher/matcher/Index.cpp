@@ -13,6 +13,7 @@
 #include "wordcatcher/matcher/FindText.h"
 #include "wordcatcher/matcher/FoundPhrases.h"
 #include "wordcatcher/matcher/SpanQuery.h"
+#include "wordcatcher/matcher/SpanShortcut.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
 #include "wordcatcher/storage/SearchImage.h"
 #include "wordcatcher/text/CodeUnitOrder.h"
@@ -114,10 +115,6 @@ struct Index::State {
   QueryResult queryWholeText(const std::u16string& text) const;
   QueryResult queryWords(std::u16string_view text) const;
 
-  struct SpanAnswer {
-    std::optional<std::vector<ScoredValue>> scored;
-    bool truncated;
-  };
   SpanAnswer runSpanQuery(std::u16string_view text, SpanQueryTrace* trace) const;
 };
 
@@ -175,21 +172,24 @@ Index::QueryResult Index::State::queryWholeText(const std::u16string& text) cons
   return result;
 }
 
-Index::State::SpanAnswer Index::State::runSpanQuery(std::u16string_view text,
-                                                    SpanQueryTrace* trace) const {
+SpanAnswer Index::State::runSpanQuery(std::u16string_view text, SpanQueryTrace* trace) const {
   std::u16string codes;
   std::int64_t editDistance = kWordDistance;
   if (mode == MatchingMode::phoneticWords) {
-    codes = KXMetaphone().translate(text);
+    codes = KXMetaphone(segmenter).translate(text);
     text = codes;
     editDistance = 0;
   }
   std::int64_t wordsMatched = 0;
   WordSegmenter words(segmenter);
-  SpanQuery query(*image, words,
-                  {editDistance, kIgnoredWordLength, kUncountedWordLength, options.maxQueryWords,
-                   options.maxWordUnits},
-                  wordsMatched);
+  const SpanQueryLimits limits = {editDistance, kIgnoredWordLength, kUncountedWordLength,
+                                  options.maxQueryWords, options.maxWordUnits};
+  if (trace == nullptr) {
+    if (auto answer = SpanShortcut(*image, words, limits).run(text)) {
+      return *std::move(answer);
+    }
+  }
+  SpanQuery query(*image, words, limits, wordsMatched);
   if (trace != nullptr) {
     query.tellTo(*trace);
   }

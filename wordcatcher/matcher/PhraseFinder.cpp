@@ -112,6 +112,7 @@ void PhraseFinder::makeTable() {
       slot = (slot + 1) & (_table.size() - 1);
     }
     _table[slot] = i + 1;
+    ++_distinctWords;
   }
 }
 
@@ -147,6 +148,7 @@ void PhraseFinder::rankWords() {
 }
 
 void PhraseFinder::makeSources() {
+  _sources.reserve(_distinctWords);
   for (auto each = _wordOptions.begin(); each != _wordOptions.end();) {
     const std::uint32_t word = each->word;
     Source source = {UINT32_MAX, UINT32_MAX, _image.postingsOf(word)};
@@ -196,7 +198,7 @@ void PhraseFinder::judgeAll(std::span<const std::uint32_t> values) {
     if (!spendPosting()) {
       return;
     }
-    if (_judged.insert(value)) {
+    if (_judged.insert(value).isNew) {
       judgeAndKeep(value);
     }
   }
@@ -251,6 +253,7 @@ void PhraseFinder::addSegments(std::uint32_t number, std::vector<Segment>& segme
 
 std::vector<PhraseFinder::Segment> PhraseFinder::segments() const {
   std::vector<Segment> segments;
+  segments.reserve(_sources.size());
   for (std::uint32_t source = 0; source < _sources.size(); ++source) {
     addSegments(source, segments);
   }
@@ -323,7 +326,7 @@ void PhraseFinder::read(const Segment& segment) {
     if (!spendPosting()) {
       return;
     }
-    if (_judged.insert(value) && !judgeAndKeep(value) && isAlone) {
+    if (_judged.insert(value).isNew && !judgeAndKeep(value) && isAlone) {
       return;
     }
   }

@@ -26,7 +26,7 @@
 
 #include "wordcatcher/matcher/Find.h"
 #include "wordcatcher/matcher/FindText.h"
-#include "wordcatcher/matcher/NumberSet.h"
+#include "wordcatcher/matcher/NumberIndex.h"
 #include "wordcatcher/matcher/Pairing.h"
 #include "wordcatcher/storage/SearchImage.h"
 
@@ -133,6 +133,7 @@ class PhraseFinder {
   std::vector<WordOption> _wordOptions;  // ascending by word, then position
   std::vector<Split> _splits;            // ascending by head
   std::vector<std::uint32_t> _table;     // hash table: where a word's options begin, and one
+  std::size_t _distinctWords = 0;        // in it
   std::vector<std::uint32_t> _ranks;     // of the text's words
   std::vector<Source> _sources;
 
@@ -140,7 +141,7 @@ class PhraseFinder {
   std::uint64_t _postings;  // budgets that are left
   std::uint64_t _steps;
   bool _truncated = false;
-  NumberSet _judged;
+  NumberIndex _judged;
   std::vector<RankedPhrase> _kept;  // a heap, the last in order on top, once it is full
 };
 

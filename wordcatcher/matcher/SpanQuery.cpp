@@ -11,8 +11,10 @@ namespace wordcatcher {
 
 namespace {
 
-// Up to this many postings, sorting them costs less than marking them in an array of all values.
+// Up to this many postings, or this part of all values, sorting them costs less than marking them in
+// an array of all values.
 constexpr std::size_t kShortLists = 4096;
+constexpr std::size_t kShortPart = 16;
 
 // Where one list is this many times as long as the other, its elements are searched for one by one.
 constexpr std::size_t kMuchLonger = 16;
@@ -154,7 +156,8 @@ SpanQuery::CandidateSet SpanQuery::candidatesOf(const std::vector<WordHit>& hits
   for (const auto& hit : hits) {
     postings += hit.values;
   }
-  return postings <= kShortLists ? mergeShortLists(hits) : markLongLists(hits);
+  const bool isShort = postings <= std::max(kShortLists, _image.valueCount() / kShortPart);
+  return isShort ? mergeShortLists(hits) : markLongLists(hits);
 }
 
 SpanQuery::CandidateSet SpanQuery::mergeShortLists(const std::vector<WordHit>& hits) const {
@@ -271,27 +274,32 @@ bool SpanQuery::intersect(const CandidateSet& others) {
 }
 
 std::vector<ScoredValue> SpanQuery::scored() const {
-  const std::int64_t bound = _limits.editDistance * _countedWords;
   if (_trace != nullptr) {
     const std::int64_t words = _image.countedWordsOf(_trace->value());
     _trace->penaliseLength(words, _countedWords,
                            _limits.editDistance * std::abs(words - _countedWords));
-    _trace->compareWithBound(bound);
+    _trace->compareWithBound(_limits.editDistance * _countedWords);
   }
+  return scorePhrases(_image, _phrases, _penalty, _countedWords, _limits.editDistance);
+}
+
+std::vector<ScoredValue> scorePhrases(const SearchImage& image,
+                                      const std::vector<ScoredValue>& phrases, std::int64_t penalty,
+                                      std::int64_t countedWords, std::int64_t editDistance) {
+  const std::int64_t bound = editDistance * countedWords;
   std::vector<ScoredValue> records;
-  for (const auto& phrase : _phrases) {
+  for (const auto& phrase : phrases) {
     const std::int64_t difference =
-        static_cast<std::int64_t>(_image.countedWordsOf(phrase.value)) - _countedWords;
-    const std::int64_t distance = wrappingAdd(wrappingAdd(phrase.distance, _penalty),
-                                              _limits.editDistance * std::abs(difference));
+        static_cast<std::int64_t>(image.countedWordsOf(phrase.value)) - countedWords;
+    const std::int64_t distance =
+        wrappingAdd(wrappingAdd(phrase.distance, penalty), editDistance * std::abs(difference));
     if (distance <= bound) {
       records.push_back({phrase.value, distance});
     }
   }
-  std::sort(records.begin(), records.end(), [this](const ScoredValue& a, const ScoredValue& b) {
-    return a.distance != b.distance
-               ? a.distance < b.distance
-               : utf16Less(_image.valueText(a.value), _image.valueText(b.value));
+  std::sort(records.begin(), records.end(), [&image](const ScoredValue& a, const ScoredValue& b) {
+    return a.distance != b.distance ? a.distance < b.distance
+                                    : utf16Less(image.valueText(a.value), image.valueText(b.value));
   });
   return records;
 }

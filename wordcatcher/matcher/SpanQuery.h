@@ -31,6 +31,12 @@ struct ScoredValue {
   friend bool operator==(const ScoredValue&, const ScoredValue&) = default;
 };
 
+/// The last steps of a span query: penalises phrases for their lengths, drops those beyond the
+/// bound, and sorts the rest by distance, then value by UTF-16 code units.
+std::vector<ScoredValue> scorePhrases(const SearchImage& image,
+                                      const std::vector<ScoredValue>& phrases, std::int64_t penalty,
+                                      std::int64_t countedWords, std::int64_t editDistance);
+
 /// One span query over the words of an image: looks up each word of a text, intersects the values
 /// that the words bring, and scores what is left. Used once.
 ///

@@ -117,19 +117,34 @@ SearchImage::~SearchImage() {
   }
 }
 
-template <typename Element>
-std::span<const Element> SearchImage::sectionOf(SectionKind kind) const {
+const image::Section& SearchImage::find(SectionKind kind) const {
   const auto section =
       std::find_if(_sections.begin(), _sections.end(),
                    [kind](const image::Section& candidate) { return candidate.kind == kind; });
   if (section == _sections.end()) {
     throwDamaged("a section is missing");
   }
-  if (section->elementBytes != sizeof(Element) || section->bytes % sizeof(Element) != 0) {
+  return *section;
+}
+
+template <typename Element>
+std::span<const Element> SearchImage::sectionOf(SectionKind kind) const {
+  const image::Section& section = find(kind);
+  if (section.elementBytes != sizeof(Element) || section.bytes % sizeof(Element) != 0) {
     throwDamaged("a section has elements of another size");
   }
-  const auto bytes = _bytes.subspan(section->offset, section->bytes);
+  const auto bytes = _bytes.subspan(section.offset, section.bytes);
   return {reinterpret_cast<const Element*>(bytes.data()), bytes.size() / sizeof(Element)};
+}
+
+template <typename Narrow, typename Wide>
+TwoWidths<Narrow, Wide> SearchImage::sectionOfEither(SectionKind kind) const {
+  if (find(kind).elementBytes == sizeof(Wide)) {
+    const auto elements = sectionOf<Wide>(kind);
+    return {std::as_bytes(elements).data(), elements.size(), true};
+  }
+  const auto elements = sectionOf<Narrow>(kind);
+  return {std::as_bytes(elements).data(), elements.size(), false};
 }
 
 /// Checks all that the accessors rely on without looking again: the sections' places and sizes.
@@ -179,12 +194,12 @@ void SearchImage::bind(const std::string& name) {
 
   _labels = sectionOf<std::uint16_t>(SectionKind::labels);
   _wordOffsets = sectionOf<std::uint32_t>(SectionKind::wordOffsets);
-  _wordText = sectionOf<std::uint16_t>(SectionKind::wordText);
+  _wordText = sectionOfEither<std::uint8_t, std::uint16_t>(SectionKind::wordText);
   _forward.slots = sectionOf<TreeSlot>(SectionKind::forwardTree);
   _forward.order = sectionOf<std::uint32_t>(SectionKind::forwardOrder);
   _backward.slots = sectionOf<TreeSlot>(SectionKind::backwardTree);
   _backward.order = sectionOf<std::uint32_t>(SectionKind::backwardOrder);
-  _postingOffsets = sectionOf<std::uint64_t>(SectionKind::postingOffsets);
+  _postingOffsets = sectionOfEither<std::uint32_t, std::uint64_t>(SectionKind::postingOffsets);
   _postings = sectionOf<std::uint32_t>(SectionKind::postings);
   _valueOffsets = sectionOf<std::uint64_t>(SectionKind::valueOffsets);
   _valueText = sectionOf<char>(SectionKind::valueText);
@@ -220,7 +235,10 @@ std::uint16_t SearchImage::labelOf(char16_t unit) const noexcept {
 
 std::u16string SearchImage::textOf(std::uint32_t word) const {
   std::u16string text;
-  for (const std::uint16_t label : labelsOf(word)) {
+  const Labels labels = labelsOf(word);
+  text.reserve(labels.size());
+  for (std::size_t i = 0; i < labels.size(); ++i) {
+    const std::uint16_t label = labels[i];
     if (label >= _labels.size()) {
       throwDamaged("a word holds a label that is not there");
     }

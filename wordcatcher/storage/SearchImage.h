@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "wordcatcher/storage/SearchImageFormat.h"
+#include "wordcatcher/storage/TwoWidths.h"
 
 namespace wordcatcher {
 
@@ -44,7 +45,8 @@ class SearchImage {
   std::uint16_t labelOf(char16_t unit) const noexcept;
 
   /// The labels of a word, and its code units. The word must be below wordCount().
-  std::span<const std::uint16_t> labelsOf(std::uint32_t word) const {
+  using Labels = TwoWidths<std::uint8_t, std::uint16_t>;
+  Labels labelsOf(std::uint32_t word) const {
     if (word >= _wordCount) {
       throwDamaged("it refers to a word that is not there");
     }
@@ -65,7 +67,7 @@ class SearchImage {
   }
   void prefetchLabelsOf(std::uint32_t word) const noexcept {
     if (word < _wordCount && _wordOffsets[word] < _wordText.size()) {
-      __builtin_prefetch(&_wordText[_wordOffsets[word]]);
+      __builtin_prefetch(_wordText.addressOf(_wordOffsets[word]));
     }
   }
 
@@ -85,7 +87,7 @@ class SearchImage {
   /// Asks memory early for what postingsOf() will read first. Any word may be given.
   void prefetchPostingsOf(std::uint32_t word) const noexcept {
     if (word < _wordCount) {
-      __builtin_prefetch(&_postingOffsets[word]);
+      __builtin_prefetch(_postingOffsets.addressOf(word));
     }
   }
 
@@ -133,6 +135,9 @@ class SearchImage {
   void bind(const std::string& name);
   template <typename Element>
   std::span<const Element> sectionOf(image::SectionKind kind) const;
+  template <typename Narrow, typename Wide>
+  TwoWidths<Narrow, Wide> sectionOfEither(image::SectionKind kind) const;
+  const image::Section& find(image::SectionKind kind) const;
   void verifySections() const;
   void verifyLabels() const;
   void verifyWords() const;
@@ -152,10 +157,10 @@ class SearchImage {
   std::uint32_t _valueCount = 0;
   std::span<const std::uint16_t> _labels;
   std::span<const std::uint32_t> _wordOffsets;
-  std::span<const std::uint16_t> _wordText;
+  Labels _wordText;
   Tree _forward;
   Tree _backward;
-  std::span<const std::uint64_t> _postingOffsets;
+  TwoWidths<std::uint32_t, std::uint64_t> _postingOffsets;
   std::span<const std::uint32_t> _postings;
   std::span<const std::uint64_t> _valueOffsets;
   std::span<const char> _valueText;

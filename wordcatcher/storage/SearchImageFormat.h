@@ -21,14 +21,16 @@ inline constexpr std::uint32_t kByteOrderMark = 0x01020304;
 inline constexpr std::size_t kSectionAlignment = 64;
 
 enum class SectionKind : std::uint32_t {
-  labels = 1,          // u16: the code unit of each label; label 0 stands for the end of a word
-  wordOffsets = 2,     // u32, words + 1: where each word begins in wordText, in labels
-  wordText = 3,        // u16: the words' labels, words ascending by code units
+  labels = 1,       // u16: the code unit of each label; label 0 stands for the end of a word
+  wordOffsets = 2,  // u32, words + 1: where each word begins in wordText, in labels
+  wordText =
+      3,  // u8, or u16 for more than 255 labels: the words' labels, words ascending by code units
   forwardTree = 4,     // TreeSlot: prefix tree of the words
   forwardOrder = 5,    // u32: word of each place of the forward tree; empty when they are the same
   backwardTree = 6,    // TreeSlot: prefix tree of the words read from their ends
   backwardOrder = 7,   // u32: word of each place of the backward tree
-  postingOffsets = 8,  // u64, words + 1: where each word's posting list begins in postings
+  postingOffsets = 8,  // u32, or u64 for 2^32 postings, words + 1: where each word's posting list
+                       // begins in postings
   postings = 9,        // u32: the values of each word, ascending
   valueOffsets = 10,   // u64, values + 1: where each value begins in valueText
   valueText = 11,      // UTF-8: the data strings, in the order of PhraseShape
@@ -102,7 +104,8 @@ static_assert(sizeof(PhraseClass) == 8);
 /// The bits of `children` say which labels have a child: bit 0 the end of a word, bits 1 to 62 the
 /// labels 1 to 62, bit 63 any number of labels from 63 on, the last of which is flagged.
 struct TreeSlot {
-  std::uint64_t children = 0;  // inner place: its children; leaf: its number of words
+  std::uint64_t children = 0;  // inner place: its children; leaf: its number of words, or its
+                               // LeafTails
   std::uint32_t target = 0;    // inner place: its first child; leaf: its first word; and flags
   std::uint8_t shortest =
       0;  // code units to the end of the nearest word behind the edge, at most 255

@@ -9,6 +9,7 @@
 #define XXH_INLINE_ALL
 #include <xxhash.h>
 
+#include "wordcatcher/storage/LeafTails.h"
 #include "wordcatcher/storage/PhraseWords.h"
 #include "wordcatcher/storage/SearchImage.h"
 #include "wordcatcher/text/CodeUnitOrder.h"
@@ -74,17 +75,19 @@ class TreeVerifier {
     return _tree.order.empty() ? static_cast<std::uint32_t>(place) : _tree.order[place];
   }
 
-  /// Calls `use(begin, end)` with a word in the direction of the tree.
-  template <typename Use>
-  auto inDirection(std::span<const std::uint16_t> word, Use use) const {
-    return _backward ? use(word.rbegin(), word.rend()) : use(word.begin(), word.end());
+  /// A label of a word, counted in the direction of the tree.
+  std::uint16_t labelAt(const SearchImage::Labels& word, std::size_t index) const {
+    return word[_backward ? word.size() - 1 - index : index];
   }
 
   bool precedes(std::uint32_t left, std::uint32_t right) const {
     const auto a = _image.labelsOf(left);
     const auto b = _image.labelsOf(right);
-    return _backward ? std::lexicographical_compare(a.rbegin(), a.rend(), b.rbegin(), b.rend())
-                     : std::lexicographical_compare(a.begin(), a.end(), b.begin(), b.end());
+    std::size_t shared = 0;
+    while (shared < a.size() && shared < b.size() && labelAt(a, shared) == labelAt(b, shared)) {
+      ++shared;
+    }
+    return shared < b.size() && (shared == a.size() || labelAt(a, shared) < labelAt(b, shared));
   }
 
   /// Ascending, so that no word is at two places, and each therefore at one.
@@ -135,21 +138,33 @@ class TreeVerifier {
   /// The words of a leaf begin with its path, and end there when its edge is the end of a word.
   void verifyLeaf(const TreeSlot& slot) {
     const bool isEnd = slot.label == 0;
-    require(slot.index() == _nextPlace && slot.children != 0 &&
-            slot.children <= _image.wordCount() - _nextPlace && (!isEnd || slot.children == 1));
+    const std::uint64_t words = image::leafWords(slot);
+    require(slot.index() == _nextPlace && words != 0 && words <= _image.wordCount() - _nextPlace &&
+            (!isEnd || words == 1));
     std::size_t shortest = SIZE_MAX;
     std::size_t longest = 0;
-    for (std::uint64_t i = 0; i < slot.children; ++i, ++_nextPlace) {
+    for (std::uint64_t i = 0; i < words; ++i, ++_nextPlace) {
       const auto word = _image.labelsOf(wordAt(_nextPlace));
       require(word.size() >= _path.size() && (!isEnd || word.size() == _path.size()));
-      require(inDirection(word, [this](auto begin, auto) {
-        return std::equal(_path.begin(), _path.end(), begin);
-      }));
+      for (std::size_t depth = 0; depth < _path.size(); ++depth) {
+        require(labelAt(word, depth) == _path[depth]);
+      }
       shortest = std::min(shortest, word.size() - _path.size());
       longest = std::max(longest, word.size() - _path.size());
     }
     require(slot.shortest == std::min<std::size_t>(shortest, image::kLengthCap) &&
             slot.longest == std::min<std::size_t>(longest, image::kLengthCap));
+    require(!image::hasTails(slot) || slot.children == tailsOf(slot.index(), words));
+  }
+
+  /// The tails that a leaf of these words has; nothing when there is no room for them.
+  std::optional<std::uint64_t> tailsOf(std::size_t place, std::size_t words) const {
+    const auto wordOf = [&](std::size_t i) { return _image.labelsOf(wordAt(place + i)); };
+    return image::LeafTails::encoded(
+        words, [&](std::size_t i) { return wordOf(i).size() - _path.size(); },
+        [&](std::size_t i, std::size_t position) {
+          return labelAt(wordOf(i), _path.size() + position);
+        });
   }
 
   const SearchImage& _image;
@@ -220,7 +235,7 @@ void SearchImage::verifyLabels() const {
 
 void SearchImage::verifyWords() const {
   if (_wordOffsets.front() != 0 || _wordOffsets.back() != _wordText.size() ||
-      _postingOffsets.front() != 0 || _postingOffsets.back() != _postings.size()) {
+      _postingOffsets[0] != 0 || _postingOffsets[_wordCount] != _postings.size()) {
     throwDamaged("its words do not fill their sections");
   }
   std::u16string previous;

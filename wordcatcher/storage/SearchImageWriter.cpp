@@ -12,7 +12,9 @@
 #include <xxhash.h>
 
 #include "wordcatcher/Error.h"
+#include "wordcatcher/storage/LeafTails.h"
 #include "wordcatcher/storage/PhraseWords.h"
+#include "wordcatcher/storage/SearchImageFormat.h"
 #include "wordcatcher/text/CodeUnitOrder.h"
 
 namespace wordcatcher {
@@ -25,6 +27,9 @@ using image::TreeSlot;
 // Leaves of several words keep the trees small; looking at a word costs about as much as looking at
 // a slot, so beyond a few the walk gets slower.
 constexpr std::uint32_t kWordsALeaf = 2;
+
+// So many labels, the one for the end of a word among them, have 8 bits each.
+constexpr std::size_t kNarrowLabels = 0x100;
 
 // Word offsets have 32 bits.
 constexpr std::uint64_t kMaxWordUnits = std::numeric_limits<std::uint32_t>::max();
@@ -172,7 +177,8 @@ class TreeBuilder {
     std::uint32_t place = job.first;
     if (place < job.last && lengthAt(place) == job.depth) {
       children |= 1U << image::kEndBit;
-      _slots.push_back({.children = 1, .target = TreeSlot::kLeaf | place});
+      _slots.push_back({.children = tailsOf(place, place + 1, job.depth).value_or(1),
+                        .target = TreeSlot::kLeaf | place});
       ++place;
     }
     while (place < job.last) {
@@ -188,8 +194,9 @@ class TreeBuilder {
       TreeSlot slot = {.label = label};
       slot.shortest = capped(shortest - job.depth - 1);
       slot.longest = capped(longest - job.depth - 1);
-      if (place - begin <= kWordsALeaf) {
-        slot.children = place - begin;
+      const auto tails = tailsOf(begin, place, job.depth + 1);
+      if (tails || place - begin <= kWordsALeaf) {
+        slot.children = tails.value_or(place - begin);
         slot.target = TreeSlot::kLeaf | begin;
       } else {
         pending.push_back({static_cast<std::uint32_t>(_slots.size()), begin, place, job.depth + 1});
@@ -205,6 +212,17 @@ class TreeBuilder {
     _slots[job.slot].children = children;
     _slots[job.slot].target |= block;
     std::reverse(pending.begin() + static_cast<std::ptrdiff_t>(firstNew), pending.end());
+  }
+
+  /// What is left of the words at the places from `first` to before `last` behind `depth` labels.
+  std::optional<std::uint64_t> tailsOf(std::uint32_t first, std::uint32_t last,
+                                       std::uint32_t depth) const {
+    const auto placeOf = [first](std::size_t i) { return first + static_cast<std::uint32_t>(i); };
+    return image::LeafTails::encoded(
+        last - first, [&](std::size_t i) -> std::size_t { return lengthAt(placeOf(i)) - depth; },
+        [&](std::size_t i, std::size_t position) {
+          return labelAt(placeOf(i), depth + static_cast<std::uint32_t>(position));
+        });
   }
 
   static std::uint8_t capped(std::uint32_t length) {
@@ -334,6 +352,17 @@ std::array<std::uint64_t, 2> randomGeneration() {
   std::random_device source;
   const auto word = [&source] { return (std::uint64_t{source()} << 32U) | source(); };
   return {word(), word()};
+}
+
+/// The same numbers in fewer bits, which must be enough for each.
+template <typename Narrow, typename Wide>
+std::vector<Narrow> narrowed(const std::vector<Wide>& numbers) {
+  std::vector<Narrow> narrow;
+  narrow.reserve(numbers.size());
+  for (const Wide number : numbers) {
+    narrow.push_back(static_cast<Narrow>(number));
+  }
+  return narrow;
 }
 
 bool isIdentity(const std::vector<std::uint32_t>& order) {
@@ -550,13 +579,21 @@ std::vector<std::byte> SearchImageWriter::finish() const {
       valueTexts.size());
   assembler.add(SectionKind::labels, labels);
   assembler.add(SectionKind::wordOffsets, labelled.offsets());
-  assembler.add(SectionKind::wordText, labelled.labels());
+  if (labels.size() <= kNarrowLabels) {
+    assembler.add(SectionKind::wordText, narrowed<std::uint8_t>(labelled.labels()));
+  } else {
+    assembler.add(SectionKind::wordText, labelled.labels());
+  }
   assembler.add(SectionKind::forwardTree, forward.slots());
   assembler.add(SectionKind::forwardOrder,
                 isIdentity(forward.order()) ? std::vector<std::uint32_t>() : forward.order());
   assembler.add(SectionKind::backwardTree, backward.slots());
   assembler.add(SectionKind::backwardOrder, backward.order());
-  assembler.add(SectionKind::postingOffsets, content.postingOffsets());
+  if (content.postings().size() <= std::numeric_limits<std::uint32_t>::max()) {
+    assembler.add(SectionKind::postingOffsets, narrowed<std::uint32_t>(content.postingOffsets()));
+  } else {
+    assembler.add(SectionKind::postingOffsets, content.postingOffsets());
+  }
   assembler.add(SectionKind::postings, content.postings());
   assembler.add(SectionKind::valueOffsets, valueOffsets);
   assembler.add(SectionKind::valueText, valueTexts);

@@ -16,9 +16,13 @@ constexpr const char* kRootLocale = "";
 
 constexpr std::size_t kMaxLength = std::numeric_limits<std::int32_t>::max();
 
+[[noreturn]] void throwTooLong() {
+  throw std::length_error("A text must not be longer than 2,147,483,647 code units.");
+}
+
 std::int32_t icuLength(std::size_t length) {
   if (length > kMaxLength) {
-    throw std::length_error("A text must not be longer than 2,147,483,647 code units.");
+    throwTooLong();
   }
   return static_cast<std::int32_t>(length);
 }
@@ -42,6 +46,9 @@ std::u16string mapCase(CaseMapping mapping, std::u16string_view text) {
     status = U_ZERO_ERROR;
     result.resize(static_cast<std::size_t>(needed));
     needed = mapping(result.data(), needed, text.data(), length, kRootLocale, &status);
+  }
+  if (status == U_INDEX_OUTOFBOUNDS_ERROR) {
+    throwTooLong();
   }
   if (U_FAILURE(status)) {
     throw std::runtime_error(u_errorName(status));

@@ -1,0 +1,16 @@
+# Writes an example of a page to a source file: the first with the fence FENCE. One in C++ without a
+# main() gets one, and the output that it needs. Arguments: PAGE, FENCE, OUTPUT.
+file(READ "${PAGE}" page)
+string(REPLACE "+" "[+]" fence "${FENCE}")
+string(REGEX MATCH "```${fence}\n([^`]*)```" found "${page}")
+if(NOT found)
+  message(FATAL_ERROR "${PAGE} has no example with the fence ${FENCE}")
+endif()
+set(source "${CMAKE_MATCH_1}")
+if(NOT source MATCHES "int main")
+  string(REGEX MATCH "^(#include [^\n]*\n)+" includes "${source}")
+  string(LENGTH "${includes}" length)
+  string(SUBSTRING "${source}" ${length} -1 statements)
+  set(source "#include <iostream>\n${includes}int main() {\n${statements}}\n")
+endif()
+file(WRITE "${OUTPUT}" "${source}")
