@@ -34,7 +34,10 @@ class WORDCATCHER_EXPORT KXMetaphone {
   /// Loads the word-boundary rules, which takes far longer than encoding a word: keep the encoder.
   /// Throws std::runtime_error if ICU's data, which holds them, is missing.
   KXMetaphone();
+
+  /// Releases memory only.
   ~KXMetaphone();
+
   KXMetaphone(const KXMetaphone&) = delete;
   KXMetaphone& operator=(const KXMetaphone&) = delete;
 
