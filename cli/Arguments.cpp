@@ -36,11 +36,31 @@ std::vector<std::string> shieldedArguments(int argc, char** argv) {
 
 void addArgument(CLI::App& verb, const std::string& name, std::string& value,
                  const std::string& description) {
+  addOptionalArgument(verb, name, value, description);
+  verb.get_option(name)->required();
+}
+
+void addNumber(CLI::App& verb, const std::string& name, std::int64_t& value, std::int64_t largest,
+               const std::string& description) {
+  verb.add_option(name, value, description)
+      ->required()
+      ->transform(CLI::Validator(
+          [](std::string& argument) {
+            argument = unshielded(argument);
+            return std::string();
+          },
+          ""))
+      ->check(CLI::Range(std::int64_t{0}, largest))
+      ->type_name("NUMBER");
+}
+
+void addOptionalArgument(CLI::App& verb, const std::string& name, std::string& value,
+                         const std::string& description) {
   const auto take = [&value](const CLI::results_t& results) {
     value = unshielded(results.front());
     return true;
   };
-  verb.add_option(name, take, description)->required()->expected(1)->type_name("");
+  verb.add_option(name, take, description)->expected(1)->type_name("");
 }
 
 void addArguments(CLI::App& verb, const std::string& name, std::vector<std::string>& values,

@@ -1,6 +1,7 @@
 #ifndef WORDCATCHER_CLI_ARGUMENTS_H
 #define WORDCATCHER_CLI_ARGUMENTS_H
 
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -19,6 +20,14 @@ std::vector<std::string> shieldedArguments(int argc, char** argv);
 /// Adds a required positional argument whose value arrives as the user wrote it.
 void addArgument(CLI::App& verb, const std::string& name, std::string& value,
                  const std::string& description);
+
+/// The same for one that may be left out.
+void addOptionalArgument(CLI::App& verb, const std::string& name, std::string& value,
+                         const std::string& description);
+
+/// Adds a required positional argument that is a number from 0 to `largest`.
+void addNumber(CLI::App& verb, const std::string& name, std::int64_t& value, std::int64_t largest,
+               const std::string& description);
 
 /// Adds a positional argument that may be repeated or left out.
 void addArguments(CLI::App& verb, const std::string& name, std::vector<std::string>& values,

@@ -8,6 +8,7 @@
 #include "cli/OpenIndex.h"
 #include "cli/Phrases.h"
 #include "cli/ProgressBar.h"
+#include "cli/WaitingNote.h"
 #include "cli/WordCounter.h"
 
 namespace wordcatcher::cli {
@@ -49,6 +50,7 @@ IndexingReport indexIntoImage(const IndexingTask& task) {
   progress.say("Writing the index ...");
   NewImage image(task.target);
   const InterruptGuard guard([&image] { image.discardForGood(); });
+  const WaitingNote note("Writing the index");
   report.bytes = image.write(builder);
   return report;
 }

@@ -23,8 +23,8 @@ whole phrases, in phonetic mode codes) and data strings, the bytes, the generati
 which each run of "wordcatcher index" makes anew, and the version of the format.
 
 --json prints one object instead:
-  {"mode": "words", "phrases": 2, "words": 5, "data": 2, "bytes": 1216,
-   "generation": "...", "version": 1}
+  {"mode": "words", "phrases": 2, "words": 5, "data": 2, "bytes": 1544,
+   "generation": "...", "version": 2}
 
 The tables of a classic index know only their words, data strings and bytes; the rest
 is left out, and null in JSON.

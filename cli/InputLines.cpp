@@ -1,6 +1,8 @@
 #include "cli/InputLines.h"
 
 #include <fcntl.h>
+#include <poll.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <array>
@@ -20,10 +22,11 @@ constexpr std::size_t kBlockBytes = 65536;
 
 }  // namespace
 
-InputLines::InputLines(const std::string& path)
+InputLines::InputLines(const std::string& path, std::optional<int> stop)
     : _name(path == "-" ? "standard input" : path),
       _descriptor(path == "-" ? STDIN_FILENO : open(path.c_str(), O_RDONLY | O_CLOEXEC)),
-      _owned(path != "-") {
+      _owned(path != "-"),
+      _stop(stop) {
   if (_descriptor < 0) {
     throw Failure("Cannot read " + quoted(_name) + " (" + errorText() +
                   "): check the file's name and permissions.");
@@ -36,7 +39,7 @@ InputLines::~InputLines() {
   }
 }
 
-std::optional<InputLine> InputLines::next() {
+std::optional<std::string> InputLines::nextBytes() {
   auto line = nextRaw();
   if (!line) {
     return std::nullopt;
@@ -47,11 +50,30 @@ std::optional<InputLine> InputLines::next() {
   if (line->ends_with('\r')) {
     line->pop_back();
   }
+  return line;
+}
+
+std::optional<InputLine> InputLines::next() {
+  auto line = nextBytes();
+  if (!line) {
+    return std::nullopt;
+  }
   auto text = fromUtf8(*line);
   if (!text) {
     throw Failure(place() + " is not valid UTF-8: convert the input to UTF-8 and try again.");
   }
   return InputLine{std::move(*line), std::move(*text)};
+}
+
+std::optional<std::uint64_t> InputLines::bytesInAll() const {
+  struct stat status {};
+  if (fstat(_descriptor, &status) != 0 || !S_ISREG(status.st_mode)) {
+    return std::nullopt;
+  }
+  const off_t read = lseek(_descriptor, 0, SEEK_CUR);
+  const off_t left = status.st_size - read;
+  return read < 0 || left < 0 ? std::nullopt
+                              : std::optional(_bytesRead + static_cast<std::uint64_t>(left));
 }
 
 std::string InputLines::place() const { return _name + ", line " + std::to_string(_lineNumber); }
@@ -77,7 +99,19 @@ std::optional<std::string> InputLines::nextRaw() {
   }
 }
 
+/// Waits until there is something to read, and returns false if it was told to stop instead.
+bool InputLines::waitForMore() const {
+  std::array<pollfd, 2> waited{pollfd{_descriptor, POLLIN, 0}, pollfd{*_stop, POLLIN, 0}};
+  while (poll(waited.data(), waited.size(), -1) < 0 && errno == EINTR) {
+  }
+  return waited.back().revents == 0;
+}
+
 bool InputLines::readMore() {
+  if (_stop && !waitForMore()) {
+    _buffer.clear();
+    return false;
+  }
   std::array<char, kBlockBytes> block{};
   ssize_t count = 0;
   do {
@@ -87,6 +121,7 @@ bool InputLines::readMore() {
     throw Failure("Cannot read " + quoted(_name) + " (" + errorText() +
                   "): give a text file, or a pipe, that can be read.");
   }
+  _bytesRead += static_cast<std::uint64_t>(count);
   _buffer.append(block.data(), static_cast<std::size_t>(count));
   return count > 0;
 }

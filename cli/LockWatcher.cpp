@@ -7,6 +7,7 @@
 
 #include "cli/Failure.h"
 #include "cli/IndexDirectory.h"
+#include "cli/ProgressBar.h"
 
 namespace wordcatcher::cli {
 
@@ -35,8 +36,9 @@ void LockWatcher::watch(const std::stop_token& stop) {
     }
     table = now;
     if (table && !told && Clock::now() - since >= kPatience) {
-      std::cerr << "wordcatcher: waiting for " + quoted(_directory.tables().at(*table)) +
-                       ", which another process holds open; Ctrl-C gives up.\n"
+      std::cerr << ProgressBar::lineStart() +
+                       ("wordcatcher: waiting for " + quoted(_directory.tables().at(*table)) +
+                        ", which another process holds open; Ctrl-C gives up.\n")
                 << std::flush;
       told = true;
     }

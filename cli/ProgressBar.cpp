@@ -10,17 +10,17 @@ namespace wordcatcher::cli {
 namespace {
 
 constexpr std::chrono::milliseconds kRedrawEvery{100};
-constexpr std::size_t kWidth = 40;
-constexpr std::size_t kPercent = 100;
+constexpr std::uint64_t kWidth = 40;
+constexpr std::uint64_t kPercent = 100;
 // Back to the start of the line, and clear it.
 constexpr const char* kWipe = "\r\x1b[K";
 
 }  // namespace
 
-ProgressBar::ProgressBar(std::optional<std::size_t> total)
-    : _total(total),
+ProgressBar::ProgressBar(const Options& options)
+    : _options(options),
       _terminal(isatty(STDERR_FILENO) == 1),
-      _next(std::chrono::steady_clock::now()) {}
+      _next(std::chrono::steady_clock::now() + options.delay) {}
 
 ProgressBar::~ProgressBar() {
   if (_drawn) {
@@ -28,7 +28,7 @@ ProgressBar::~ProgressBar() {
   }
 }
 
-void ProgressBar::show(std::size_t done) {
+void ProgressBar::show(std::uint64_t done) {
   if (!_terminal) {
     return;
   }
@@ -37,14 +37,17 @@ void ProgressBar::show(std::size_t done) {
     return;
   }
   _next = now + kRedrawEvery;
-  if (!_total) {
-    draw(std::to_string(done) + " phrases read");
+  if (!_options.total) {
+    draw(std::to_string(done) + ' ' + _options.unit + " read");
     return;
   }
-  const std::size_t total = std::max<std::size_t>(*_total, 1);
-  const std::size_t filled = done * kWidth / total;
+  const std::uint64_t total = std::max<std::uint64_t>(*_options.total, 1);
+  // A file may grow while it is read.
+  const std::uint64_t shown = std::min(done, total);
+  const std::uint64_t filled = shown * kWidth / total;
   draw('[' + std::string(filled, '#') + std::string(kWidth - filled, ' ') + "] " +
-       std::to_string(done * kPercent / total) + " % of " + std::to_string(total) + " phrases");
+       std::to_string(shown * kPercent / total) + " % of " + std::to_string(total) + ' ' +
+       _options.unit);
 }
 
 void ProgressBar::say(const std::string& text) {
@@ -52,6 +55,8 @@ void ProgressBar::say(const std::string& text) {
     draw(text);
   }
 }
+
+const char* ProgressBar::lineStart() { return isatty(STDERR_FILENO) == 1 ? kWipe : ""; }
 
 void ProgressBar::draw(const std::string& line) {
   std::cerr << kWipe + line << std::flush;

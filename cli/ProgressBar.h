@@ -2,7 +2,7 @@
 #define WORDCATCHER_CLI_PROGRESSBAR_H
 
 #include <chrono>
-#include <cstddef>
+#include <cstdint>
 #include <optional>
 #include <string>
 
@@ -13,22 +13,31 @@ namespace wordcatcher::cli {
 /// error is no terminal.
 class ProgressBar {
  public:
-  /// `total` is what show() will come to; without it only a count is shown.
-  explicit ProgressBar(std::optional<std::size_t> total = std::nullopt);
+  struct Options {
+    std::optional<std::uint64_t> total;  ///< what show() will come to; none: only a count is shown
+    const char* unit = "phrases";
+    std::chrono::milliseconds delay{0};  ///< work that is done sooner shows nothing
+  };
+
+  ProgressBar() : ProgressBar(Options{}) {}
+  explicit ProgressBar(const Options& options);
   ~ProgressBar();
   ProgressBar(const ProgressBar&) = delete;
   ProgressBar& operator=(const ProgressBar&) = delete;
 
   /// Cheap enough to be called at every step.
-  void show(std::size_t done);
+  void show(std::uint64_t done);
 
   /// Replaces the bar by a word on what is going on, at once.
   void say(const std::string& text);
 
+  /// What begins a line on standard error that may meet a bar there: it wipes the bar away.
+  static const char* lineStart();
+
  private:
   void draw(const std::string& line);
 
-  std::optional<std::size_t> _total;
+  Options _options;
   bool _terminal;
   bool _drawn = false;
   std::chrono::steady_clock::time_point _next;

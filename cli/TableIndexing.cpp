@@ -45,7 +45,7 @@ void writeTables(const IndexingTask& task, const IndexDirectory& directory, cons
   }
   checkWritten(directory, log);
   tables.startWriting();
-  ProgressBar progress(phrases.size());
+  ProgressBar progress({.total = phrases.size()});
   for (std::size_t i = 0; i < phrases.size() && !log.failed(); ++i) {
     progress.show(i);
     unfinished->index_withData(phrases[i].text(), phrases[i].data);

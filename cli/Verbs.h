@@ -17,7 +17,10 @@ using ChosenVerb = std::function<ExitCode()>;
 
 // Each adds one verb to the program; parsing a command line that names it sets `chosen`. Both must
 // live until the command line was parsed.
+void addDotVerb(CLI::App& program, ChosenVerb& chosen);
 void addEncodeVerb(CLI::App& program, ChosenVerb& chosen);
+void addExplainVerb(CLI::App& program, ChosenVerb& chosen);
+void addFindVerb(CLI::App& program, ChosenVerb& chosen);
 void addIndexVerb(CLI::App& program, ChosenVerb& chosen);
 void addInfoVerb(CLI::App& program, ChosenVerb& chosen);
 void addQueryVerb(CLI::App& program, ChosenVerb& chosen);

@@ -8,6 +8,7 @@
 #include "cli/OpenIndex.h"
 #include "cli/Output.h"
 #include "cli/Verbs.h"
+#include "cli/WaitingNote.h"
 
 namespace wordcatcher::cli {
 
@@ -23,8 +24,12 @@ Examples:
   wordcatcher verify dogs.wci)";
 
 ExitCode runVerify(const std::string& name) {
-  const Index index = openIndex(name, std::nullopt, false);
-  index.verify();
+  const Index index = [&] {
+    const WaitingNote note("Checking " + name);
+    Index opened = openIndex(name, std::nullopt, false);
+    opened.verify();
+    return opened;
+  }();
   const Index::Info info = index.info();
   const std::string phrases = namesDirectory(name) ? "" : counted(info.phrases, "phrase") + ", ";
   Output output;

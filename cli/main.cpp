@@ -11,27 +11,11 @@
 #include "cli/Arguments.h"
 #include "cli/Failure.h"
 #include "cli/Output.h"
-#include "cli/Verbs.h"
-#include "wordcatcher/Version.h"
+#include "cli/Program.h"
 
 namespace wordcatcher::cli {
 
 namespace {
-
-constexpr const char* kSummary =
-    "Finds stored phrases in free text, tolerating spelling mistakes.\n";
-
-constexpr const char* kFooter = R"(
-Exit codes: 0 matches were found (or the index was written or is whole, or codes were
-printed), 1 nothing matched, 2 wrong usage or a failure.
-
-Examples:
-  printf 'golden retriever\ngolden gate bridge\n' | wordcatcher index dogs.wci
-  wordcatcher query dogs.wci 'a goldan retriver'
-  wordcatcher search --max-distance 1 dogs.wci bridg
-  wordcatcher info dogs.wci
-  wordcatcher encode 'Catherine Schmidt'
-"wordcatcher VERB --help" tells more about a verb.)";
 
 /// Fills the places of standard streams that the caller closed, so that no table file is opened
 /// there and mistaken for one. Using such a stream is still an error.
@@ -56,12 +40,16 @@ ExitCode fail(const std::string& message) {
   return kFailed;
 }
 
+/// The words of the command line that name what was asked for: wordcatcher dot nfa
+std::string chosenPath(const CLI::App& app) {
+  const auto verbs = app.get_subcommands();
+  return app.get_name() + (verbs.empty() ? "" : ' ' + chosenPath(*verbs.front()));
+}
+
 /// Prints what --help and --version ask for; everything else that ends parsing is wrong usage.
 ExitCode endParsing(const CLI::App& program, const CLI::ParseError& error) {
   if (error.get_exit_code() != static_cast<int>(CLI::ExitCodes::Success)) {
-    const auto verbs = program.get_subcommands();
-    const std::string verb = verbs.empty() ? "" : ' ' + verbs.front()->get_name();
-    return fail(std::string(error.what()) + "; see \"wordcatcher" + verb + " --help\".");
+    return fail(std::string(error.what()) + "; see \"" + chosenPath(program) + " --help\".");
   }
   std::ostringstream text;
   program.exit(error, text, text);
@@ -72,20 +60,11 @@ ExitCode endParsing(const CLI::App& program, const CLI::ParseError& error) {
 }
 
 ExitCode run(int argc, char** argv) {
-  CLI::App program(kSummary, "wordcatcher");
-  program.set_version_flag("--version", std::string("wordcatcher ") + versionString,
-                           "Print the version and exit");
-  program.require_subcommand(1);
-  program.footer(kFooter);
+  CLI::App program;
   ChosenVerb chosen;
-  addIndexVerb(program, chosen);
-  addQueryVerb(program, chosen);
-  addSearchVerb(program, chosen);
-  addInfoVerb(program, chosen);
-  addVerifyVerb(program, chosen);
-  addEncodeVerb(program, chosen);
+  defineProgram(program, chosen);
   if (argc <= 1) {
-    std::cerr << program.help();
+    std::cerr << kFirstSteps;
     return kFailed;
   }
   try {

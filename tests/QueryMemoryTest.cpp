@@ -29,7 +29,7 @@ constexpr std::size_t kBytesPerTextByte = 32;
 constexpr std::size_t kBytesPerPosting = 64;
 constexpr std::size_t kFixedBytes = 16384;
 constexpr std::size_t kBytesPerIndexWord = 16;
-constexpr std::size_t kBytesPerIndexValue = 1;
+constexpr std::size_t kBytesPerWordOfFind = 512;
 
 /// What a text makes a query look at.
 struct Load {
@@ -70,7 +70,22 @@ class Opened {
       EXPECT_LE(used, bound) << name << ": " << text.size() << " bytes, " << result.matches.size()
                              << " matches";
       _mostUsed = std::max(_mostUsed, used);
+      expectFindWithinBound(index, name, text, bound);
     }
+  }
+
+  /// Words within the edit limits are not more than those within two edits, neighbours swapped
+  /// aside.
+  void expectFindWithinBound(const Index& index, const std::string& name, const std::string& text,
+                             std::size_t boundOfQuery) const {
+    FindOptions options;
+    options.transpositions = false;
+    MemoryCounter::restartPeak();
+    const auto result = index.find(text, options);
+    const std::size_t used = MemoryCounter::peak() - MemoryCounter::live();
+    const std::size_t bound = boundOfQuery + kBytesPerWordOfFind * wordsOf(text);
+    EXPECT_LE(used, bound) << name << ": find in " << text.size() << " bytes, "
+                           << result.matches.size() << " matches";
   }
 
   std::size_t mostUsed() const { return _mostUsed; }
@@ -85,8 +100,18 @@ class Opened {
     const Load load = loadOf(index, text);
     const auto info = index.info();
     return kBytesPerWordUnit * load.longestWord + kBytesPerTextByte * text.size() +
-           kBytesPerPosting * load.postings + kFixedBytes + kBytesPerIndexWord * info.words +
-           kBytesPerIndexValue * info.values;
+           kBytesPerPosting * load.postings + kFixedBytes + kBytesPerIndexWord * info.words;
+  }
+
+  static std::size_t wordsOf(const std::string& text) {
+    const std::u16string units = decodeUtf8(text);
+    WordSegmenter segmenter;
+    segmenter.start(units);
+    std::size_t words = 1;
+    while (segmenter.next()) {
+      ++words;
+    }
+    return words;
   }
 
   Load loadOf(const Index& index, const std::string& text) const {

@@ -24,6 +24,8 @@ VERSION = ""
 EDGES, DATA, FINALS = TABLES = ("edgeTable.tdb", "dataTable.tdb", "finalTable.tdb")
 PATIENCE = 30
 
+VERBS = ("index", "find", "explain", "query", "search", "info", "verify", "encode", "dot")
+
 DOGS = "golden retriever puppy\t7\ngolden gate bridge\t8\n"
 PUPPY = "golden retriever puppy{ 7 }"
 BRIDGE = "golden gate bridge{ 8 }"
@@ -125,10 +127,10 @@ class CommandTest(unittest.TestCase):
 
 
 class ProgramTest(CommandTest):
-    def test_without_arguments_shows_help_on_standard_error(self):
+    def test_without_arguments_shows_what_to_do_on_standard_error(self):
         self.assertEqual(self.run_it(), 2)
         self.assertEqual(self.out, "")
-        for verb in ("index", "query", "search", "info", "verify"):
+        for verb in VERBS:
             self.assertIn(verb, self.err)
 
     def test_version(self):
@@ -136,7 +138,7 @@ class ProgramTest(CommandTest):
 
     def test_help_has_examples(self):
         self.assertIn("Examples:", self.succeed("--help"))
-        for verb in ("index", "query", "search", "info", "verify"):
+        for verb in VERBS:
             help_text = self.succeed(verb, "--help")
             self.assertIn(f"Usage: wordcatcher {verb}", help_text)
             self.assertIn(f"  wordcatcher {verb} ", help_text.split("Examples:")[1])

@@ -33,6 +33,14 @@ if [ "$with_cli" = 1 ]; then
     exit 1
   }
   echo "the installed wordcatcher works"
+  for page in man/man1/wordcatcher.1 man/man1/wordcatcher-find.1 \
+    bash-completion/completions/wordcatcher zsh/vendor-completions/_wordcatcher; do
+    [ -s "$prefix/share/$page" ] || {
+      echo "nothing was installed at share/$page" >&2
+      exit 1
+    }
+  done
+  echo "its pages and completions are there"
 fi
 
 export LD_LIBRARY_PATH=$libdir

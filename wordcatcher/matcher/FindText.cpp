@@ -17,7 +17,7 @@ namespace {
 /// The codes of words, as an index of codes holds them.
 class CodeWords {
  public:
-  explicit CodeWords(const WordSegmenter& rules) : _segmenter(rules) {}
+  explicit CodeWords(const WordSegmenter& rules) : _encoder(rules), _segmenter(rules) {}
 
   std::vector<std::u16string> of(std::u16string_view word) {
     std::vector<std::u16string> codes;

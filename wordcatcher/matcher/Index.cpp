@@ -176,7 +176,7 @@ SpanAnswer Index::State::runSpanQuery(std::u16string_view text, SpanQueryTrace* 
   std::u16string codes;
   std::int64_t editDistance = kWordDistance;
   if (mode == MatchingMode::phoneticWords) {
-    codes = KXMetaphone().translate(text);
+    codes = KXMetaphone(segmenter).translate(text);
     text = codes;
     editDistance = 0;
   }

@@ -108,6 +108,7 @@ void PhraseFinder::makeTable() {
       slot = (slot + 1) & (_table.size() - 1);
     }
     _table[slot] = i + 1;
+    ++_distinctWords;
   }
 }
 
@@ -143,6 +144,7 @@ void PhraseFinder::rankWords() {
 }
 
 void PhraseFinder::makeSources() {
+  _sources.reserve(_distinctWords);
   for (auto each = _wordOptions.begin(); each != _wordOptions.end();) {
     const std::uint32_t word = each->word;
     Source source = {UINT32_MAX, UINT32_MAX, _image.postingsOf(word)};
@@ -247,6 +249,7 @@ void PhraseFinder::addSegments(std::uint32_t number, std::vector<Segment>& segme
 
 std::vector<PhraseFinder::Segment> PhraseFinder::segments() const {
   std::vector<Segment> segments;
+  segments.reserve(_sources.size());
   for (std::uint32_t source = 0; source < _sources.size(); ++source) {
     addSegments(source, segments);
   }

@@ -132,6 +132,7 @@ class PhraseFinder {
   std::vector<WordOption> _wordOptions;  // ascending by word, then position
   std::vector<Split> _splits;            // ascending by head
   std::vector<std::uint32_t> _table;     // hash table: where a word's options begin, and one
+  std::size_t _distinctWords = 0;        // in it
   std::vector<std::uint32_t> _ranks;     // of the text's words
   std::vector<Source> _sources;
 

@@ -11,8 +11,10 @@ namespace wordcatcher {
 
 namespace {
 
-// Up to this many postings, sorting them costs less than marking them in an array of all values.
+// Up to this many postings, or this part of all values, sorting them costs less than marking them in
+// an array of all values.
 constexpr std::size_t kShortLists = 4096;
+constexpr std::size_t kShortPart = 16;
 
 // Where one list is this many times as long as the other, its elements are searched for one by one.
 constexpr std::size_t kMuchLonger = 16;
@@ -154,7 +156,8 @@ SpanQuery::CandidateSet SpanQuery::candidatesOf(const std::vector<WordHit>& hits
   for (const auto& hit : hits) {
     postings += hit.values;
   }
-  return postings <= kShortLists ? mergeShortLists(hits) : markLongLists(hits);
+  const bool isShort = postings <= std::max(kShortLists, _image.valueCount() / kShortPart);
+  return isShort ? mergeShortLists(hits) : markLongLists(hits);
 }
 
 SpanQuery::CandidateSet SpanQuery::mergeShortLists(const std::vector<WordHit>& hits) const {

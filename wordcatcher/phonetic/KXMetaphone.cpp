@@ -65,6 +65,9 @@ std::u16string_view paddedWord(std::u16string_view word, std::u16string& memory)
 
 KXMetaphone::KXMetaphone() : _segmenter(std::make_unique<WordSegmenter>()) {}
 
+KXMetaphone::KXMetaphone(const WordSegmenter& rules)
+    : _segmenter(std::make_unique<WordSegmenter>(rules)) {}
+
 KXMetaphone::~KXMetaphone() = default;
 
 std::u16string KXMetaphone::translate(std::u16string_view text) {

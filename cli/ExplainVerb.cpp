@@ -1,0 +1,80 @@
+#include <CLI/CLI.hpp>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "cli/Arguments.h"
+#include "cli/FindArguments.h"
+#include "cli/Modes.h"
+#include "cli/OpenIndex.h"
+#include "cli/Output.h"
+#include "cli/Verbs.h"
+
+namespace wordcatcher::cli {
+
+namespace {
+
+constexpr const char* kFooter = R"(
+Tells why "wordcatcher find" gives VALUE its cost for TEXT, word by word, or which
+limit keeps it out. VALUE is what is printed for a match, as in "golden retriever{ 7 }".
+With --query it tells how the distance of "wordcatcher query" comes about instead,
+step by step. The exit code is 0 if VALUE is found and 1 if not.
+
+--json prints one object on one line.
+
+Examples:
+  wordcatcher explain dogs.wci 'a goldan retriver' 'golden retriever'
+  wordcatcher explain --max-cost 2 dogs.wci 'a goldan retriver' 'golden gate bridge'
+  wordcatcher explain --query --json dogs.wci 'a goldan retriver' 'golden retriever')";
+
+struct Arguments {
+  FindOptions options;
+  std::optional<MatchingMode> mode;
+  bool query = false;
+  bool json = false;
+  bool verbose = false;
+  std::string index;
+  std::string text;
+  std::string value;
+};
+
+template <typename Explanation>
+ExitCode print(const Explanation& explanation, bool json) {
+  Output output;
+  output.write(json ? explanation.toJson() + '\n' : explanation.toText());
+  output.flush();
+  return explanation.isFound ? kMatched : kNoMatch;
+}
+
+ExitCode runExplain(const Arguments& arguments) {
+  const Index index = openIndex(arguments.index, arguments.mode, arguments.verbose);
+  return arguments.query
+             ? print(index.explainQuery(arguments.text, arguments.value), arguments.json)
+             : print(index.explain(arguments.text, arguments.value, arguments.options),
+                     arguments.json);
+}
+
+}  // namespace
+
+void addExplainVerb(CLI::App& program, ChosenVerb& chosen) {
+  auto* const verb =
+      program.add_subcommand("explain", "Tell why a phrase is found in a text, or why not");
+  const auto arguments = std::make_shared<Arguments>();
+  auto* const query =
+      verb->add_flag("--query", arguments->query, "Explain the distance of \"wordcatcher query\"");
+  for (auto* const option : addMatchOptions(*verb, arguments->options)) {
+    option->excludes(query);
+  }
+  verb->add_flag("--json", arguments->json, "Print a JSON object");
+  addModeOption(*verb, arguments->mode,
+                "the index's own, or " + nameOf(kDefaultMode) + " for a directory");
+  verb->add_flag("--verbose", arguments->verbose, "Show the tables' storage log on standard error");
+  addArgument(*verb, "INDEX", arguments->index,
+              "A search image, or the directory of a classic index");
+  addArgument(*verb, "TEXT", arguments->text, "The text that was searched");
+  addArgument(*verb, "VALUE", arguments->value, "The value to explain, as a match shows it");
+  verb->footer(kFooter);
+  verb->callback([arguments, &chosen] { chosen = [arguments] { return runExplain(*arguments); }; });
+}
+
+}  // namespace wordcatcher::cli
