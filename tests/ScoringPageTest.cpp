@@ -144,9 +144,9 @@ std::string drawingOfSteps(const QueryExplanation& explanation) {
 /// What stands in boxes and at lines of a drawing's source, line by line, as in an SVG.
 std::vector<std::string> labelsOf(const std::string& dot) {
   std::vector<std::string> labels;
-  const std::regex label("label=\"((?:[^\"\\\\]|\\\\.)*)\"");
+  const std::regex label(R"re(label="((?:[^"\\]|\\.)*)")re");
   for (std::sregex_iterator at(dot.begin(), dot.end(), label), end; at != end; ++at) {
-    std::istringstream lines(std::regex_replace((*at)[1].str(), std::regex("\\\\\""), "&quot;"));
+    std::istringstream lines(std::regex_replace((*at)[1].str(), std::regex(R"(\\")"), "&quot;"));
     for (std::string line; std::getline(lines, line);) {
       labels.push_back(line);
     }
