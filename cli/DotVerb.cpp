@@ -130,7 +130,7 @@ LevenshteinNFA nfaOf(const Arguments& arguments) {
 }
 
 std::string titleOf(const Arguments& arguments) {
-  return quoted(arguments.word) + " within " + counted(arguments.maxDistance, "edit");
+  return inQuotes(arguments.word) + " within " + counted(arguments.maxDistance, "edit");
 }
 
 ExitCode runNfa(const Arguments& arguments) {
@@ -165,7 +165,7 @@ ExitCode runTree(const Arguments& arguments) {
   const auto prefix = decoded(arguments.prefix, "PREFIX");
   const WordTree tree =
       wordTreeOf(*openWords(arguments.index, arguments.verbose), prefix, kMostWords);
-  Graph graph("The words of " + quoted(arguments.index));
+  Graph graph("The words of " + inQuotes(arguments.index));
   const std::size_t root = graph.addNode(visible(prefix), tree.isWord);
   graph.markStart(root);
   drawBelow(graph, root, tree);

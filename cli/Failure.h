@@ -24,7 +24,7 @@ class Failure : public std::runtime_error {
 /// The text of an errno value.
 inline std::string errorText(int code = errno) { return std::generic_category().message(code); }
 
-inline std::string quoted(const std::string& text) { return '"' + text + '"'; }
+inline std::string inQuotes(const std::string& text) { return '"' + text + '"'; }
 
 }  // namespace wordcatcher::cli
 

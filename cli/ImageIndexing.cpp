@@ -22,14 +22,14 @@ void checkNamesFile(const std::string& target) {
   }
   if (namesDirectory(target)) {
     throw Failure(
-        quoted(target) +
+        inQuotes(target) +
         " is a directory: name a file such as \"names.wci\", or give --tables to write the "
         "tables of a classic index there.");
   }
   const auto parent = std::filesystem::path(target).parent_path();
   std::error_code unknown;  // what cannot be told now is told when the file is written
   if (!parent.empty() && !std::filesystem::is_directory(parent, unknown)) {
-    throw Failure("There is no directory " + quoted(parent.string()) +
+    throw Failure("There is no directory " + inQuotes(parent.string()) +
                   " for the index: create it, or choose another place.");
   }
 }

@@ -69,7 +69,8 @@ std::optional<std::uint64_t> tableSize(const std::string& path) {
 }
 
 std::string tryIndexing(const std::string& directory) {
-  return "index the phrases again with " + quoted("wordcatcher index --tables " + directory) + ".";
+  return "index the phrases again with " + inQuotes("wordcatcher index --tables " + directory) +
+         ".";
 }
 
 bool sameFile(const struct stat& a, const struct stat& b) {
@@ -100,28 +101,29 @@ void IndexDirectory::openForReading(const TableLog& log, const std::function<voi
   // Only now is no other process still writing them.
   tableBytes();
   if (log.failed()) {
-    throw Failure("Cannot open the index in " + quoted(_name) + " (" + errorText(log.errorCode()) +
-                  "): check the directory's permissions, or " + tryIndexing(_name));
+    throw Failure("Cannot open the index in " + inQuotes(_name) + " (" +
+                  errorText(log.errorCode()) + "): check the directory's permissions, or " +
+                  tryIndexing(_name));
   }
 }
 
 void IndexDirectory::checkReadable() const {
   struct stat status {};
   if (stat(_path.c_str(), &status) != 0) {
-    throw Failure("Cannot read the directory " + quoted(_name) + " (" + errorText() +
+    throw Failure("Cannot read the directory " + inQuotes(_name) + " (" + errorText() +
                   "): check its name, or " + tryIndexing(_name));
   }
   for (const auto& table : _tables) {
     const int descriptor = ::open(table.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK);
     if (descriptor < 0) {
-      throw Failure("Cannot read the table " + quoted(table) + " (" + errorText() +
-                    "): check that " + quoted(_name) + " is the index's directory, or " +
+      throw Failure("Cannot read the table " + inQuotes(table) + " (" + errorText() +
+                    "): check that " + inQuotes(_name) + " is the index's directory, or " +
                     tryIndexing(_name));
     }
     const bool regular = fstat(descriptor, &status) == 0 && S_ISREG(status.st_mode);
     close(descriptor);
     if (!regular) {
-      throw Failure(quoted(table) + " is not a regular file: remove it, then " +
+      throw Failure(inQuotes(table) + " is not a regular file: remove it, then " +
                     tryIndexing(_name));
     }
   }
@@ -132,7 +134,7 @@ std::uint64_t IndexDirectory::tableBytes() const {
   for (const auto& table : _tables) {
     const auto size = tableSize(table);
     if (!size) {
-      throw Failure(quoted(table) +
+      throw Failure(inQuotes(table) +
                     " is not a table, or is damaged or unfinished: " + tryIndexing(_name));
     }
     sum += *size;

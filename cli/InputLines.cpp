@@ -28,7 +28,7 @@ InputLines::InputLines(const std::string& path, std::optional<int> stop)
       _owned(path != "-"),
       _stop(stop) {
   if (_descriptor < 0) {
-    throw Failure("Cannot read " + quoted(_name) + " (" + errorText() +
+    throw Failure("Cannot read " + inQuotes(_name) + " (" + errorText() +
                   "): check the file's name and permissions.");
   }
 }
@@ -118,7 +118,7 @@ bool InputLines::readMore() {
     count = read(_descriptor, block.data(), block.size());
   } while (count < 0 && errno == EINTR);
   if (count < 0) {
-    throw Failure("Cannot read " + quoted(_name) + " (" + errorText() +
+    throw Failure("Cannot read " + inQuotes(_name) + " (" + errorText() +
                   "): give a text file, or a pipe, that can be read.");
   }
   _bytesRead += static_cast<std::uint64_t>(count);

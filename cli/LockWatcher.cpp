@@ -37,7 +37,7 @@ void LockWatcher::watch(const std::stop_token& stop) {
     table = now;
     if (table && !told && Clock::now() - since >= kPatience) {
       std::cerr << ProgressBar::lineStart() +
-                       ("wordcatcher: waiting for " + quoted(_directory.tables().at(*table)) +
+                       ("wordcatcher: waiting for " + inQuotes(_directory.tables().at(*table)) +
                         ", which another process holds open; Ctrl-C gives up.\n")
                 << std::flush;
       told = true;

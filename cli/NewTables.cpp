@@ -18,7 +18,7 @@ constexpr mode_t kFilePermissions = 0666;
 constexpr std::size_t kHeaderBytes = 2048;
 
 [[noreturn]] void throwCannotWrite(const std::string& path, const std::string& reason) {
-  throw Failure("Cannot write " + quoted(path) + " (" + reason +
+  throw Failure("Cannot write " + inQuotes(path) + " (" + reason +
                 "): make the directory and its tables writable, or choose another directory.");
 }
 
@@ -84,10 +84,10 @@ void NewTables::createDirectory() {
   const int code = errno;
   struct stat status {};
   if (stat(_directory.name().c_str(), &status) == 0 && !S_ISDIR(status.st_mode)) {
-    throw Failure(quoted(_directory.name()) + " is not a directory: choose another name.");
+    throw Failure(inQuotes(_directory.name()) + " is not a directory: choose another name.");
   }
   if (stat(_directory.path().c_str(), &status) != 0) {
-    throw Failure("Cannot create the directory " + quoted(_directory.name()) + " (" +
+    throw Failure("Cannot create the directory " + inQuotes(_directory.name()) + " (" +
                   errorText(code) + "): create its parent directory or choose another place.");
   }
 }

@@ -25,7 +25,7 @@ Index openImage(const std::string& name, std::optional<MatchingMode> mode) {
   auto index = Index::open(name);
   const MatchingMode remembered = index.info().mode;
   if (mode && *mode != remembered) {
-    throw Failure(quoted(name) + " was indexed in the mode " + nameOf(remembered) + ", not " +
+    throw Failure(inQuotes(name) + " was indexed in the mode " + nameOf(remembered) + ", not " +
                   nameOf(*mode) + ": leave --mode out, or index the phrases again in that mode.");
   }
   return index;

@@ -27,7 +27,7 @@ void checkWritten(const IndexDirectory& directory, const TableLog& log) {
   if (!log.failed()) {
     return;
   }
-  throw Failure("Cannot write the index in " + quoted(directory.name()) + " (" +
+  throw Failure("Cannot write the index in " + inQuotes(directory.name()) + " (" +
                 errorText(log.errorCode()) +
                 "): make room there or choose another directory, then index again.");
 }

@@ -36,7 +36,7 @@ std::uint32_t lowerBound(const SearchImage& image, std::u16string_view prefix) {
 }
 
 std::string described(std::u16string_view prefix) {
-  return prefix.empty() ? "" : " that begin with " + quoted(displayUtf8(prefix));
+  return prefix.empty() ? "" : " that begin with " + inQuotes(displayUtf8(prefix));
 }
 
 std::vector<std::u16string> wordsFrom(const SearchImage& image, std::u16string_view prefix,
@@ -51,7 +51,7 @@ std::vector<std::u16string> wordsFrom(const SearchImage& image, std::u16string_v
       throw Failure("More than " + std::to_string(mostWords) + " words" + described(prefix) +
                     " are stored, and no drawing of them can be read: give " +
                     (prefix.empty() ? "a PREFIX, such as " : "a longer PREFIX, such as ") +
-                    quoted(displayUtf8(words.back().substr(0, prefix.size() + 1))) + '.');
+                    inQuotes(displayUtf8(words.back().substr(0, prefix.size() + 1))) + '.');
     }
     words.push_back(std::move(word));
   }
