@@ -22,8 +22,10 @@ enum class ErrorCode {
 /// The one exception of the interfaces for new hosts. what() is a sentence that says what to do.
 class WORDCATCHER_EXPORT Error : public std::runtime_error {
  public:
+  /// An error with its sentence, which what() returns.
   Error(ErrorCode code, const std::string& sentence) : std::runtime_error(sentence), _code(code) {}
 
+  /// What went wrong, to be told apart by programs.
   ErrorCode code() const noexcept { return _code; }
 
  private:

@@ -3,6 +3,8 @@
 
 #include "wordcatcher/Export.h"
 
+/// Everything of Wordcatcher for C++. For new hosts: IndexBuilder and Index. The classes whose
+/// names begin with KX, LX and PLX, and TinyCDB, are the classic interface.
 namespace wordcatcher {
 
 /// Version of the library that is loaded, as major.minor: 1.0 for every 1.0.x.

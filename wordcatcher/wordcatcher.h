@@ -1,7 +1,9 @@
 #ifndef WORDCATCHER_WORDCATCHER_H
 #define WORDCATCHER_WORDCATCHER_H
 
-/* Wordcatcher for C, and for every language that can call C: finds, inside free text, phrases that
+/** @file
+
+   Wordcatcher for C, and for every language that can call C: finds, inside free text, phrases that
    were stored earlier, tolerating spelling mistakes.
 
        wordcatcher_index* index;
@@ -70,74 +72,76 @@
 extern "C" {
 #endif
 
-/* Stands for the length of a string that ends at its NUL. */
+/** Stands for the length of a string that ends at its NUL. */
 #define WORDCATCHER_NUL ((size_t)-1)
 
 /* ---- Errors ---------------------------------------------------------------------------------- */
 
-/* What a call came to: one of the enumerators. */
+/** What a call came to: one of the enumerators. */
 typedef int32_t wordcatcher_code;
 
+/** The codes. */
 enum {
-  WORDCATCHER_OK = 0,
-  WORDCATCHER_NOT_FOUND = 1,    /* There is no such file or directory. */
-  WORDCATCHER_NOT_READABLE = 2, /* The file exists and cannot be read or mapped. */
-  WORDCATCHER_NOT_WRITABLE = 3, /* The target cannot be written; what stood there is whole. */
-  WORDCATCHER_NOT_AN_INDEX = 4, /* Something else, or of a version that cannot be read. */
-  WORDCATCHER_DAMAGED = 5,      /* The file was an index and is cut short or altered. */
-  WORDCATCHER_BAD_INPUT = 6,    /* An argument, a text or an option that cannot be taken. */
-  WORDCATCHER_TOO_LARGE = 7,    /* More than the format, or memory, can count. */
-  WORDCATCHER_NO_MEMORY = 101,  /* Memory ran out. */
-  WORDCATCHER_INTERNAL = 102    /* A failure that no other code tells: report it. */
+  WORDCATCHER_OK = 0,           /**< All went well. */
+  WORDCATCHER_NOT_FOUND = 1,    /**< There is no such file or directory. */
+  WORDCATCHER_NOT_READABLE = 2, /**< The file exists and cannot be read or mapped. */
+  WORDCATCHER_NOT_WRITABLE = 3, /**< The target cannot be written; what stood there is whole. */
+  WORDCATCHER_NOT_AN_INDEX = 4, /**< Something else, or of a version that cannot be read. */
+  WORDCATCHER_DAMAGED = 5,      /**< The file was an index and is cut short or altered. */
+  WORDCATCHER_BAD_INPUT = 6,    /**< An argument, a text or an option that cannot be taken. */
+  WORDCATCHER_TOO_LARGE = 7,    /**< More than the format, or memory, can count. */
+  WORDCATCHER_NO_MEMORY = 101,  /**< Memory ran out. */
+  WORDCATCHER_INTERNAL = 102    /**< A failure that no other code tells: report it. */
 };
 
-/* Why a call failed. It belongs to the caller, and needs no giving back. */
+/** Why a call failed. It belongs to the caller, and needs no giving back. */
 typedef struct wordcatcher_error {
-  wordcatcher_code code;
-  char message[1020]; /* One sentence; of a longer one the middle is left out. Empty for OK. */
+  wordcatcher_code code; /**< why, or WORDCATCHER_OK */
+  char message[1020];    /**< One sentence; of a longer one the middle is left out. Empty for OK. */
 } wordcatcher_error;
 
-/* A short English name of a code, such as "not found"; "unknown" for any other number. Static. */
+/** A short English name of a code, such as "not found"; "unknown" for any other number. Static. */
 WORDCATCHER_EXPORT const char* wordcatcher_code_name(wordcatcher_code code);
 
-/* The version of the library that is loaded, as "major.minor.patch". Static. */
+/** The version of the library that is loaded, as "major.minor.patch". Static. */
 WORDCATCHER_EXPORT const char* wordcatcher_version(void);
 
 /* ---- Reading --------------------------------------------------------------------------------- */
 
-/* How phrases are stored and found. */
+/** How phrases are stored and found. */
 enum {
-  WORDCATCHER_MODE_WORDS = 0,         /* by their words, each within an edit distance */
-  WORDCATCHER_MODE_WHOLE_TEXT = 1,    /* as one string, within an edit distance */
-  WORDCATCHER_MODE_PHONETIC_WORDS = 2 /* by codes of how their words sound */
+  WORDCATCHER_MODE_WORDS = 0,         /**< by their words, each within an edit distance */
+  WORDCATCHER_MODE_WHOLE_TEXT = 1,    /**< as one string, within an edit distance */
+  WORDCATCHER_MODE_PHONETIC_WORDS = 2 /**< by codes of how their words sound */
 };
 
-/* How an index file gets into memory. */
+/** How an index file gets into memory. */
 enum {
-  WORDCATCHER_LOAD_MAP = 0, /* map it: opens in constant time, whatever its size */
-  WORDCATCHER_LOAD_COPY = 1 /* copy it: for storage on which files may shrink while they are read,
+  WORDCATCHER_LOAD_MAP = 0, /**< map it: opens in constant time, whatever its size */
+  WORDCATCHER_LOAD_COPY = 1 /**< copy it: for storage on which files may shrink while they are read,
                                which ends a process that has mapped them (SIGBUS) */
 };
 
-/* An index opened for reading. It never changes, and calls on it take no lock. Every call may fail
+/** An index opened for reading. It never changes, and calls on it take no lock. Every call may fail
    with WORDCATCHER_DAMAGED when the file turns out to be damaged, and does nothing worse, whatever
    the file holds. */
 typedef struct wordcatcher_index wordcatcher_index;
 
+/** How an index is opened, and the budgets of its queries. */
 typedef struct wordcatcher_open_options {
-  size_t size;            /* set by wordcatcher_open_options_init() */
-  int32_t load;           /* WORDCATCHER_LOAD_...; map */
-  int32_t mode;           /* WORDCATCHER_MODE_...; words. Of a classic index, which does not
+  size_t size;            /**< set by wordcatcher_open_options_init() */
+  int32_t load;           /**< WORDCATCHER_LOAD_...; map */
+  int32_t mode;           /**< WORDCATCHER_MODE_...; words. Of a classic index, which does not
                              remember; not looked at for a file, which does */
-  size_t max_query_words; /* words of a text that are looked at; 4096 */
-  size_t max_word_units;  /* UTF-16 code units of a word (or whole text) that is looked up; 1024 */
+  size_t max_query_words; /**< words of a text that are looked at; 4096 */
+  size_t max_word_units;  /**< UTF-16 code units of a word (whole text) that is looked up; 1024 */
 } wordcatcher_open_options;
 
-/* Fills the options with the defaults named above. `size` is sizeof *options. NULL does nothing. */
+/** Fills the options with the defaults named above. `size`: sizeof *options. NULL does nothing. */
 WORDCATCHER_EXPORT void wordcatcher_open_options_init(wordcatcher_open_options* options,
                                                       size_t size);
 
-/* Opens an index: a file, or a classic index (a directory, or the prefix of its files' names), of
+/** Opens an index: a file, or a classic index (a directory, or the prefix of its files' names), of
    which an image is built in memory; its files are locked only while they are read, and waited for
    while another process writes them. `options` may be NULL.
 
@@ -148,87 +152,87 @@ WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_open(const char* path,
                                                            wordcatcher_index** index,
                                                            wordcatcher_error* error);
 
-/* Gives an index back: its file is unmapped. No call on it may be under way. */
+/** Gives an index back: its file is unmapped. No call on it may be under way. */
 WORDCATCHER_EXPORT void wordcatcher_index_close(wordcatcher_index* index);
 
-/* What an index holds. */
+/** What an index holds. */
 typedef struct wordcatcher_info {
-  int32_t mode;        /* WORDCATCHER_MODE_... */
-  uint32_t version;    /* of the format */
-  uint64_t phrases;    /* phrases added; 0 for a classic index, which does not count them */
-  uint64_t words;      /* distinct stored words (whole texts, codes) */
-  uint64_t values;     /* distinct data strings */
-  uint64_t bytes;      /* of the image */
-  char generation[40]; /* 32 hexadecimal digits and a NUL; random for each build */
+  int32_t mode;        /**< WORDCATCHER_MODE_... */
+  uint32_t version;    /**< of the format */
+  uint64_t phrases;    /**< phrases added; 0 for a classic index, which does not count them */
+  uint64_t words;      /**< distinct stored words (whole texts, codes) */
+  uint64_t values;     /**< distinct data strings */
+  uint64_t bytes;      /**< of the image */
+  char generation[40]; /**< 32 hexadecimal digits and a NUL; random for each build */
 } wordcatcher_info;
 
-/* Fills `info`, the caller's, of `size` bytes (sizeof *info). Constant time. */
+/** Fills `info`, the caller's, of `size` bytes (sizeof *info). Constant time. */
 WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_info(const wordcatcher_index* index,
                                                            wordcatcher_info* info, size_t size,
                                                            wordcatcher_error* error);
 
-/* Checks the whole image. Fails with DAMAGED, and names what is wrong. Linear in its size. */
+/** Checks the whole image. Fails with DAMAGED, and names what is wrong. Linear in its size. */
 WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_verify(const wordcatcher_index* index,
                                                              wordcatcher_error* error);
 
 /* ---- Finding phrases in a text --------------------------------------------------------------- */
 
-/* What becomes of matches whose ranges in the text overlap. */
+/** What becomes of matches whose ranges in the text overlap. */
 enum {
-  WORDCATCHER_OVERLAPS_ALL = 0,    /* every match */
-  WORDCATCHER_OVERLAPS_NO_SUB = 1, /* no match whose range lies within the larger one of another */
-  WORDCATCHER_OVERLAPS_LONGEST = 2 /* of those that overlap the longest; then the first in order */
+  WORDCATCHER_OVERLAPS_ALL = 0,    /**< every match */
+  WORDCATCHER_OVERLAPS_NO_SUB = 1, /**< none whose range lies within the larger one of another */
+  WORDCATCHER_OVERLAPS_LONGEST = 2 /**< of those that overlap the longest; then the first one */
 };
 
-/* No bound on the cost of a match. */
+/** No bound on the cost of a match. */
 #define WORDCATCHER_ANY_COST UINT64_MAX
 
-/* What wordcatcher_index_find() looks for and how much of it. The lengths that make a word short,
+/** What wordcatcher_index_find() looks for and how much of it. The lengths that make a word short,
    medium or long are UTF-16 code units of its lower-case form; an edit is one code unit replaced,
    inserted or left out. Edits are at most 3 each. */
 typedef struct wordcatcher_find_options {
-  size_t size;               /* set by wordcatcher_find_options_init() */
-  size_t limit;              /* matches at the most: the first ones of all; 10 */
-  uint64_t max_cost;         /* the greatest cost of a match; WORDCATCHER_ANY_COST */
-  size_t min_words;          /* words of a phrase that the text must hold; 1, as for 0 */
-  size_t short_length;       /* a word of up to so many code units is short; 2 */
-  size_t medium_length;      /* a longer one of up to so many is medium, others are long; 5 */
-  uint32_t short_edits;      /* edits that a short word of the text may have; 0 */
-  uint32_t medium_edits;     /* a medium one; 1 */
-  uint32_t long_edits;       /* a long one; 2 */
-  uint32_t whole_text_edits; /* the whole text, in an index of whole texts; 3 */
-  int32_t transpositions;    /* not 0: two neighbours swapped are one edit, not two; 1 */
-  int32_t overlaps;          /* WORDCATCHER_OVERLAPS_...; all */
-  uint64_t max_postings;     /* postings (phrases under a word) that are looked at; 2,000,000 */
+  size_t size;               /**< set by wordcatcher_find_options_init() */
+  size_t limit;              /**< matches at the most: the first ones of all; 10 */
+  uint64_t max_cost;         /**< the greatest cost of a match; WORDCATCHER_ANY_COST */
+  size_t min_words;          /**< words of a phrase that the text must hold; 1, as for 0 */
+  size_t short_length;       /**< a word of up to so many code units is short; 2 */
+  size_t medium_length;      /**< a longer one of up to so many is medium, others are long; 5 */
+  uint32_t short_edits;      /**< edits that a short word of the text may have; 0 */
+  uint32_t medium_edits;     /**< a medium one; 1 */
+  uint32_t long_edits;       /**< a long one; 2 */
+  uint32_t whole_text_edits; /**< the whole text, in an index of whole texts; 3 */
+  int32_t transpositions;    /**< not 0: two neighbours swapped are one edit, not two; 1 */
+  int32_t overlaps;          /**< WORDCATCHER_OVERLAPS_...; all */
+  uint64_t max_postings;     /**< postings (phrases under a word) that are looked at; 2,000,000 */
 } wordcatcher_find_options;
 
-/* Fills the options with the defaults named above. `size` is sizeof *options. NULL does nothing. */
+/** Fills the options with the defaults named above. `size`: sizeof *options. NULL does nothing. */
 WORDCATCHER_EXPORT void wordcatcher_find_options_init(wordcatcher_find_options* options,
                                                       size_t size);
 
-/* The phrases that a text holds. */
+/** The phrases that a text holds. */
 typedef struct wordcatcher_findings wordcatcher_findings;
 
-/* A phrase found in a text. */
+/** A phrase found in a text. */
 typedef struct wordcatcher_finding {
-  const char* value; /* its data string */
-  size_t value_length;
-  uint64_t cost; /* edits of its words, and 2 for each word that one side has more */
-  size_t begin;  /* the range of the text that spans the hits, in bytes */
-  size_t end;
-  size_t hit_count; /* at least 1 */
+  const char* value;   /**< its data string */
+  size_t value_length; /**< its bytes, without the NUL */
+  uint64_t cost;       /**< edits of its words, and 2 for each word that one side has more */
+  size_t begin;        /**< the range of the text that spans the hits, in bytes */
+  size_t end;          /**< the byte behind it */
+  size_t hit_count;    /**< at least 1 */
 } wordcatcher_finding;
 
-/* A word of a phrase found in a text. */
+/** A word of a phrase found in a text. */
 typedef struct wordcatcher_hit {
-  const char* word; /* as stored; two that the text joins stand with a space between */
-  size_t word_length;
-  size_t begin; /* its range of the text, in bytes */
-  size_t end;
-  uint32_t edits; /* between the two */
+  const char* word;   /**< as stored; two that the text joins stand with a space between */
+  size_t word_length; /**< its bytes, without the NUL */
+  size_t begin;       /**< its range of the text, in bytes */
+  size_t end;         /**< the byte behind it */
+  uint32_t edits;     /**< between the two */
 } wordcatcher_hit;
 
-/* The phrases that a text holds, wholly or in part, the best one first; see Index::find in
+/** The phrases that a text holds, wholly or in part, the best one first; see Index::find in
    matcher/Index.h for the costs and the order. Bytes that are not UTF-8 separate words. `options`
    may be NULL. The time is bounded by the budgets of the options, and of those that the index was
    opened with. Fails with BAD_INPUT for edits above 3 and for overlaps that do not exist. */
@@ -238,37 +242,38 @@ WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_find(const wordcatcher_ind
                                                            wordcatcher_findings** findings,
                                                            wordcatcher_error* error);
 
-/* How many phrases were found. */
+/** How many phrases were found. */
 WORDCATCHER_EXPORT size_t wordcatcher_findings_count(const wordcatcher_findings* findings);
 
-/* One of them, counted from 0 in the order of the result. Constant time. */
+/** One of them, counted from 0 in the order of the result. Constant time. */
 WORDCATCHER_EXPORT const wordcatcher_finding* wordcatcher_findings_at(
     const wordcatcher_findings* findings, size_t finding);
 
-/* One of its hits, counted from 0 in the order of the text. Constant time. */
+/** One of its hits, counted from 0 in the order of the text. Constant time. */
 WORDCATCHER_EXPORT const wordcatcher_hit* wordcatcher_findings_hit(
     const wordcatcher_findings* findings, size_t finding, size_t hit);
 
-/* Whether a budget cut something off. */
+/** Whether a budget cut something off. */
 WORDCATCHER_EXPORT bool wordcatcher_findings_truncated(const wordcatcher_findings* findings);
 
-/* Gives the result back. */
+/** Gives the result back. */
 WORDCATCHER_EXPORT void wordcatcher_findings_free(wordcatcher_findings* findings);
 
 /* ---- Queries and words ----------------------------------------------------------------------- */
 
-/* What a query or a search found. */
+/** What a query or a search found. */
 typedef struct wordcatcher_matches wordcatcher_matches;
 
+/** One phrase that a query found, or one word that a search found. */
 typedef struct wordcatcher_match {
-  const char* value; /* of a query: the data string, or the stored text of an index of whole texts;
-                        of a search: the stored word (text, code) */
-  size_t value_length;
-  int64_t distance;  /* how far away: edits, and for words too many or too few */
-  size_t data_count; /* data strings with it: of searches, and of queries of whole texts; else 0 */
+  const char* value;   /**< of a query: the data string, or the stored text of an index of whole
+                          texts; of a search: the stored word (text, code) */
+  size_t value_length; /**< its bytes, without the NUL */
+  int64_t distance;    /**< how far away: edits, and for words too many or too few */
+  size_t data_count;   /**< its data strings: of searches and queries of whole texts; else 0 */
 } wordcatcher_match;
 
-/* The phrases near a text, by ascending distance, then by value (in UTF-16 code units): those of
+/** The phrases near a text, by ascending distance, then by value (in UTF-16 code units): those of
    Index::query, which answers as the classic matcher does. Bytes that are not UTF-8 separate
    words. The time is bounded by the budgets that the index was opened with. */
 WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_query(const wordcatcher_index* index,
@@ -276,7 +281,7 @@ WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_query(const wordcatcher_in
                                                             wordcatcher_matches** matches,
                                                             wordcatcher_error* error);
 
-/* The stored words (whole texts, codes) within a distance of one word: at most 16 edits, where a
+/** The stored words (whole texts, codes) within a distance of one word: at most 16 edits, where a
    negative distance finds nothing. In the word "*" stands for any one character, "_" for none.
    Fails with BAD_INPUT for a greater distance, and for a word that is not UTF-8. */
 WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_search(const wordcatcher_index* index,
@@ -285,34 +290,34 @@ WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_search(const wordcatcher_i
                                                              wordcatcher_matches** matches,
                                                              wordcatcher_error* error);
 
-/* How many matches there are. */
+/** How many matches there are. */
 WORDCATCHER_EXPORT size_t wordcatcher_matches_count(const wordcatcher_matches* matches);
 
-/* One of them, counted from 0 in the order of the result. Constant time. */
+/** One of them, counted from 0 in the order of the result. Constant time. */
 WORDCATCHER_EXPORT const wordcatcher_match* wordcatcher_matches_at(
     const wordcatcher_matches* matches, size_t match);
 
-/* One of its data strings, counted from 0, ascending by UTF-16 code units. `length`, which may be
+/** One of its data strings, counted from 0, ascending by UTF-16 code units. `length`, which may be
    NULL, takes its bytes; 0 where NULL is returned. Constant time. */
 WORDCATCHER_EXPORT const char* wordcatcher_matches_data(const wordcatcher_matches* matches,
                                                         size_t match, size_t data, size_t* length);
 
-/* Of a query: whether any word of the text was found with data, always true for an index of whole
+/** Of a query: whether any word of the text was found with data, always true for an index of whole
    texts; of a search: whether there is a match. */
 WORDCATCHER_EXPORT bool wordcatcher_matches_found(const wordcatcher_matches* matches);
 
-/* Whether a budget cut something off. */
+/** Whether a budget cut something off. */
 WORDCATCHER_EXPORT bool wordcatcher_matches_truncated(const wordcatcher_matches* matches);
 
-/* Gives the result back. */
+/** Gives the result back. */
 WORDCATCHER_EXPORT void wordcatcher_matches_free(wordcatcher_matches* matches);
 
 /* ---- Explanations ---------------------------------------------------------------------------- */
 
-/* Why a phrase is found in a text, or is not. */
+/** Why a phrase is found in a text, or is not. */
 typedef struct wordcatcher_explanation wordcatcher_explanation;
 
-/* Why a value (a data string) has its cost for a text, or why wordcatcher_index_find() does not
+/** Why a value (a data string) has its cost for a text, or why wordcatcher_index_find() does not
    list it with these options, which may be NULL. Linear in the values of the index. Fails as
    wordcatcher_index_find() does. */
 WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_explain(
@@ -320,54 +325,56 @@ WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_explain(
     size_t value_length, const wordcatcher_find_options* options,
     wordcatcher_explanation** explanation, wordcatcher_error* error);
 
-/* The same for the distance of wordcatcher_index_query(), step by step. */
+/** The same for the distance of wordcatcher_index_query(), step by step. */
 WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_explain_query(
     const wordcatcher_index* index, const char* text, size_t text_length, const char* value,
     size_t value_length, wordcatcher_explanation** explanation, wordcatcher_error* error);
 
-/* One JSON object on one line. `length`, which may be NULL, takes its bytes. */
+/** One JSON object on one line. `length`, which may be NULL, takes its bytes. */
 WORDCATCHER_EXPORT const char* wordcatcher_explanation_json(
     const wordcatcher_explanation* explanation, size_t* length);
 
-/* Several lines for people, each ended by a line feed. `length` as above. */
+/** Several lines for people, each ended by a line feed. `length` as above. */
 WORDCATCHER_EXPORT const char* wordcatcher_explanation_text(
     const wordcatcher_explanation* explanation, size_t* length);
 
-/* Whether the index holds the value. */
+/** Whether the index holds the value. */
 WORDCATCHER_EXPORT bool wordcatcher_explanation_is_stored(
     const wordcatcher_explanation* explanation);
 
-/* Whether the explained call lists the value (limit and overlaps aside). */
+/** Whether the explained call lists the value (limit and overlaps aside). */
 WORDCATCHER_EXPORT bool wordcatcher_explanation_is_found(
     const wordcatcher_explanation* explanation);
 
-/* Gives the explanation back. */
+/** Gives the explanation back. */
 WORDCATCHER_EXPORT void wordcatcher_explanation_free(wordcatcher_explanation* explanation);
 
 /* ---- Building -------------------------------------------------------------------------------- */
 
-/* Builds an index of phrases. Its memory: the distinct words, 8 bytes for each phrase under a word,
-   the distinct data strings; in wordcatcher_builder_commit() about twice the image beside them. */
+/** Builds an index of phrases. Its memory: the distinct words, 8 bytes for each phrase under a
+   word, the distinct data strings; in wordcatcher_builder_commit() about twice the image beside
+   them. */
 typedef struct wordcatcher_builder wordcatcher_builder;
 
+/** What a builder makes beside the index file, and in which mode. */
 typedef struct wordcatcher_builder_options {
-  size_t size;        /* set by wordcatcher_builder_options_init() */
-  int32_t mode;       /* WORDCATCHER_MODE_...; words */
-  const char* tables; /* where to write the files of a classic index as well: a prefix of their
+  size_t size;        /**< set by wordcatcher_builder_options_init() */
+  int32_t mode;       /**< WORDCATCHER_MODE_...; words */
+  const char* tables; /**< where to write the files of a classic index as well: a prefix of their
                          names, such as a directory with its trailing "/"; NULL: nowhere */
 } wordcatcher_builder_options;
 
-/* Fills the options with the defaults named above. `size` is sizeof *options. NULL does nothing. */
+/** Fills the options with the defaults named above. `size`: sizeof *options. NULL does nothing. */
 WORDCATCHER_EXPORT void wordcatcher_builder_options_init(wordcatcher_builder_options* options,
                                                          size_t size);
 
-/* A builder that will write to `path`, of which it keeps a copy. No file is touched yet. `options`
+/** A builder that will write to `path`, of which it keeps a copy. No file is touched yet. `options`
    may be NULL. Fails with BAD_INPUT for a mode that does not exist. */
 WORDCATCHER_EXPORT wordcatcher_code
 wordcatcher_builder_create(const char* path, const wordcatcher_builder_options* options,
                            wordcatcher_builder** builder, wordcatcher_error* error);
 
-/* Adds one phrase with its data string. A `data` of NULL with the length 0 or WORDCATCHER_NUL is
+/** Adds one phrase with its data string. A `data` of NULL with the length 0 or WORDCATCHER_NUL is
    none: such a phrase's words are found by wordcatcher_index_search(), and the phrase by nothing. A
    data string that begins with the phrase, and puts any further fields after "{ ", lets queries
    judge the phrase's length. The same phrase and data added again change nothing but the count.
@@ -382,13 +389,13 @@ WORDCATCHER_EXPORT wordcatcher_code wordcatcher_builder_add(wordcatcher_builder*
                                                             size_t data_length,
                                                             wordcatcher_error* error);
 
-/* Phrases added so far, each time that one was added. */
+/** Phrases added so far, each time that one was added. */
 WORDCATCHER_EXPORT uint64_t wordcatcher_builder_phrase_count(const wordcatcher_builder* builder);
 
-/* Distinct stored words (whole texts, codes) so far. */
+/** Distinct stored words (whole texts, codes) so far. */
 WORDCATCHER_EXPORT uint64_t wordcatcher_builder_word_count(const wordcatcher_builder* builder);
 
-/* Writes the index in one step: who opens the path sees the old index or the new one, whole,
+/** Writes the index in one step: who opens the path sees the old index or the new one, whole,
    whatever happens meanwhile. The builder is empty afterwards and may be used again. `bytes`, which
    may be NULL, takes the size of the file. n log n in what was added.
 
@@ -399,16 +406,16 @@ WORDCATCHER_EXPORT wordcatcher_code wordcatcher_builder_commit(wordcatcher_build
                                                                uint64_t* bytes,
                                                                wordcatcher_error* error);
 
-/* Gives the builder back. What was not committed is dropped. */
+/** Gives the builder back. What was not committed is dropped. */
 WORDCATCHER_EXPORT void wordcatcher_builder_free(wordcatcher_builder* builder);
 
 /* ---- The log --------------------------------------------------------------------------------- */
 
-/* Takes one line without its line feed, valid during the call. It is called on whatever thread the
+/** Takes one line without its line feed, valid during the call. It is called on whatever thread the
    library runs on, on several at once, and must return; it must not throw. */
 typedef void (*wordcatcher_log_handler)(void* context, const char* line, size_t length);
 
-/* Sends the lines that the library logs to `handler`, for the whole process: the tables of classic
+/** Sends the lines that the library logs to `handler`, for the whole process: the tables of classic
    indexes log what they cannot do. NULL sends them where they go at the start: to the system log.
    Any thread may call this at any time; a handler that was replaced may still be called by those
    calls that are under way, and its context must outlive them. */

@@ -133,6 +133,7 @@ class WORDCATCHER_EXPORT LXFuzzyIndex {
   std::shared_ptr<const SearchImage> _image;
 };
 
+/// Writes the description as UTF-8.
 WORDCATCHER_EXPORT std::ostream& operator<<(std::ostream& stream, const LXFuzzyIndex& index);
 
 }  // namespace wordcatcher

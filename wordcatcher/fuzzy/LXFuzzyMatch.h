@@ -40,6 +40,7 @@ class WORDCATCHER_EXPORT LXFuzzyMatch {
   std::u16string _LXvalue;
 };
 
+/// Writes the description as UTF-8.
 WORDCATCHER_EXPORT std::ostream& operator<<(std::ostream& stream, const LXFuzzyMatch& match);
 
 }  // namespace wordcatcher

@@ -17,14 +17,20 @@ namespace wordcatcher {
 /// free for concurrent reading.
 class WORDCATCHER_EXPORT LXIntTuple {
  public:
+  /// The label (index, distance); any two numbers are taken.
   LXIntTuple(std::int64_t index, std::int64_t distance) noexcept
       : _LXindex(index), _LXdistance(distance) {}
 
+  /// Code units of the word that are accounted for.
   std::int64_t index() const noexcept { return _LXindex; }
+
+  /// Edits made so far.
   std::int64_t distance() const noexcept { return _LXdistance; }
 
-  /// Whether both numbers are equal; never true for an object of an unrelated class.
+  /// Whether both numbers are equal.
   bool isEqual(const LXIntTuple& other) const noexcept { return *this == other; }
+
+  /// An object of an unrelated class is never equal.
   template <typename Other>
   requires(!std::derived_from<Other, LXIntTuple>) bool isEqual(
       const Other& /*other*/) const noexcept {
@@ -50,12 +56,15 @@ class WORDCATCHER_EXPORT LXIntTuple {
   std::int64_t _LXdistance;
 };
 
+/// Writes the description as UTF-8.
 WORDCATCHER_EXPORT std::ostream& operator<<(std::ostream& stream, const LXIntTuple& tuple);
 
 }  // namespace wordcatcher
 
+/// Lets labels be keys of unordered containers.
 template <>
 struct std::hash<wordcatcher::LXIntTuple> {
+  /// The object's own hash().
   std::size_t operator()(const wordcatcher::LXIntTuple& tuple) const noexcept {
     return tuple.hash();
   }

@@ -34,10 +34,9 @@ class LXNFA {
   LXNFA& operator=(const LXNFA&) = delete;
 
   /// Takes over the states; `other` is left without any.
-  LXNFA(LXNFA&& other)
-  noexcept
-      : _LXstates(std::move(other._LXstates)), _LXstart(std::exchange(other._LXstart, nullptr)) {
-    other._LXstates.clear();
+  LXNFA(LXNFA&& other) noexcept {
+    _LXstates.swap(other._LXstates);
+    std::swap(_LXstart, other._LXstart);
   }
 
   /// The start state's name; nothing before setStartState().
@@ -137,6 +136,7 @@ class LXNFA {
   LXNFAState<Name>* _LXstart = nullptr;
 };
 
+/// Writes the description as UTF-8.
 template <typename Name>
 std::ostream& operator<<(std::ostream& stream, const LXNFA<Name>& automaton) {
   return writeUtf8(stream, automaton.description());

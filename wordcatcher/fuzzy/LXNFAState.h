@@ -57,7 +57,10 @@ class LXNFAState {
     return edge == _LXinternalEdges.end() ? none : edge->second;
   }
 
+  /// Whether the automaton accepts what leads here.
   bool final() const noexcept { return _final; }
+
+  /// Sets or takes away the final mark.
   void setFinal(bool value) noexcept { _final = value; }
 
   /// The name's text form, in angle brackets when the state is final.
@@ -71,6 +74,7 @@ class LXNFAState {
   bool _final = false;
 };
 
+/// Writes the description as UTF-8.
 template <typename Name>
 std::ostream& operator<<(std::ostream& stream, const LXNFAState<Name>& state) {
   return writeUtf8(stream, state.description());

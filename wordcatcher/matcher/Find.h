@@ -16,6 +16,7 @@ namespace wordcatcher {
 /// as any other. Words that hold a digit are only found exactly, as stored words that do; whole
 /// texts are no words. A limit above kMaxEdits is an error (badInput).
 struct EditLimits {
+  /// The greatest limit that there may be, in edits.
   static constexpr std::uint32_t kMaxEdits = 3;
 
   std::size_t shortLength = 2;    ///< a word of up to so many code units is short
@@ -25,6 +26,7 @@ struct EditLimits {
   std::uint32_t longEdits = 2;    ///< of a long one
   std::uint32_t wholeTextEdits = 3;  ///< of a whole text, in an index of whole texts
 
+  /// Whether all members are equal.
   friend bool operator==(const EditLimits&, const EditLimits&) = default;
 };
 
@@ -40,9 +42,9 @@ struct FindOptions {
   std::size_t limit = 10;                ///< matches at the most: the first ones of all
   std::optional<std::uint64_t> maxCost;  ///< the greatest cost of a match; none: any cost
   std::size_t minWords = 1;              ///< words of a phrase that the text must hold; at least 1
-  EditLimits edits;
-  bool transpositions = true;  ///< whether two neighbours swapped are one edit, not two
-  Overlaps overlaps = Overlaps::all;
+  EditLimits edits;                      ///< how far a word may be from a stored one
+  bool transpositions = true;            ///< whether two neighbours swapped are one edit, not two
+  Overlaps overlaps = Overlaps::all;     ///< which matches whose ranges overlap are listed
 
   /// How many postings (phrases under a word) are looked at, all words together; what lies beyond
   /// is not found, and the result says so.
@@ -56,17 +58,19 @@ struct FoundWord {
   std::string word;     ///< as stored; two words that the text joins stand with a space between
   std::uint32_t edits;  ///< between the two
 
+  /// Whether all members are equal.
   friend bool operator==(const FoundWord&, const FoundWord&) = default;
 };
 
 /// A phrase found in a text.
 struct FoundPhrase {
-  std::string value;   ///< its data string
-  std::uint64_t cost;  ///< see Index::find
-  std::size_t begin;   ///< the range of the text that spans the hits, in bytes
-  std::size_t end;
+  std::string value;            ///< its data string
+  std::uint64_t cost;           ///< see Index::find
+  std::size_t begin;            ///< the range of the text that spans the hits, in bytes
+  std::size_t end;              ///< the byte behind the last hit
   std::vector<FoundWord> hits;  ///< in the order of the text
 
+  /// Whether all members are equal.
   friend bool operator==(const FoundPhrase&, const FoundPhrase&) = default;
 };
 
@@ -75,6 +79,7 @@ struct FindResult {
   std::vector<FoundPhrase> matches;  ///< the best one first
   bool truncated = false;            ///< whether a budget cut something off
 
+  /// Whether all members are equal.
   friend bool operator==(const FindResult&, const FindResult&) = default;
 };
 
@@ -89,8 +94,8 @@ struct WORDCATCHER_EXPORT FindExplanation {
 
   /// A word of the text.
   struct TextWord {
-    std::size_t begin;  ///< in the text, in bytes
-    std::size_t end;
+    std::size_t begin;                    ///< in the text, in bytes
+    std::size_t end;                      ///< the byte behind its last one
     std::string word;                     ///< as it is looked up, or as it is if it is too long
     std::uint32_t limit;                  ///< edits that it may have
     std::vector<Comparison> comparisons;  ///< with each word of the phrase, in its order; none
@@ -121,6 +126,7 @@ struct WORDCATCHER_EXPORT FindExplanation {
 
 /// How the score of Index::query comes about for one value, step by step.
 struct WORDCATCHER_EXPORT QueryExplanation {
+  /// What was looked at, one thing after the other.
   struct Step {
     std::string sentence;   ///< what was looked at, and what came of it
     std::int64_t distance;  ///< the value's distance after it

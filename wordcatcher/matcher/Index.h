@@ -36,22 +36,27 @@ namespace wordcatcher {
 /// more; what it finds are the words within the edit limits.
 class WORDCATCHER_EXPORT Index {
  public:
+  /// How an index file gets into memory.
   enum class Load {
     map,   ///< map the file: opens in constant time, whatever its size
     copy,  ///< copy it into memory: for files on storage that may shrink while they are read
   };
 
+  /// How an index is opened, and the budgets of its queries.
   struct Options {
-    Load load = Load::map;
+    Load load = Load::map;             ///< how the file gets into memory
     std::size_t maxQueryWords = 4096;  ///< words of a text that are looked at
     std::size_t maxWordUnits = 1024;   ///< code units of a word (or whole text) that is looked up
   };
 
   /// Opens a search image (a file), or a classic index (a directory, or a prefix of its files'
   /// names), of which an image is built in memory; its tables are locked only while they are read.
-  /// `mode` says how a classic index is to be queried, and is not looked at for an image, which
-  /// remembers. Throws Error: notFound, notReadable, notAnIndex, damaged.
+  /// A classic index is queried by words, unless a mode is given. Constant time for an image that
+  /// is mapped, linear in the size else. Throws Error: notFound, notReadable, notAnIndex, damaged.
   static Index open(const std::string& path);
+
+  /// The same with options. `mode` says how a classic index is to be queried, and is not looked at
+  /// for an image, which remembers.
   static Index open(const std::string& path, const Options& options,
                     MatchingMode mode = MatchingMode::words);
 
@@ -62,6 +67,7 @@ class WORDCATCHER_EXPORT Index {
     std::vector<std::string> data;  ///< in whole-text mode: the data strings; else empty
   };
 
+  /// What query() found.
   struct QueryResult {
     /// Whether any word of the text was found with data; always true in whole-text mode.
     bool found = false;
@@ -75,14 +81,15 @@ class WORDCATCHER_EXPORT Index {
 
   /// One stored word (or whole text, or code) near another.
   struct WordMatch {
-    std::string value;
-    std::int64_t distance;
+    std::string value;              ///< as stored: lower-cased, or a code
+    std::int64_t distance;          ///< edits between the two
     std::vector<std::string> data;  ///< ascending by UTF-16 code units
   };
 
+  /// What search() found.
   struct SearchResult {
-    std::vector<WordMatch> matches;
-    bool truncated = false;  ///< the word is longer than maxWordUnits and was not looked up
+    std::vector<WordMatch> matches;  ///< in the order of LXFuzzyIndex::search_withMaxDistance
+    bool truncated = false;          ///< the word is longer than maxWordUnits and was not looked up
   };
 
   /// As LXFuzzyIndex::search_withMaxDistance, in its order; strings with characters outside the
@@ -115,19 +122,24 @@ class WORDCATCHER_EXPORT Index {
   /// looked up, and a budget of postings bounds the time. Throws Error (badInput) for edit limits
   /// that are too large.
   FindResult find(std::string_view text) const;
+
+  /// The same with options: how many, how far, which of those that overlap.
   FindResult find(std::string_view text, const FindOptions& options) const;
 
   /// Why a value has its cost for a text, or why find() does not list it. Linear in the index's
   /// values. Throws as find() does.
   FindExplanation explain(std::string_view text, std::string_view value) const;
+
+  /// The same for what find() does with these options.
   FindExplanation explain(std::string_view text, std::string_view value,
                           const FindOptions& options) const;
 
   /// The same for the distance of query(), step by step.
   QueryExplanation explainQuery(std::string_view text, std::string_view value) const;
 
+  /// What an index holds.
   struct Info {
-    MatchingMode mode;
+    MatchingMode mode;       ///< how it was built and is queried
     std::uint64_t phrases;   ///< phrases added; 0 for a classic index, which does not count them
     std::uint64_t words;     ///< distinct stored words
     std::uint64_t values;    ///< distinct data strings
@@ -135,6 +147,8 @@ class WORDCATCHER_EXPORT Index {
     std::string generation;  ///< 32 hexadecimal digits, random for each build
     std::uint32_t version;   ///< of the format
   };
+
+  /// What the index holds. Constant time.
   Info info() const;
 
   /// Checks the whole image. Throws Error (damaged) that names what is wrong. Linear in its size.

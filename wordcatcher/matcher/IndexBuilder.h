@@ -34,8 +34,9 @@ enum class MatchingMode : std::uint32_t {
 /// only be assigned to or destroyed.
 class WORDCATCHER_EXPORT IndexBuilder {
  public:
+  /// What a builder makes beside the image, and in which mode.
   struct Options {
-    MatchingMode mode = MatchingMode::words;
+    MatchingMode mode = MatchingMode::words;  ///< the image remembers it
 
     /// Where to write the three table files of a classic index as well; a prefix of file names,
     /// such as a directory with its trailing "/". Nothing by default. They are written by commit(),
@@ -45,13 +46,19 @@ class WORDCATCHER_EXPORT IndexBuilder {
     std::optional<std::string> tables;
   };
 
-  /// A builder whose commit() will write to `path`. Nothing is touched yet. Throws Error (badInput)
-  /// for a mode that does not exist.
+  /// A builder whose commit() will write to `path`. Nothing is touched yet. Its mode is words.
   explicit IndexBuilder(std::string path);
+
+  /// The same with options. Throws Error (badInput) for a mode that does not exist.
   IndexBuilder(std::string path, Options options);
+
+  /// Drops what was not committed; no file is touched.
   ~IndexBuilder();
 
+  /// Takes over what was added.
   IndexBuilder(IndexBuilder&&) noexcept;
+
+  /// Takes over what was added; what this builder held is dropped.
   IndexBuilder& operator=(IndexBuilder&&) noexcept;
 
   /// Adds one phrase with its data string, or none: such a phrase's words are found by search(),

@@ -48,9 +48,14 @@ class WORDCATCHER_EXPORT KXWordcatcher {
   /// A matcher over the index at `path`, a directory given with its trailing "/". Nothing is opened
   /// yet, and neither argument is checked.
   KXWordcatcher(std::string path, std::uint64_t options);
+
+  /// Finishes a writing pass and gives back the locks.
   ~KXWordcatcher();
 
+  /// Takes over the index, open as it is.
   KXWordcatcher(KXWordcatcher&&) noexcept;
+
+  /// Takes over the index; the one that this matcher held is closed as by the destructor.
   KXWordcatcher& operator=(KXWordcatcher&&) noexcept;
 
   /// 0 closed, 1 reading (finishes the tables and opens them for queries), 2 writing (starts an
@@ -81,6 +86,7 @@ class WORDCATCHER_EXPORT KXWordcatcher {
   /// Words count as matched across queries: see wordsMatched().
   std::optional<QueryResult> query(std::u16string_view text);
 
+  /// How phrases are stored and found: 0, 1 or 2, or whatever else was set.
   std::uint64_t options() const noexcept { return _options; }
 
   /// Changes how the following calls index and query; nothing else.
@@ -90,6 +96,8 @@ class WORDCATCHER_EXPORT KXWordcatcher {
   /// text with fewer hits than counted words is penalised. Set it to 0 before a query to judge that
   /// query by itself.
   std::int64_t wordsMatched() const noexcept { return _wordsMatched; }
+
+  /// Sets the counter; any number is taken.
   void setWordsMatched(std::int64_t count) noexcept { _wordsMatched = count; }
 
  private:

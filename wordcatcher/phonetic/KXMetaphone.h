@@ -35,11 +35,13 @@ class WORDCATCHER_EXPORT KXMetaphone {
   /// Throws std::runtime_error if ICU's data, which holds them, is missing.
   KXMetaphone();
 
-  /// The same, with a copy of rules that are loaded already, at a tenth of the cost. Several threads
-  /// may make theirs from the same rules while nobody uses these.
+  /// The same, with a copy of rules that are loaded already, at a tenth of the cost. Several
+  /// threads may make theirs from the same rules while nobody uses these.
   explicit KXMetaphone(const WordSegmenter& rules);
 
+  /// Releases memory only.
   ~KXMetaphone();
+
   KXMetaphone(const KXMetaphone&) = delete;
   KXMetaphone& operator=(const KXMetaphone&) = delete;
 

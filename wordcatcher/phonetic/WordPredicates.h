@@ -45,11 +45,13 @@ constexpr bool ssa(std::u16string_view s, std::int64_t start, std::size_t length
   return _isOneOf(substring(s, start, length), list);
 }
 
+/// The same for a list that is written where it is asked for.
 constexpr bool _isOneOf(std::u16string_view s,
                         std::initializer_list<std::u16string_view> list) noexcept {
   return _isOneOf(s, StringList(list.begin(), list.size()));
 }
 
+/// The same for a list that is written where it is asked for.
 constexpr bool ssa(std::u16string_view s, std::int64_t start, std::size_t length,
                    std::initializer_list<std::u16string_view> list) noexcept {
   return ssa(s, start, length, StringList(list.begin(), list.size()));

@@ -31,10 +31,9 @@ class LXDFA {
   LXDFA& operator=(const LXDFA&) = delete;
 
   /// Takes over the states; `other` is left without any.
-  LXDFA(LXDFA&& other)
-  noexcept
-      : _LXstates(std::move(other._LXstates)), _LXstart(std::exchange(other._LXstart, nullptr)) {
-    other._LXstates.clear();
+  LXDFA(LXDFA&& other) noexcept {
+    _LXstates.swap(other._LXstates);
+    std::swap(_LXstart, other._LXstart);
   }
 
   /// The start state's name; nothing before setStartState().
@@ -108,6 +107,7 @@ class LXDFA {
   LXDFAState<Name>* _LXstart = nullptr;
 };
 
+/// Writes the description as UTF-8.
 template <typename Name>
 std::ostream& operator<<(std::ostream& stream, const LXDFA<Name>& automaton) {
   return writeUtf8(stream, automaton.description());

@@ -44,7 +44,10 @@ class LXDFAState {
     return symbols;
   }
 
+  /// Whether the automaton accepts what leads here.
   bool final() const noexcept { return _final; }
+
+  /// Sets or takes away the final mark.
   void setFinal(bool value) noexcept { _final = value; }
 
   /// The name's text form, in angle brackets when the state is final.
@@ -58,6 +61,7 @@ class LXDFAState {
   bool _final = false;
 };
 
+/// Writes the description as UTF-8.
 template <typename Name>
 std::ostream& operator<<(std::ostream& stream, const LXDFAState<Name>& state) {
   return writeUtf8(stream, state.description());

@@ -74,11 +74,15 @@ class WORDCATCHER_EXPORT PLXDFA {
 
   /// The start state's name, "" unless replaced.
   const std::u16string& startState() const noexcept;
+
+  /// Replaces the start state's name; the tables do not hold it.
   void setStartState(std::u16string_view state);
 
-  /// The path given at construction. Replacing it changes this string only: the tables keep the
-  /// paths that they were made with.
+  /// The path given at construction, or set since.
   const std::string& path() const noexcept;
+
+  /// Replaces the string that path() returns, and nothing else: the tables keep the paths that they
+  /// were made with.
   void setPath(std::string path);
 
   /// The class name and the object's address.
@@ -94,6 +98,7 @@ class WORDCATCHER_EXPORT PLXDFA {
   std::string _path;
 };
 
+/// Writes the description as UTF-8.
 WORDCATCHER_EXPORT std::ostream& operator<<(std::ostream& stream, const PLXDFA& automaton);
 
 }  // namespace wordcatcher

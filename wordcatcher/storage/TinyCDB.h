@@ -71,8 +71,10 @@ class WORDCATCHER_EXPORT TinyCDB {
   /// in the number of records of the key; the key is compared up to its first U+0000.
   std::set<std::u16string> valuesFor(std::u16string_view key);
 
-  /// The file's path. A new path takes effect at the next setMode() that opens the file.
+  /// The file's path.
   const std::string& path() const noexcept;
+
+  /// Takes effect at the next setMode() that opens the file.
   void setPath(std::string path);
 
  private:

@@ -11,19 +11,21 @@
 
 namespace wordcatcher {
 
-/// The text form of a value inside descriptions: a string is itself
-/// (U+FFFD for bytes that are not UTF-8), an integer is written in
-/// decimal, and an object gives its own description(). Other types need an overload beside them.
+/// The text form of a value inside descriptions: a string is itself. Types without a form here need
+/// an overload beside them.
 inline std::u16string textForm(std::u16string_view text) { return std::u16string(text); }
 
+/// Bytes that are not UTF-8 appear as U+FFFD.
 WORDCATCHER_EXPORT std::u16string textForm(std::string_view utf8);
 
+/// An integer in decimal.
 template <std::integral Integer>
 std::u16string textForm(Integer number) {
   const std::string digits = std::to_string(number);
   return {digits.begin(), digits.end()};
 }
 
+/// An object's own description().
 template <typename Object>
 requires requires(const Object& object) {
   { object.description() } -> std::convertible_to<std::u16string>;
