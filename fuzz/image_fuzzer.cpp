@@ -1,5 +1,5 @@
-// Searches an image of any bytes: an Error or an answer, within time and memory that are linear in
-// the image. An input is
+// Searches an image of any bytes, and finds phrases in it: an Error or an answer, within time and
+// memory that are linear in the image. An input is
 //
 //     one byte: bit 0 says whether the checksums are made right, bit 1 whether verify() comes first
 //     one byte: the distance, modulo 8
@@ -16,6 +16,7 @@
 #include <string>
 
 #include "ForgedImage.h"
+#include "HostileFind.h"
 #include "wordcatcher/Error.h"
 #include "wordcatcher/fuzzy/ImageSearch.h"
 #include "wordcatcher/storage/SearchImage.h"
@@ -47,6 +48,7 @@ void ask(const SearchImage& image, std::u16string_view query, std::int64_t dista
     values += hit.values;
   }
   require(values <= image.postingCount());
+  require(wordcatcher::testing::findsWithinBounds(image, query, distance));
 }
 
 /// A whole image answers: nothing is found out about it later.

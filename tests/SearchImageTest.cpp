@@ -15,10 +15,12 @@
 #include <set>
 
 #include "ForgedImage.h"
+#include "HostileFind.h"
 #include "SampleImages.h"
 #include "TestSupport.h"
 #include "wordcatcher/Error.h"
 #include "wordcatcher/fuzzy/ImageSearch.h"
+#include "wordcatcher/fuzzy/NearWords.h"
 #include "wordcatcher/storage/LeafTails.h"
 #include "wordcatcher/storage/SearchImageWriter.h"
 
@@ -89,6 +91,7 @@ void ask(const SearchImage& image, std::u16string_view query, std::int64_t dista
     }
   }
   ASSERT_LE(values, image.postingCount());
+  ASSERT_TRUE(testing::findsWithinBounds(image, query, distance));
 }
 
 /// What became of an image whose bytes were altered: an Error that says so, or answers.
@@ -301,9 +304,9 @@ std::map<SectionKind, std::size_t> unseenFlips(const ImageBytes& good) {
 }
 
 TEST(DamagedImageTest, OnlyContentNeedsItsChecksum) {
-  // Another letter or number of words, or a border between two data strings elsewhere, makes another
-  // image that is as good. What has one right value, given the rest, is checked against it; so are
-  // words whose letters all stand in the trees, as they do here.
+  // Another letter or number of words, or a border between two data strings elsewhere, makes
+  // another image that is as good. What has one right value, given the rest, is checked against it;
+  // so are words whose letters all stand in the trees, as they do here.
   const std::set<SectionKind> content = {SectionKind::labels, SectionKind::valueOffsets,
                                          SectionKind::valueText, SectionKind::countedWords};
   const ImageBytes bytes = testing::riverImage();
@@ -491,6 +494,30 @@ TEST(HostileImageTest, TailsThatShareMoreThanThereIs) {
   image.set(SectionKind::forwardTree, slots);
   EXPECT_FALSE(examine(image.bytes(), u"***", 3).answered);
   EXPECT_EQ(openOrVerifyError(image.bytes()), ErrorCode::damaged);
+}
+
+TEST(HostileImageTest, OneWordAtEveryPlaceOfALeaf) {
+  // Every head with every tail: the square of the image's size, if all were tried.
+  SearchImageWriter writer(0);
+  writer.addPosting(u"rhine", writer.addValue("x", 1));
+  for (std::uint32_t i = 0; i < kBroad; ++i) {
+    writer.addPosting(std::u16string(1, static_cast<char16_t>(0x4E00 + i)),
+                      writer.addValue("x", 1));
+  }
+  ForgedImage image(std::move(writer).finish());
+  const std::vector<std::uint32_t> order(kBroad + 1, 0U);
+  image.set(SectionKind::forwardOrder, order);
+  image.set(SectionKind::backwardOrder, order);
+  for (const auto kind : {SectionKind::forwardTree, SectionKind::backwardTree}) {
+    auto slots = image.get<TreeSlot>(kind);
+    for (std::size_t i = 1; i < slots.size(); ++i) {
+      slots[i].children = kBroad + 1;
+      slots[i].target = TreeSlot::kLeaf | (slots[i].target & TreeSlot::kLastChild);
+    }
+    image.set(kind, slots);
+  }
+  const auto opened = SearchImage::fromBytes(image.bytes());
+  EXPECT_LE(wordsJoinedIn(*opened, u"rhinerhine").size(), 64U);
 }
 
 TEST(HostileImageTest, AllPostingsInEveryList) {

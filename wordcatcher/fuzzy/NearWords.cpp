@@ -163,10 +163,13 @@ std::optional<std::uint32_t> exactWord(const SearchImage& image, std::u16string_
 std::vector<std::pair<std::uint32_t, std::uint32_t>> wordsJoinedIn(const SearchImage& image,
                                                                    std::u16string_view word) {
   auto labels = labelsOf(image, word);
-  std::vector<std::pair<std::size_t, std::uint32_t>> heads;
+  // By length: each length has one word at the most, and a damaged image may tell of many.
+  constexpr std::uint32_t kNone = UINT32_MAX;
+  std::vector<std::uint32_t> heads;
   forEachWordAlong(image, false, labels, [&](std::uint32_t other, std::size_t length) {
     if (length > 0 && length < labels.size()) {
-      heads.emplace_back(length, other);
+      heads.resize(labels.size(), kNone);
+      heads[length] = other;
     }
   });
   std::vector<std::pair<std::uint32_t, std::uint32_t>> joined;
@@ -175,10 +178,9 @@ std::vector<std::pair<std::uint32_t, std::uint32_t>> wordsJoinedIn(const SearchI
   }
   std::reverse(labels.begin(), labels.end());
   forEachWordAlong(image, true, labels, [&](std::uint32_t other, std::size_t length) {
-    for (const auto& [headLength, head] : heads) {
-      if (headLength + length == labels.size() && joined.size() < kMaxJoined) {
-        joined.emplace_back(head, other);
-      }
+    const std::size_t headLength = labels.size() - length;
+    if (length > 0 && headLength > 0 && heads[headLength] != kNone && joined.size() < kMaxJoined) {
+      joined.emplace_back(heads[headLength], other);
     }
   });
   return joined;

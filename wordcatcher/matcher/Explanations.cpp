@@ -114,7 +114,9 @@ std::string FindExplanation::toText() const {
   if (isStored) {
     lines += "Phrase: " + listed(phrase) + '\n';
     for (const auto& word : words) {
-      lines += "  " + word.word + ", up to " + counted(word.limit, "edit") + ':';
+      const bool isLookedUp = phrase.empty() || !word.comparisons.empty();
+      lines += "  " + word.word +
+               (isLookedUp ? ", up to " + counted(word.limit, "edit") + ':' : ", not looked up");
       for (const auto& each : word.comparisons) {
         lines += ' ' + each.word + ' ' + std::to_string(each.edits) +
                  (each.within ? " (near)" : "") + (&each == &word.comparisons.back() ? "" : ",");

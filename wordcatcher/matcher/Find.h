@@ -13,8 +13,8 @@ namespace wordcatcher {
 
 /// How many edits a word of the text may be away from a stored word, by its length in UTF-16 code
 /// units when lower-cased. An edit is one code unit replaced, inserted or left out, the first one
-/// as any other. Words that hold a digit are only found exactly, as stored words that do. A limit
-/// above kMaxEdits is an error (badInput).
+/// as any other. Words that hold a digit are only found exactly, as stored words that do; whole
+/// texts are no words. A limit above kMaxEdits is an error (badInput).
 struct EditLimits {
   static constexpr std::uint32_t kMaxEdits = 3;
 
@@ -91,9 +91,10 @@ struct WORDCATCHER_EXPORT FindExplanation {
   struct TextWord {
     std::size_t begin;  ///< in the text, in bytes
     std::size_t end;
-    std::string word;                     ///< as it is looked up
+    std::string word;                     ///< as it is looked up, or as it is if it is too long
     std::uint32_t limit;                  ///< edits that it may have
-    std::vector<Comparison> comparisons;  ///< with each word of the phrase, in its order
+    std::vector<Comparison> comparisons;  ///< with each word of the phrase, in its order; none
+                                          ///< if the word is too long
   };
 
   std::string text;   ///< the host's

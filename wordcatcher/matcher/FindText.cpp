@@ -51,10 +51,10 @@ FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& l
                        std::uint32_t limit) {
     const bool isLookedUp = word.size() <= maxWordUnits;
     truncated = truncated || !isLookedUp;
-    words.push_back(
-        {isLookedUp ? std::move(word) : std::u16string(), begin, end, limit, isLookedUp});
+    words.push_back({std::move(word), begin, end, limit, isLookedUp});
   };
   if (mode == MatchingMode::wholeText) {
+    hasNumbers = false;
     if (!units.empty()) {
       add(units.size() <= maxWordUnits ? toLower(units) : units, 0, text.size(),
           limits.wholeTextEdits);

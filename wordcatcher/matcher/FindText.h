@@ -15,7 +15,7 @@ namespace wordcatcher {
 
 /// A word of a text in which phrases are looked for.
 struct FindWord {
-  std::u16string word;  // as it is looked up: lower-cased, or a code, lower-cased
+  std::u16string word;  // as it is looked up: lower-cased, or a code, lower-cased; else as it is
   std::size_t begin;    // in the text, in bytes
   std::size_t end;
   std::uint32_t limit;  // edits
@@ -26,6 +26,9 @@ struct FindWord {
 struct FindText {
   std::vector<FindWord> words;
   bool truncated = false;  // whether a budget cut words off, or left one out
+
+  // Whether words that hold a digit are only found exactly. A whole text is more than a number.
+  bool hasNumbers = true;
 
   /// Budgets as in Index::Options. Linear in the text.
   FindText(std::string_view text, MatchingMode mode, const EditLimits& limits, WordSegmenter& words,

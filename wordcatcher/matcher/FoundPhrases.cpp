@@ -4,6 +4,7 @@
 #include <iterator>
 #include <limits>
 #include <map>
+#include <numeric>
 #include <set>
 #include <utility>
 
@@ -74,33 +75,47 @@ std::set<Range> rangesWithoutSubranges(const std::vector<FoundPhrase>& matches) 
   return kept;
 }
 
-/// The longest range, the longest that does not overlap it, and so on; of equally long ones the one
-/// of the first match.
-std::set<Range> longestRanges(const std::vector<FoundPhrase>& matches) {
-  std::vector<Range> ranges;
-  for (const auto& match : matches) {
-    ranges.push_back(rangeOf(match));
-  }
-  std::stable_sort(ranges.begin(), ranges.end(), [](const Range& a, const Range& b) {
-    return a.second - a.first > b.second - b.first;
-  });
+void keepLargerRanges(std::vector<FoundPhrase>& matches) {
+  const auto kept = rangesWithoutSubranges(matches);
+  std::erase_if(matches,
+                [&kept](const FoundPhrase& match) { return !kept.contains(rangeOf(match)); });
+}
+
+/// The longest match, the longest that does not overlap it, and so on; of equally long ones the
+/// first.
+void keepLongest(std::vector<FoundPhrase>& matches) {
+  std::vector<std::size_t> order(matches.size());
+  std::iota(order.begin(), order.end(), std::size_t{0});
+  const auto lengthOf = [&matches](std::size_t i) { return matches[i].end - matches[i].begin; };
+  std::stable_sort(order.begin(), order.end(),
+                   [lengthOf](std::size_t a, std::size_t b) { return lengthOf(a) > lengthOf(b); });
   std::set<Range> kept;
-  for (const Range& range : ranges) {
+  std::vector<std::size_t> places;
+  for (const std::size_t i : order) {
+    const Range range = rangeOf(matches[i]);
     const auto next = kept.lower_bound({range.first, 0});
     const bool meetsNext = next != kept.end() && next->first < range.second;
     const bool meetsPrevious = next != kept.begin() && std::prev(next)->second > range.first;
     if (!meetsNext && !meetsPrevious) {
       kept.insert(range);
+      places.push_back(i);
     }
   }
-  return kept;
+  std::sort(places.begin(), places.end());
+  std::vector<FoundPhrase> longest;
+  longest.reserve(places.size());
+  for (const std::size_t place : places) {
+    longest.push_back(std::move(matches[place]));
+  }
+  matches = std::move(longest);
 }
 
 void leaveOutOverlaps(std::vector<FoundPhrase>& matches, Overlaps overlaps) {
-  const auto kept =
-      overlaps == Overlaps::noSub ? rangesWithoutSubranges(matches) : longestRanges(matches);
-  std::erase_if(matches,
-                [&kept](const FoundPhrase& match) { return !kept.contains(rangeOf(match)); });
+  if (overlaps == Overlaps::noSub) {
+    keepLargerRanges(matches);
+  } else {
+    keepLongest(matches);
+  }
 }
 
 std::vector<FindExplanation::TextWord> comparedWords(const SearchImage& image, const FindText& text,
@@ -113,11 +128,14 @@ std::vector<FindExplanation::TextWord> comparedWords(const SearchImage& image, c
     compared.end = word.end;
     compared.word = displayUtf8(word.word);
     compared.limit = word.limit;
+    if (!word.isLookedUp) {
+      continue;
+    }
     for (const std::uint32_t flagged : phrase.phrase) {
       const std::u16string other = image.textOf(flagged & ~image::kPhraseEnd);
       const std::uint64_t edits = editDistance(word.word, other, transpositions);
-      const bool within = word.isLookedUp && edits <= word.limit &&
-                          (edits == 0 || !(holdsDigit(word.word) || holdsDigit(other)));
+      const bool isNumber = text.hasNumbers && (holdsDigit(word.word) || holdsDigit(other));
+      const bool within = edits <= word.limit && (edits == 0 || !isNumber);
       compared.comparisons.push_back({displayUtf8(other), edits, within});
     }
   }

@@ -288,6 +288,13 @@ QueryExplanation Index::explainQuery(std::string_view text, std::string_view val
       }
     }
     explanation.isStored = explanation.isFound || valueNumber(image, value).has_value();
+    if (explanation.isStored && !explanation.isFound) {
+      explanation.steps.push_back(
+          {result.truncated ? "The text is not looked up: it is too long."
+                            : "No stored text that carries the value is within " +
+                                  std::to_string(kWholeTextDistance) + " edits of this one.",
+           0});
+    }
     return explanation;
   }
   const auto number = valueNumber(image, value);

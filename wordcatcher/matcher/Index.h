@@ -104,7 +104,8 @@ class WORDCATCHER_EXPORT Index {
   /// and in the text); then the rarer paired words (fewer phrases under them in all); then the
   /// shorter phrase (words, then code units); then the value by UTF-16 code units. Of several
   /// best pairings the one with the fewest breaks counts, then the one that takes the text's
-  /// words earliest. A value that was stored with several phrases is found once, by the best.
+  /// words earliest, then the phrase's. A value that was stored with several phrases is found once,
+  /// by the best.
   ///
   /// In an index of phonetic codes the codes are compared exactly; in one of whole texts the text
   /// is one word, and so is each phrase.

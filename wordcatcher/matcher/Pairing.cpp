@@ -171,15 +171,27 @@ void Pairing::tryAll(std::uint64_t& steps) {
   tryFrom(0, steps);
 }
 
-/// Whether the pairs in hand take later words of the text than the best ones, as far as they go.
-bool Pairing::isLater() const {
-  const std::size_t common = std::min(_current.size(), _best.size());
-  for (std::size_t i = 0; i < common; ++i) {
-    if (_current[i].option.position != _best[i].option.position) {
-      return _current[i].option.position > _best[i].option.position;
-    }
-  }
-  return _current.size() > _best.size();
+namespace {
+
+/// Whether pairs come before others by some position of each; fewer come before the same and more.
+template <typename PositionOf>
+bool comesFirst(const std::vector<Pair>& pairs, const std::vector<Pair>& others,
+                PositionOf positionOf) {
+  return std::lexicographical_compare(
+      pairs.begin(), pairs.end(), others.begin(), others.end(),
+      [positionOf](const Pair& a, const Pair& b) { return positionOf(a) < positionOf(b); });
+}
+
+std::uint32_t inText(const Pair& pair) { return pair.option.position; }
+std::uint32_t inPhrase(const Pair& pair) { return pair.phrasePosition; }
+
+}  // namespace
+
+bool Pairing::isLater() const { return comesFirst(_best, _current, inText); }
+
+bool Pairing::isEarlier() const {
+  return comesFirst(_current, _best, inText) ||
+         (!isLater() && comesFirst(_current, _best, inPhrase));
 }
 
 bool Pairing::isFree(const PairOption& option) const {
@@ -201,7 +213,7 @@ void Pairing::tryFrom(std::size_t word, std::uint64_t& steps) {
   --steps;
   if (word == _words.size()) {
     if (quality(_currentScore) > quality(_bestScore) ||
-        (quality(_currentScore) == quality(_bestScore) && !isLater())) {
+        (quality(_currentScore) == quality(_bestScore) && isEarlier())) {
       _best = _current;
       _bestScore = _currentScore;
     }

@@ -7,7 +7,8 @@
 // phrase is paired with both, and a word of the phrase that joins two of the text as well. A pair
 // takes its words out of those that cost 2 each, and costs its edits: so its gain is 2 a word less
 // its edits. The best pairing has the greatest gain, then the most words of the phrase, then the
-// most of these without edits, then the fewest breaks, then the earliest words of the text.
+// most of these without edits, then the fewest breaks, then the earliest words of the text, then of
+// the phrase.
 //
 // Mostly every word of the phrase can take what is best for it without being in another's way;
 // fewest breaks are then found word by word from the end (dynamic programming). Where two words
@@ -84,7 +85,8 @@ class Pairing {
   void tryAll(std::uint64_t& steps);
   void tryFrom(std::size_t word, std::uint64_t& steps);
   void tryOption(std::size_t word, const PairOption& option, std::uint64_t& steps);
-  bool isLater() const;
+  bool isLater() const;  // whether the pairing in hand takes later words of the text than the best
+  bool isEarlier() const;  // earlier ones, or the same, and earlier ones of the phrase
   bool isFree(const PairOption& option) const;
   void use(const PairOption& option, bool isUsed);
   bool follows(const Pair& last, std::uint32_t phrasePosition, const PairOption& option) const;

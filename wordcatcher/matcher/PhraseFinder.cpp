@@ -56,7 +56,7 @@ void PhraseFinder::lookUpWords() {
     const auto [place, isNew] = known.try_emplace(word.word);
     if (isNew) {
       place->second = nearWords(_image, word.word, word.limit, _options.transpositions);
-      if (!holdsDigit(word.word)) {
+      if (_text.hasNumbers && !holdsDigit(word.word)) {
         std::erase_if(place->second, [this](const NearWord& near) {
           return near.edits > 0 && holdsDigit(_image.textOf(near.word));
         });
@@ -84,7 +84,11 @@ void PhraseFinder::lookUpJoins() {
 
 void PhraseFinder::lookUpSplits() {
   for (std::uint32_t position = 0; position < _text.words.size(); ++position) {
-    for (const auto& [head, tail] : wordsJoinedIn(_image, _text.words[position].word)) {
+    const FindWord& word = _text.words[position];
+    if (!word.isLookedUp) {
+      continue;
+    }
+    for (const auto& [head, tail] : wordsJoinedIn(_image, word.word)) {
       _splits.push_back({head, tail, position});
     }
   }
@@ -202,7 +206,7 @@ void PhraseFinder::judgeAll(std::span<const std::uint32_t> values) {
 
 /// False when the budget is used up.
 bool PhraseFinder::spendPosting() {
-  if (_postings == 0) {
+  if (_postings == 0 || _steps == 0) {
     _truncated = true;
     return false;
   }
@@ -408,8 +412,9 @@ void PhraseFinder::namePairs(std::span<const std::uint32_t> phrase) {
 
 RankedPhrase PhraseFinder::judgePhrase(std::uint32_t value, std::span<const std::uint32_t> phrase) {
   namePairs(phrase);
-  const PairingScore score = _pairing.solve(_steps);
   RankedPhrase ranked;
+  ranked.steps = _steps;
+  const PairingScore score = _pairing.solve(_steps);
   ranked.cost = 2 * (_text.words.size() + phrase.size()) - score.gain;
   ranked.words = score.words;
   ranked.exact = score.exact;
@@ -457,7 +462,8 @@ RankedPhrase PhraseFinder::judgeAnyway(std::uint32_t value) {
 
 std::vector<Pair> PhraseFinder::pairsOf(const RankedPhrase& phrase) {
   namePairs(phrase.phrase);
-  _pairing.solve(_steps);
+  std::uint64_t steps = phrase.steps;
+  _pairing.solve(steps);
   return {_pairing.pairs().begin(), _pairing.pairs().end()};
 }
 

@@ -42,6 +42,7 @@ struct RankedPhrase {
   std::uint64_t length = 0;  // words of the phrase
   std::uint32_t value = 0;
   std::span<const std::uint32_t> phrase;  // its words in the image, flag and all
+  std::uint64_t steps = 0;                // the budget that its pairing had
 };
 
 /// Finds the phrases of one text. Used once, by one thread. Throws Error (damaged).
@@ -61,7 +62,7 @@ class PhraseFinder {
   /// The same, whatever its cost is and however few of its words are paired.
   RankedPhrase judgeAnyway(std::uint32_t value);
 
-  /// The pairs of a phrase, in its order.
+  /// The pairs of a phrase, in its order: those that it was judged by, whatever is left of budgets.
   std::vector<Pair> pairsOf(const RankedPhrase& phrase);
 
   /// Whether a budget cut something off.

@@ -1,0 +1,134 @@
+#ifndef WORDCATCHER_PYTHON_RECORD_H
+#define WORDCATCHER_PYTHON_RECORD_H
+
+#include <pybind11/pybind11.h>
+
+#include <concepts>
+#include <cstddef>
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace wordcatcher::python {
+
+namespace py = pybind11;
+
+// Python objects are made of a record's fields when they are asked for, so that a result of many
+// matches costs little until somebody looks at it.
+
+inline py::object toPython(bool value) { return py::bool_(value); }
+
+template <std::integral Integer>
+py::object toPython(Integer value) {
+  return py::int_(value);
+}
+
+/// Classic tables hold whatever bytes they were given.
+inline py::object toPython(const std::string& utf8) {
+  auto text = py::reinterpret_steal<py::str>(
+      PyUnicode_DecodeUTF8(utf8.data(), static_cast<py::ssize_t>(utf8.size()), "replace"));
+  if (!text) {
+    throw py::error_already_set();
+  }
+  return text;
+}
+
+template <typename Struct>
+requires std::is_class_v<Struct> py::object toPython(const Struct& value) {
+  return py::cast(value);
+}
+
+template <typename Item>
+py::object toPython(const std::vector<Item>& items) {
+  py::tuple tuple(items.size());
+  for (std::size_t i = 0; i < items.size(); ++i) {
+    tuple[i] = toPython(items[i]);
+  }
+  return tuple;
+}
+
+template <typename Value>
+void fromPython(py::handle object, Value& value) {
+  value = object.cast<Value>();
+}
+
+template <typename Item>
+void fromPython(py::handle object, std::vector<Item>& items) {
+  for (const py::handle item : object) {
+    fromPython(item, items.emplace_back());
+  }
+}
+
+template <typename Struct, typename Value>
+struct Field {
+  const char* name;
+  Value Struct::*member;
+  const char* doc;
+};
+
+template <typename Struct, typename Value>
+Field(const char*, Value Struct::*, const char*) -> Field<Struct, Value>;
+
+/// Binds a struct as an immutable Python class: its fields are properties; it is compared, hashed,
+/// shown, pickled and matched by them.
+template <typename Struct, typename... Values>
+py::class_<Struct> bindRecord(py::module_& module, const char* name, const char* doc,
+                              Field<Struct, Values>... fields) {
+  py::class_<Struct> type(module, name, py::is_final(), doc);
+  const auto values = [fields...](const Struct& self) {
+    return py::make_tuple(toPython(self.*fields.member)...);
+  };
+  (type.def_property_readonly(
+       fields.name, [fields](const Struct& self) { return toPython(self.*fields.member); },
+       fields.doc),
+   ...);
+  type.attr("__match_args__") = py::make_tuple(fields.name...);
+  type.def("__repr__", [values, names = std::vector<std::string>{fields.name...},
+                        name = std::string(name)](const Struct& self) {
+    const py::tuple shown = values(self);
+    std::string text = name + '(';
+    for (std::size_t i = 0; i < names.size(); ++i) {
+      text += (i > 0 ? ", " : "") + names[i] + '=' + std::string(py::repr(shown[i]));
+    }
+    return text + ')';
+  });
+  type.def("__eq__", [values](const Struct& self, const py::object& other) -> py::object {
+    if (!py::isinstance<Struct>(other)) {
+      return py::reinterpret_borrow<py::object>(Py_NotImplemented);
+    }
+    return py::bool_(values(self).equal(values(other.cast<const Struct&>())));
+  });
+  type.def("__hash__", [values](const Struct& self) { return py::hash(values(self)); });
+  type.def(py::pickle(values, [fields...](const py::tuple& state) {
+    if (state.size() != sizeof...(Values)) {
+      throw py::value_error("The pickle is of another version of wordcatcher.");
+    }
+    Struct value{};
+    std::size_t at = 0;
+    (fromPython(state[at++], value.*fields.member), ...);
+    return value;
+  }));
+  return type;
+}
+
+/// Lets a bound struct with `matches` be used as a sequence of them.
+template <typename Result>
+void bindSequence(py::class_<Result>& type) {
+  type.def("__len__", [](const Result& self) { return self.matches.size(); });
+  type.def("__iter__", [](const Result& self) { return py::iter(toPython(self.matches)); });
+  type.def("__getitem__", [](const Result& self, py::ssize_t index) {
+    const auto size = static_cast<py::ssize_t>(self.matches.size());
+    if (index < -size || index >= size) {
+      throw py::index_error("There is no match of that number.");
+    }
+    return toPython(self.matches[static_cast<std::size_t>(index < 0 ? index + size : index)]);
+  });
+  type.def("__getitem__", [](const Result& self, const py::slice& slice) -> py::object {
+    return toPython(self.matches)[slice];
+  });
+}
+
+}  // namespace wordcatcher::python
+
+#endif

@@ -1,0 +1,352 @@
+// Explanations of costs and distances: as a struct, as JSON and in words.
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <nlohmann/json.hpp>
+#include <random>
+#include <string>
+#include <vector>
+
+#include "FindSupport.h"
+#include "RealWords.h"
+#include "wordcatcher/text/Unicode.h"
+
+namespace wordcatcher {
+namespace {
+
+using nlohmann::json;
+using testing::Entries;
+using testing::indexOf;
+using testing::indexOfPhrases;
+
+using Values = std::vector<std::string>;
+
+Index places() {
+  return indexOf(Entries{{"Trinidad and Tobago", "Trinidad and Tobago{ TT }"},
+                         {"Bosnia and Herzegovina", "Bosnia and Herzegovina{ BA }"},
+                         {"New Zealand", "New Zealand{ NZ }"},
+                         {"Aotearoa", "New Zealand{ NZ }"},
+                         {"...", "Nothing"},
+                         {"Route 66", "Route 66"}});
+}
+
+/// The JSON form holds all that the struct holds.
+void expectSameInJson(const FindExplanation& explained) {
+  const std::string line = explained.toJson();
+  EXPECT_EQ(line.find('\n'), std::string::npos);
+  const json object = json::parse(line);
+  EXPECT_EQ(object.size(), 13U);
+  EXPECT_EQ(object.at("text"), explained.text);
+  EXPECT_EQ(object.at("value"), explained.value);
+  EXPECT_EQ(object.at("isStored"), explained.isStored);
+  EXPECT_EQ(object.at("isFound"), explained.isFound);
+  EXPECT_EQ(object.at("truncated"), explained.truncated);
+  EXPECT_EQ(object.at("phrase"), json(explained.phrase));
+  EXPECT_EQ(object.at("missing"), json(explained.missing));
+  EXPECT_EQ(object.at("surplus"), json(explained.surplus));
+  EXPECT_EQ(object.at("objections"), json(explained.objections));
+  EXPECT_EQ(object.at("edits"), explained.edits);
+  EXPECT_EQ(object.at("cost"), explained.cost);
+  json words = json::array();
+  for (const auto& word : explained.words) {
+    json comparisons = json::array();
+    for (const auto& other : word.comparisons) {
+      comparisons.push_back(
+          {{"word", other.word}, {"edits", other.edits}, {"within", other.within}});
+    }
+    words.push_back({{"begin", word.begin},
+                     {"end", word.end},
+                     {"word", word.word},
+                     {"limit", word.limit},
+                     {"comparisons", comparisons}});
+  }
+  EXPECT_EQ(object.at("words"), words);
+  json pairs = json::array();
+  for (const auto& pair : explained.pairs) {
+    pairs.push_back(
+        {{"begin", pair.begin}, {"end", pair.end}, {"word", pair.word}, {"edits", pair.edits}});
+  }
+  EXPECT_EQ(object.at("pairs"), pairs);
+}
+
+TEST(ExplainTest, TellsWhatAPhraseCosts) {
+  const auto explained = places().explain("to Trinidat, in tobagoo", "Trinidad and Tobago{ TT }");
+  EXPECT_TRUE(explained.isStored);
+  EXPECT_TRUE(explained.isFound);
+  EXPECT_FALSE(explained.truncated);
+  EXPECT_EQ(explained.phrase, (Values{"trinidad", "and", "tobago"}));
+  EXPECT_EQ(explained.pairs,
+            (std::vector<FoundWord>{{3, 11, "trinidad", 1}, {16, 23, "tobago", 1}}));
+  EXPECT_EQ(explained.missing, Values{"and"});
+  EXPECT_EQ(explained.surplus, (Values{"to", "in"}));
+  EXPECT_EQ(explained.edits, 2U);
+  EXPECT_EQ(explained.cost, 8U);
+  EXPECT_TRUE(explained.objections.empty());
+  ASSERT_EQ(explained.words.size(), 4U);
+  const auto& word = explained.words[1];
+  EXPECT_EQ(word.begin, 3U);
+  EXPECT_EQ(word.end, 11U);
+  EXPECT_EQ(word.word, "trinidat");
+  EXPECT_EQ(word.limit, 2U);
+  ASSERT_EQ(word.comparisons.size(), 3U);
+  EXPECT_EQ(word.comparisons[0].word, "trinidad");
+  EXPECT_EQ(word.comparisons[0].edits, 1U);
+  EXPECT_TRUE(word.comparisons[0].within);
+  EXPECT_EQ(word.comparisons[1].word, "and");
+  EXPECT_EQ(word.comparisons[1].edits, 6U);
+  EXPECT_FALSE(word.comparisons[1].within);
+  EXPECT_EQ(explained.words[0].limit, 0U);
+  expectSameInJson(explained);
+}
+
+TEST(ExplainTest, InWords) {
+  EXPECT_EQ(places().explain("zeeland and new", "New Zealand{ NZ }").toText(),
+            "Text:   zeeland and new\n"
+            "Value:  New Zealand{ NZ }\n"
+            "Phrase: new, zealand\n"
+            "  zeeland, up to 2 edits: new 6, zealand 1 (near)\n"
+            "  and, up to 1 edit: new 3, zealand 4\n"
+            "  new, up to 1 edit: new 0 (near), zealand 6\n"
+            "Paired: zeeland with zealand, 1 edit\n"
+            "Paired: new with new, 0 edits\n"
+            "Missing from the text: none\n"
+            "Left over in the text: and\n"
+            "Cost: 3 = 1 edit + 2 x 0 missing + 2 x 1 left over\n");
+}
+
+TEST(ExplainTest, TellsOfThePhraseThatFitsBest) {
+  const auto index = places();
+  EXPECT_EQ(index.explain("aotearoa", "New Zealand{ NZ }").phrase, Values{"aotearoa"});
+  EXPECT_EQ(index.explain("zealand", "New Zealand{ NZ }").phrase, (Values{"new", "zealand"}));
+  FindOptions two;
+  two.minWords = 2;
+  EXPECT_FALSE(index.explain("aotearoa", "New Zealand{ NZ }", two).isFound);
+  EXPECT_EQ(index.explain("aotearoa new zealand", "New Zealand{ NZ }", two).cost, 2U);
+}
+
+TEST(ExplainTest, TellsWhatWasJoined) {
+  const auto index = indexOf(Entries{{"won-lost", "won-lost"}, {"railway", "railway"}});
+  const auto joined = index.explain("wonlost", "won-lost");
+  EXPECT_EQ(joined.pairs, (std::vector<FoundWord>{{0, 7, "won lost", 1}}));
+  EXPECT_EQ(joined.cost, 1U);
+  EXPECT_TRUE(joined.missing.empty());
+  EXPECT_NE(joined.toText().find("Paired: wonlost with won lost, 1 edit\n"), std::string::npos);
+  const auto split = index.explain("a rail way", "railway");
+  EXPECT_EQ(split.pairs, (std::vector<FoundWord>{{2, 10, "railway", 1}}));
+  EXPECT_EQ(split.surplus, Values{"a"});
+  expectSameInJson(split);
+}
+
+/// What an absent value is told about: some words of each sentence.
+void expectAbsent(const FindExplanation& explained, const Values& reasons) {
+  EXPECT_FALSE(explained.isFound);
+  ASSERT_EQ(explained.objections.size(), reasons.size()) << explained.toText();
+  for (std::size_t i = 0; i < reasons.size(); ++i) {
+    EXPECT_NE(explained.objections[i].find(reasons[i]), std::string::npos)
+        << explained.objections[i];
+    EXPECT_NE(explained.toText().find("Not found: " + explained.objections[i] + '\n'),
+              std::string::npos);
+  }
+  expectSameInJson(explained);
+}
+
+TEST(ExplainTest, TellsWhyAPhraseIsAbsent) {
+  const auto index = places();
+  const auto unknown = index.explain("trinidad", "Trinidad");
+  EXPECT_FALSE(unknown.isStored);
+  expectAbsent(unknown, {"holds no such data string"});
+  const auto far = index.explain("tribidax bosmian", "Route 66");
+  EXPECT_TRUE(far.isStored);
+  EXPECT_EQ(far.cost, 8U);
+  expectAbsent(far, {"None of its words is near enough"});
+  expectAbsent(index.explain("nothing", "Nothing"), {"holds no word"});
+  expectAbsent(index.explain("route 67", "Bosnia and Herzegovina{ BA }"), {"None"});
+  FindOptions options;
+  options.maxCost = 3;
+  const auto dear = index.explain("zealand in winter", "New Zealand{ NZ }", options);
+  EXPECT_EQ(dear.cost, 6U);
+  expectAbsent(dear, {"cost of 6 is more than the greatest allowed, 3"});
+  options.maxCost.reset();
+  options.minWords = 2;
+  expectAbsent(index.explain("zealand", "New Zealand{ NZ }", options),
+               {"Only 1 of its words is in the text, and at least 2 must be"});
+  options.maxCost = 0;
+  options.minWords = 3;
+  expectAbsent(index.explain("new zealan", "New Zealand{ NZ }", options),
+               {"Only 2 of its words are", "cost of 1 "});
+}
+
+TEST(ExplainTest, NumbersAreNotNear) {
+  const auto explained = places().explain("route 67", "Route 66");
+  ASSERT_EQ(explained.words.size(), 2U);
+  EXPECT_EQ(explained.words[1].comparisons.at(1).edits, 1U);
+  EXPECT_FALSE(explained.words[1].comparisons.at(1).within);
+  EXPECT_EQ(explained.cost, 4U);
+}
+
+TEST(ExplainTest, SwapsCountAsTheOptionSays) {
+  FindOptions options;
+  EXPECT_EQ(places().explain("tobgao", "Trinidad and Tobago{ TT }", options).edits, 1U);
+  options.transpositions = false;
+  const auto plain = places().explain("tobgao", "Trinidad and Tobago{ TT }", options);
+  EXPECT_EQ(plain.edits, 2U);
+  EXPECT_EQ(plain.words.at(0).comparisons.at(2).edits, 2U);
+}
+
+TEST(ExplainTest, HostsStringsThatAreNotUtf8) {
+  const auto explained = places().explain("tobago\xFF", "\xC3(");
+  EXPECT_EQ(explained.text, "tobago\xFF");
+  EXPECT_EQ(json::parse(explained.toJson()).at("text"), "tobago\uFFFD");
+  EXPECT_EQ(json::parse(places().explainQuery("\xFF", "\xC3").toJson()).at("text"), "\uFFFD");
+}
+
+TEST(ExplainTest, WordsThatAreTooLong) {
+  Index::Options budgets;
+  budgets.maxWordUnits = 10;
+  const auto index =
+      indexOf(Entries{{"Mississippi Delta", "Mississippi Delta"}}, MatchingMode::words, budgets);
+  const auto explained = index.explain("mississippi delta", "Mississippi Delta");
+  EXPECT_TRUE(explained.truncated);
+  EXPECT_TRUE(explained.isFound);
+  EXPECT_EQ(explained.missing, Values{"mississippi"});
+  EXPECT_EQ(explained.surplus, Values{"mississippi"});
+  EXPECT_EQ(explained.words.at(0).begin, 0U);
+  EXPECT_EQ(explained.words.at(0).end, 11U);
+  EXPECT_TRUE(explained.words.at(0).comparisons.empty());
+  EXPECT_NE(explained.toText().find("  mississippi, not looked up\n"), std::string::npos);
+  EXPECT_NE(explained.toText().find("beyond the budget"), std::string::npos);
+  expectSameInJson(explained);
+}
+
+TEST(ExplainTest, OtherModes) {
+  const auto whole =
+      indexOf(Entries{{"12 Baker Street", "A"}, {"Baker Street", "B"}}, MatchingMode::wholeText);
+  const auto explained = whole.explain("12 baker streat", "A");
+  EXPECT_TRUE(explained.isFound);
+  EXPECT_EQ(explained.phrase, Values{"12 baker street"});
+  EXPECT_EQ(explained.cost, 1U);
+  EXPECT_TRUE(explained.words.at(0).comparisons.at(0).within);
+  EXPECT_EQ(whole.find("baker street").matches.at(0).value, "B");
+  EXPECT_EQ(whole.find("baker street").matches.at(1).value, "A") << "a digit is but a letter here";
+  const auto sounds =
+      indexOf(Entries{{"Catherine", "C"}, {"Peter", "P"}}, MatchingMode::phoneticWords);
+  const auto code = sounds.explain("dear Kathryn", "C");
+  EXPECT_TRUE(code.isFound);
+  EXPECT_EQ(code.phrase, Values{"k0rn"});
+  EXPECT_EQ(code.words.at(1).word, "k0rn");
+  EXPECT_EQ(code.words.at(1).limit, 0U);
+  EXPECT_EQ(code.words.at(1).begin, 5U);
+  expectAbsent(sounds.explain("Kathryn", "P"), {"None"});
+}
+
+/// The explanation of a distance tells what query() tells.
+void expectAsQuery(const Index& index, const std::string& text, const Values& values) {
+  const auto result = index.query(text);
+  for (const auto& value : values) {
+    const auto explained = index.explainQuery(text, value);
+    const auto match =
+        std::find_if(result.matches.begin(), result.matches.end(), [&](const Index::Match& each) {
+          return each.value == value ||
+                 std::find(each.data.begin(), each.data.end(), value) != each.data.end();
+        });
+    const bool isFound = match != result.matches.end();
+    ASSERT_EQ(explained.isFound, isFound) << text << " for " << value << explained.toText();
+    ASSERT_EQ(explained.truncated, result.truncated);
+    ASSERT_TRUE(explained.isStored);
+    ASSERT_FALSE(explained.steps.empty()) << text << " for " << value;
+    ASSERT_EQ(explained.steps.back().distance, explained.distance) << explained.toText();
+    if (isFound) {
+      ASSERT_EQ(explained.distance, match->distance) << explained.toText();
+      ASSERT_LE(explained.distance, explained.bound) << explained.toText();
+    }
+    const json object = json::parse(explained.toJson());
+    ASSERT_EQ(object.size(), 8U);
+    ASSERT_EQ(object.at("text"), text);
+    ASSERT_EQ(object.at("value"), value);
+    ASSERT_EQ(object.at("isStored"), explained.isStored);
+    ASSERT_EQ(object.at("isFound"), explained.isFound);
+    ASSERT_EQ(object.at("truncated"), explained.truncated);
+    ASSERT_EQ(object.at("distance"), explained.distance);
+    ASSERT_EQ(object.at("bound"), explained.bound);
+    ASSERT_EQ(object.at("steps").size(), explained.steps.size());
+    for (std::size_t i = 0; i < explained.steps.size(); ++i) {
+      ASSERT_EQ(object.at("steps")[i].at("sentence"), explained.steps[i].sentence);
+      ASSERT_EQ(object.at("steps")[i].at("distance"), explained.steps[i].distance);
+      ASSERT_NE(explained.toText().find(std::to_string(i + 1) + ". " + explained.steps[i].sentence),
+                std::string::npos);
+    }
+  }
+}
+
+class ExplainQueryTest : public ::testing::TestWithParam<MatchingMode> {};
+
+TEST_P(ExplainQueryTest, AgreesWithTheQuery) {
+  std::mt19937 random(51);  // NOLINT(cert-msc32-c,cert-msc51-cpp): the same every time
+  Entries entries;
+  Values values;
+  std::vector<std::u16string> terms;
+  for (const auto& lemma : testing::sample(testing::lemmas(), 60000, random)) {
+    // Terms that share words, so that the words of a text have candidates in common.
+    if (lemma.find(u" tree") != std::u16string::npos || lemma.find(u"red ") == 0 ||
+        lemma.find(u" of ") != std::u16string::npos) {
+      const std::string phrase = toUtf8(lemma).value();
+      terms.push_back(lemma);
+      values.push_back(phrase + "{ " + std::to_string(values.size() % 7) + " }");
+      entries.emplace_back(phrase, values.back());
+    }
+    if (terms.size() == 120) {
+      break;
+    }
+  }
+  ASSERT_EQ(terms.size(), 120U);
+  const auto index = indexOf(entries, GetParam());
+  for (int i = 0; i < 60 && !HasFailure(); ++i) {
+    auto text = testing::misspelled(terms[random() % terms.size()], terms, random);
+    if (i % 5 == 0) {
+      text += u' ' + testing::misspelled(terms[random() % terms.size()], terms, random);
+    }
+    expectAsQuery(index, toUtf8(text).value(), values);
+  }
+  for (const char* text : {"", "a", "of", "xyzzyx", "tree", "red of the", "\u00E9"}) {
+    expectAsQuery(index, text, values);
+  }
+}
+
+TEST_P(ExplainQueryTest, AgreesWithTheQueryThatIsCutOff) {
+  Index::Options budgets;
+  budgets.maxQueryWords = 3;
+  budgets.maxWordUnits = 8;
+  const Values values = {"Mississippi Delta", "Delta Wing", "New Orleans Delta"};
+  const auto index = indexOfPhrases(values, GetParam(), budgets);
+  for (const char* text :
+       {"mississippi delta", "the delta of new orleans", "delta wing", "delta"}) {
+    expectAsQuery(index, text, values);
+  }
+}
+
+TEST_P(ExplainQueryTest, OfAValueThatIsNotThere) {
+  const auto index = indexOfPhrases({"Delta Wing"}, GetParam());
+  const auto explained = index.explainQuery("delta wing", "Wing");
+  EXPECT_FALSE(explained.isStored);
+  EXPECT_FALSE(explained.isFound);
+  EXPECT_NE(explained.toText().find("holds no such data string"), std::string::npos);
+}
+
+INSTANTIATE_TEST_SUITE_P(Modes, ExplainQueryTest,
+                         ::testing::Values(MatchingMode::words, MatchingMode::wholeText,
+                                           MatchingMode::phoneticWords));
+
+TEST(ExplainQueryTextTest, InWords) {
+  const auto explained = places().explainQuery("trinidat tobago", "Trinidad and Tobago{ TT }");
+  EXPECT_TRUE(explained.isFound);
+  EXPECT_NE(
+      explained.toText().find("\"trinidat\" is near 1 stored word; \"trinidad\", 1 edit away, "
+                              "carries the value.\n"),
+      std::string::npos)
+      << explained.toText();
+  EXPECT_NE(explained.toText().find("so this one is."), std::string::npos);
+}
+
+}  // namespace
+}  // namespace wordcatcher

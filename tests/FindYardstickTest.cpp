@@ -1,0 +1,356 @@
+// Index::find against the literal judging of every phrase: every small question of small indexes,
+// and real words.
+
+#include <gtest/gtest.h>
+#include <rapidcheck/gtest.h>
+
+#include <algorithm>
+#include <random>
+#include <string>
+#include <vector>
+
+#include "FindSupport.h"
+#include "LiteralFind.h"
+#include "RealWords.h"
+#include "wordcatcher/text/Unicode.h"
+
+namespace wordcatcher {
+namespace {
+
+using testing::edited;
+using testing::Entries;
+using testing::indexOf;
+using testing::linesOf;
+using testing::LiteralFind;
+using testing::misspelled;
+using testing::unlimited;
+
+/// All rows of up to `most` of these words, with spaces between.
+std::vector<std::string> allRows(const std::vector<std::string>& words, std::size_t most) {
+  std::vector<std::string> rows = {""};
+  for (std::size_t begin = 0, length = 1; length <= most; ++length) {
+    const std::size_t end = rows.size();
+    for (; begin < end; ++begin) {
+      for (const auto& word : words) {
+        rows.push_back(rows[begin].empty() ? word : rows[begin] + ' ' + word);
+      }
+    }
+  }
+  rows.erase(rows.begin());
+  return rows;
+}
+
+/// An index, and the literal judge of the same phrases.
+class Both {
+ public:
+  explicit Both(const Entries& entries, MatchingMode mode = MatchingMode::words)
+      : _index(indexOf(entries, mode)), _literal(mode) {
+    for (const auto& [phrase, value] : entries) {
+      _literal.add(phrase, value);
+      _values.push_back(value);
+    }
+  }
+
+  const Index& index() const { return _index; }
+
+  /// Compares the whole lists; the literal one.
+  std::vector<FoundPhrase> expectSame(const std::string& text, const FindOptions& options) const {
+    auto expected = _literal.findAll(text, options);
+    const auto found = _index.find(text, options);
+    EXPECT_FALSE(found.truncated) << text;
+    EXPECT_EQ(found.matches == expected, true)
+        << text << describe(options) << difference(found.matches, expected);
+    return expected;
+  }
+
+  /// Of a list known to be right, each limit gives the beginning.
+  void expectBeginnings(const std::string& text, FindOptions options,
+                        const std::vector<FoundPhrase>& all) const {
+    for (std::size_t limit = 0; limit <= all.size() + 1; ++limit) {
+      options.limit = limit;
+      const auto found = _index.find(text, options);
+      const auto size = std::min(limit, all.size());
+      EXPECT_EQ(found.matches.size() == size &&
+                    std::equal(found.matches.begin(), found.matches.end(), all.begin()),
+                true)
+          << text << describe(options) << " and limit " << limit << difference(found.matches, all);
+    }
+  }
+
+  /// explain() tells of each value what the list tells.
+  void expectExplained(const std::string& text, const FindOptions& options,
+                       const std::vector<FoundPhrase>& all) const {
+    for (const auto& value : _values) {
+      const auto explained = _index.explain(text, value, options);
+      const auto match = std::find_if(all.begin(), all.end(), [&value](const FoundPhrase& each) {
+        return each.value == value;
+      });
+      ASSERT_TRUE(explained.isStored);
+      ASSERT_EQ(explained.isFound, match != all.end()) << text << " for " << value;
+      ASSERT_EQ(explained.objections.empty(), explained.isFound) << text << " for " << value;
+      if (explained.isFound) {
+        ASSERT_EQ(explained.cost, match->cost) << text << " for " << value;
+        ASSERT_TRUE(explained.pairs == match->hits) << text << " for " << value;
+      }
+      ASSERT_EQ(explained.cost,
+                explained.edits + 2 * (explained.missing.size() + explained.surplus.size()))
+          << text << " for " << value;
+    }
+  }
+
+ private:
+  /// The first match that is another.
+  static std::string difference(const std::vector<FoundPhrase>& found,
+                                const std::vector<FoundPhrase>& expected) {
+    auto foundLines = linesOf(found);
+    auto expectedLines = linesOf(expected);
+    foundLines.emplace_back("no more");
+    expectedLines.emplace_back("no more");
+    std::size_t i = 0;
+    while (i + 1 < std::min(foundLines.size(), expectedLines.size()) &&
+           foundLines[i] == expectedLines[i]) {
+      ++i;
+    }
+    return "; at " + std::to_string(i) + " it finds\n  " + foundLines[i] + "\ninstead of\n  " +
+           expectedLines[i];
+  }
+
+  static std::string describe(const FindOptions& options) {
+    const auto& edits = options.edits;
+    return " with edits " + std::to_string(edits.shortEdits) + ' ' +
+           std::to_string(edits.mediumEdits) + ' ' + std::to_string(edits.longEdits) + ' ' +
+           std::to_string(edits.wholeTextEdits) + " for words up to " +
+           std::to_string(edits.shortLength) + ' ' + std::to_string(edits.mediumLength) +
+           (options.transpositions ? ", swaps" : "") + ", at least " +
+           std::to_string(options.minWords) + " words, at most " +
+           (options.maxCost ? std::to_string(*options.maxCost) : "any cost");
+  }
+
+  Index _index;
+  LiteralFind _literal;
+  std::vector<std::string> _values;
+};
+
+Entries asEntries(const std::vector<std::string>& phrases) {
+  Entries entries;
+  for (const auto& phrase : phrases) {
+    entries.emplace_back(phrase, phrase);
+  }
+  return entries;
+}
+
+std::vector<FindOptions> manyOptions() {
+  std::vector<FindOptions> many;
+  for (const bool transpositions : {true, false}) {
+    for (const EditLimits& edits :
+         {EditLimits(), EditLimits{2, 5, 0, 0, 0, 0}, EditLimits{1, 2, 0, 1, 1},
+          EditLimits{2, 5, 1, 1, 2}, EditLimits{1, 2, 1, 2, 3}, EditLimits{2, 5, 3, 3, 3}}) {
+      FindOptions options = unlimited();
+      options.transpositions = transpositions;
+      options.edits = edits;
+      many.push_back(options);
+    }
+  }
+  return many;
+}
+
+TEST(FindYardstickTest, EveryTextOverAFewWordsInAllPhrasesOverThem) {
+  // Words that are near one another, swapped, the joined form of others, and the same twice.
+  const Both all(asEntries(allRows({"a", "ab", "ba", "aab"}, 3)));
+  const auto texts = allRows({"a", "b", "ab", "ba", "aba"}, 3);
+  const auto options = manyOptions();
+  std::size_t matches = 0;
+  for (std::size_t i = 0; i < texts.size() && !HasFailure(); ++i) {
+    // Twelve sets of options, four for each text, and all of them for the short texts.
+    for (std::size_t o = 0; o < options.size(); ++o) {
+      if (texts[i].size() <= 5 || o % 3 == i % 3) {
+        matches += all.expectSame(texts[i], options[o]).size();
+      }
+    }
+  }
+  EXPECT_GT(matches, 10000U) << "the comparison was not of empty lists";
+}
+
+TEST(FindYardstickTest, LongerTexts) {
+  const Both all(asEntries({"a", "b", "ab", "ba", "a b", "b a", "a a", "b ab", "ab a", "a b a",
+                            "b b a", "ab ab", "ba a b", "a a a", "b a b"}));
+  const auto texts = allRows({"a", "b", "ab"}, 5);
+  const auto options = manyOptions();
+  for (std::size_t i = 0; i < texts.size() && !HasFailure(); ++i) {
+    all.expectSame(texts[i], options[i % options.size()]);
+  }
+}
+
+TEST(FindYardstickTest, EveryLimitGivesTheFirstOfAll) {
+  const Both all(asEntries(allRows({"a", "ab", "ba"}, 2)));
+  for (const auto& text : allRows({"a", "b", "ab"}, 3)) {
+    for (const auto& options : {manyOptions()[0], manyOptions()[3], manyOptions()[11]}) {
+      all.expectBeginnings(text, options, all.expectSame(text, options));
+    }
+    if (HasFailure()) {
+      return;
+    }
+  }
+}
+
+TEST(FindYardstickTest, EveryBoundOfCostAndWords) {
+  const Both all(asEntries(allRows({"a", "ab", "ba"}, 2)));
+  for (const auto& text : allRows({"a", "b", "ba"}, 2)) {
+    for (std::size_t minWords = 0; minWords <= 3; ++minWords) {
+      for (std::uint64_t maxCost = 0; maxCost <= 8; ++maxCost) {
+        FindOptions options = unlimited();
+        options.edits.shortEdits = 1;
+        options.minWords = minWords;
+        options.maxCost = maxCost;
+        const auto found = all.expectSame(text, options);
+        all.expectBeginnings(text, options, found);
+        all.expectExplained(text, options, found);
+      }
+    }
+    if (HasFailure()) {
+      return;
+    }
+  }
+}
+
+TEST(FindYardstickTest, ExplainsEveryValueAsItIsFound) {
+  const Both all(asEntries(allRows({"a", "ab", "ba"}, 2)));
+  const auto options = manyOptions();
+  const auto texts = allRows({"a", "b", "ab"}, 3);
+  for (std::size_t i = 0; i < texts.size() && !HasFailure(); ++i) {
+    const auto& chosen = options[i % options.size()];
+    all.expectExplained(texts[i], chosen, all.expectSame(texts[i], chosen));
+  }
+}
+
+/// A name like those that people ask for, of few letters, so that much is near to much.
+rc::Gen<std::string> anyRow(std::size_t most) {
+  const auto word =
+      rc::gen::element<std::string>("a", "b", "ab", "ba", "abc", "bac", "abcab", "abcba", "cab",
+                                    "bc", "12", "a1", "a12", "É", "abé");
+  return rc::gen::map(
+      rc::gen::resize(static_cast<int>(most), rc::gen::container<std::vector<std::string>>(word)),
+      [](const std::vector<std::string>& words) {
+        std::string row;
+        for (const auto& each : words) {
+          row += (row.empty() ? "" : " ") + each;
+        }
+        return row;
+      });
+}
+
+rc::Gen<FindOptions> anyOptions() {
+  return rc::gen::exec([] {
+    FindOptions options = unlimited();
+    options.transpositions = *rc::gen::arbitrary<bool>();
+    options.minWords = *rc::gen::weightedElement<std::size_t>({{4, 1}, {1, 0}, {1, 2}, {1, 3}});
+    if (*rc::gen::arbitrary<bool>()) {
+      options.maxCost = *rc::gen::inRange<std::uint64_t>(0, 10);
+    }
+    const auto edits = rc::gen::inRange<std::uint32_t>(0, EditLimits::kMaxEdits + 1);
+    const auto length = rc::gen::inRange<std::size_t>(0, 6);
+    options.edits = {*length, *length, *edits, *edits, *edits, *edits};
+    return options;
+  });
+}
+
+TEST(FindYardstickTest, ValuesOfSeveralPhrases) {
+  const bool holds = rc::check([] {
+    Entries entries;
+    const auto count = *rc::gen::inRange(0, 12);
+    for (int i = 0; i < count; ++i) {
+      entries.emplace_back(*anyRow(4), std::string(1, "VWXYZ"[*rc::gen::inRange(0, 5)]));
+    }
+    const Both both(entries);
+    for (int i = 0; i < 6; ++i) {
+      const auto text = *anyRow(5);
+      const auto options = *anyOptions();
+      const auto all = both.expectSame(text, options);
+      both.expectBeginnings(text, options, all);
+      both.expectExplained(text, options, all);
+    }
+    RC_ASSERT(!::testing::Test::HasFailure());
+  });
+  EXPECT_TRUE(holds);
+}
+
+TEST(FindYardstickTest, WholeTexts) {
+  const bool holds = rc::check([] {
+    Entries entries;
+    const auto count = *rc::gen::inRange(0, 12);
+    for (int i = 0; i < count; ++i) {
+      entries.emplace_back(*anyRow(3), std::string(1, "VWXYZ"[*rc::gen::inRange(0, 5)]));
+    }
+    const Both both(entries, MatchingMode::wholeText);
+    for (int i = 0; i < 6; ++i) {
+      const auto text = *anyRow(3);
+      const auto options = *anyOptions();
+      const auto all = both.expectSame(text, options);
+      both.expectBeginnings(text, options, all);
+      both.expectExplained(text, options, all);
+    }
+    RC_ASSERT(!::testing::Test::HasFailure());
+  });
+  EXPECT_TRUE(holds);
+}
+
+std::string asUtf8(const std::u16string& text) { return toUtf8(text).value(); }
+
+/// Terms of two words and more, and some of their words.
+std::vector<std::u16string> someTerms(std::size_t count, std::mt19937& random) {
+  std::vector<std::u16string> terms;
+  for (const auto& lemma : testing::lemmas()) {
+    if (lemma.find(u' ') != std::u16string::npos) {
+      terms.push_back(lemma);
+    }
+  }
+  auto chosen = testing::sample(terms, count, random);
+  const auto others = testing::sample(testing::lemmas(), count / 3, random);
+  chosen.insert(chosen.end(), others.begin(), others.end());
+  return chosen;
+}
+
+/// As people write: two words joined, or one in two.
+std::string joinedOrSplit(std::u16string text, std::mt19937& random) {
+  const std::size_t space = text.find(u' ');
+  if (space != std::u16string::npos && random() % 2 == 0) {
+    text.erase(space, 1);
+  } else if (text.size() > 4) {
+    text.insert(1 + random() % (text.size() - 1), 1, u' ');
+  }
+  return asUtf8(text);
+}
+
+TEST(FindYardstickTest, RealTerms) {
+  std::mt19937 random(7);  // NOLINT(cert-msc32-c,cert-msc51-cpp): the same every time
+  const auto terms = someTerms(900, random);
+  Entries entries;
+  for (const auto& term : terms) {
+    entries.emplace_back(asUtf8(term), asUtf8(term) + "{ " + std::to_string(term.size()) + " }");
+  }
+  const Both both(entries);
+  std::size_t matches = 0;
+  for (int i = 0; i < 150 && !HasFailure(); ++i) {
+    const auto& term = terms[random() % terms.size()];
+    const std::string text =
+        i % 4 == 3 ? joinedOrSplit(term, random) : asUtf8(misspelled(term, terms, random));
+    FindOptions options = unlimited();
+    options.transpositions = i % 3 != 0;
+    if (i % 10 == 9) {
+      options.edits = {0, 3, 0, 2, 3, 3};
+    }
+    const auto all = both.expectSame(text, options);
+    matches += all.size();
+    for (const std::size_t limit : {1U, 2U, 5U, 10U, 40U}) {
+      options.limit = limit;
+      const auto found = both.index().find(text, options).matches;
+      EXPECT_TRUE(found.size() == std::min(limit, all.size()) &&
+                  std::equal(found.begin(), found.end(), all.begin()))
+          << text << " with limit " << limit;
+    }
+  }
+  EXPECT_GT(matches, 2000U) << "the comparison was not of empty lists";
+}
+
+}  // namespace
+}  // namespace wordcatcher
