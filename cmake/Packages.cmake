@@ -2,12 +2,13 @@
 # scripts/package builds and packs them.
 set(packaging ${PROJECT_SOURCE_DIR}/packaging)
 
-# The changelog says which packaging of a version this is, and who answers for it.
+# The changelog says which packaging of a version this is, and who answers for it. The revision begins
+# with 0, so that packages of Debian's own would come after these.
 file(STRINGS ${packaging}/changelog changelog_entry LIMIT_COUNT 1)
 file(STRINGS ${packaging}/changelog changelog_signature LIMIT_COUNT 1 REGEX "^ -- ")
 set_property(DIRECTORY ${PROJECT_SOURCE_DIR} APPEND PROPERTY
   CMAKE_CONFIGURE_DEPENDS ${packaging}/changelog)
-string(REGEX MATCH "\\((.+)-([0-9]+)\\)" changelog_version "${changelog_entry}")
+string(REGEX MATCH "\\((.+)-([^-]+)\\)" changelog_version "${changelog_entry}")
 set(changelog_version ${CMAKE_MATCH_1})
 set(CPACK_DEBIAN_PACKAGE_RELEASE ${CMAKE_MATCH_2})
 if(NOT changelog_version VERSION_EQUAL PROJECT_VERSION)
@@ -40,9 +41,9 @@ set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS ON)
 set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS_POLICY ">=")
 
 set(about "\
-Wordcatcher finds names, titles and labels that were stored earlier inside free text, and tolerates
-spelling mistakes. Each phrase that it finds comes with the data that was stored with it and with its
-distance in edits.
+Wordcatcher finds names, titles and labels that were stored earlier inside
+free text, and tolerates spelling mistakes. Each phrase that it finds comes
+with the data that was stored with it and with its distance in edits.
 ")
 set(library_package libwordcatcher${PROJECT_VERSION_MAJOR})
 # dpkg-shlibdeps knows the packages that are installed, and so not this one.
@@ -68,7 +69,8 @@ set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS
 set(CPACK_DEBIAN_DEVELOPMENT_DESCRIPTION "finds stored phrases in free text (development files)
 ${about}\
 .
-This package holds the headers for C++ and C, the CMake package and the pkg-config file.
+This package holds the headers for C++ and C, the CMake package and the
+pkg-config file.
 ")
 set(CPACK_WORDCATCHER_DEVELOPMENT_CONTAINS "")
 
@@ -78,9 +80,28 @@ set(CPACK_DEBIAN_COMMAND_PACKAGE_DEPENDS ${library_dependency})
 set(CPACK_DEBIAN_COMMAND_DESCRIPTION "finds stored phrases in free text (command)
 ${about}\
 .
-This package holds the command wordcatcher, which indexes phrases and finds them, and
-verify-metaphone, which checks the encoder of sounds.
+This package holds the command wordcatcher, which indexes phrases and finds
+them, and verify-metaphone, which checks the encoder of sounds.
 ")
 set(CPACK_WORDCATCHER_COMMAND_CONTAINS libcli11-dev nlohmann-json3-dev libxxhash-dev)
+
+# The module is compiled for one minor version of Python.
+if(TARGET wordcatcher-python)
+  get_target_property(python_version wordcatcher-python PYTHON_VERSION)
+  string(REGEX MATCH "^3\\.([0-9]+)$" minor ${python_version})
+  math(EXPR next_minor "${CMAKE_MATCH_1} + 1")
+  set(python_dependency "python3 (>= ${python_version}~), python3 (<< 3.${next_minor})")
+endif()
+set(CPACK_DEBIAN_PYTHON_PACKAGE_NAME python3-wordcatcher)
+set(CPACK_DEBIAN_PYTHON_PACKAGE_SECTION python)
+set(CPACK_DEBIAN_PYTHON_PACKAGE_DEPENDS "${library_dependency}, ${python_dependency}")
+set(CPACK_DEBIAN_PYTHON_PACKAGE_CONTROL_EXTRA
+  ${packaging}/python/postinst ${packaging}/python/prerm)
+set(CPACK_DEBIAN_PYTHON_DESCRIPTION "finds stored phrases in free text (Python module)
+${about}\
+.
+This package holds the module wordcatcher for Python 3.
+")
+set(CPACK_WORDCATCHER_PYTHON_CONTAINS pybind11-dev)
 
 include(CPack)
