@@ -37,8 +37,6 @@ set(CPACK_DEBIAN_PACKAGE_SOURCE wordcatcher)
 set(CPACK_DEBIAN_PACKAGE_CONTROL_STRICT_PERMISSION ON)
 set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
 set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS_PRIVATE_DIRS ${PROJECT_BINARY_DIR}/wordcatcher)
-set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS ON)
-set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS_POLICY ">=")
 
 set(about "\
 Wordcatcher finds names, titles and labels that were stored earlier inside
@@ -51,7 +49,11 @@ set(library_dependency "${library_package} (>= ${PROJECT_VERSION})")
 
 set(CPACK_DEBIAN_LIBRARY_PACKAGE_NAME ${library_package})
 set(CPACK_DEBIAN_LIBRARY_PACKAGE_SECTION libs)
-set(CPACK_DEBIAN_LIBRARY_PACKAGE_CONTROL_EXTRA ${packaging}/triggers)
+# CPack would make the shlibs of the Python module as well, which is no library to link.
+file(CONFIGURE OUTPUT ${PROJECT_BINARY_DIR}/packaging/shlibs @ONLY CONTENT
+  "libwordcatcher @PROJECT_VERSION_MAJOR@ @library_dependency@\n")
+set(CPACK_DEBIAN_LIBRARY_PACKAGE_CONTROL_EXTRA
+  ${PROJECT_BINARY_DIR}/packaging/shlibs ${packaging}/triggers)
 set(CPACK_DEBIAN_LIBRARY_DESCRIPTION "finds stored phrases in free text (shared library)
 ${about}\
 .

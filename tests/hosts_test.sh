@@ -39,7 +39,7 @@ check() {
 }
 
 cmake -S "$source/examples/installed_host" -B "$work/host" -DCMAKE_PREFIX_PATH="$prefix" \
-  -DCMAKE_CXX_FLAGS="$flags" --log-level=WARNING
+  -DCMAKE_CXX_FLAGS="$flags" >/dev/null
 of_prefix "what CMake finds" "$work/host/CMakeCache.txt"
 cmake --build "$work/host" >/dev/null
 check cmake "$work/host/host"
@@ -54,7 +54,7 @@ check pkg-config "$work/by_pkg_config"
 # A host in C: it reads the index that the last host in C++ built.
 cc=${CC:-cc}
 cmake -S "$source/examples/installed_c_host" -B "$work/c_host" -DCMAKE_PREFIX_PATH="$prefix" \
-  -DCMAKE_C_COMPILER="$cc" -DCMAKE_C_FLAGS="$flags -Wall -Wextra -Wpedantic -Werror" --log-level=WARNING
+  -DCMAKE_C_COMPILER="$cc" -DCMAKE_C_FLAGS="$flags -Wall -Wextra -Wpedantic -Werror" >/dev/null
 of_prefix "what CMake finds for C" "$work/c_host/CMakeCache.txt"
 cmake --build "$work/c_host" >/dev/null
 # shellcheck disable=SC2046
