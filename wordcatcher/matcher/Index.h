@@ -117,8 +117,8 @@ class WORDCATCHER_EXPORT Index {
   FindResult find(std::string_view text) const;
   FindResult find(std::string_view text, const FindOptions& options) const;
 
-  /// Why a value has its cost for a text, or why find() does not list it. Linear in the index's
-  /// values. Throws as find() does.
+  /// Why a value has its cost for a text, or why find() does not list it with these options. Linear
+  /// in the index's values, beside some calls of find(). Throws as find() does.
   FindExplanation explain(std::string_view text, std::string_view value) const;
   FindExplanation explain(std::string_view text, std::string_view value,
                           const FindOptions& options) const;
