@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <fstream>
 #include <memory>
 
 #include "cli/Failure.h"
@@ -24,8 +25,9 @@ constexpr std::size_t kHeaderBytes = 2048;
 constexpr std::size_t kPairBytes = 8;
 constexpr std::uint64_t kSlotBytes = 8;
 
-// Links to the files that this process has open.
+// Links to the files that this process has open, and what is known of each.
 const std::string kDescriptors = "/proc/self/fd/";
+const std::string kDescriptorInfo = "/proc/self/fdinfo/";
 
 using Header = std::array<unsigned char, kHeaderBytes>;
 
@@ -71,6 +73,17 @@ std::optional<std::uint64_t> tableSize(const std::string& path) {
 std::string tryIndexing(const std::string& directory) {
   return "index the phrases again with " + inQuotes("wordcatcher index --tables " + directory) +
          ".";
+}
+
+/// Whether a lock is held through a descriptor.
+bool holdsLock(const std::string& descriptor) {
+  std::ifstream info(kDescriptorInfo + descriptor);
+  for (std::string line; std::getline(info, line);) {
+    if (line.starts_with("lock:")) {
+      return true;
+    }
+  }
+  return false;
 }
 
 bool sameFile(const struct stat& a, const struct stat& b) {
@@ -142,7 +155,7 @@ std::uint64_t IndexDirectory::tableBytes() const {
   return sum;
 }
 
-std::optional<std::size_t> IndexDirectory::lastOpenTable() const {
+std::optional<std::size_t> IndexDirectory::lastTable(bool unlocked) const {
   const std::unique_ptr<DIR, CloseDirectory> descriptors(opendir(kDescriptors.c_str()));
   std::array<struct stat, kTables> tables{};
   std::array<bool, kTables> exists{};
@@ -160,7 +173,7 @@ std::optional<std::size_t> IndexDirectory::lastOpenTable() const {
       continue;
     }
     for (std::size_t i = 0; i < kTables; ++i) {
-      if (exists.at(i) && sameFile(open, tables.at(i))) {
+      if (exists.at(i) && sameFile(open, tables.at(i)) && !(unlocked && holdsLock(entry->d_name))) {
         last = std::max(last.value_or(i), i);
       }
     }

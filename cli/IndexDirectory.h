@@ -39,11 +39,16 @@ class IndexDirectory {
   std::uint64_t tableBytes() const;
 
   /// The last of the tables() that this process has open, by its place there. While the library
-  /// opens tables it is the one whose lock is being waited for; those before it are locked by us.
-  std::optional<std::size_t> lastOpenTable() const;
+  /// opens tables, those before it are locked by us.
+  std::optional<std::size_t> lastOpenTable() const { return lastTable(false); }
+
+  /// The last of those that this process has open and has not locked: the one whose lock the
+  /// library waits for.
+  std::optional<std::size_t> awaitedTable() const { return lastTable(true); }
 
  private:
   void checkReadable() const;
+  std::optional<std::size_t> lastTable(bool unlocked) const;
 
   std::string _name;
   std::string _path;

@@ -28,9 +28,8 @@ void LockWatcher::watch(const std::stop_token& stop) {
   bool told = false;
   std::unique_lock lock(_mutex);
   while (!_wake.wait_for(lock, stop, kLookEvery, [] { return false; }) && !stop.stop_requested()) {
-    const auto now = _directory.lastOpenTable();
-    // Nothing open yet, when watching begins, is no change to the table that comes first.
-    if (now != table && table) {
+    const auto now = _directory.awaitedTable();
+    if (now != table) {
       since = Clock::now();
       told = false;
     }

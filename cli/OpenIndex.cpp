@@ -8,6 +8,7 @@
 #include "cli/IndexDirectory.h"
 #include "cli/Modes.h"
 #include "cli/TableLog.h"
+#include "cli/WaitingNote.h"
 
 namespace wordcatcher::cli {
 
@@ -16,6 +17,7 @@ namespace {
 Index openTables(const std::string& name, MatchingMode mode, bool verbose) {
   const IndexDirectory directory(name);
   const TableLog log(verbose);
+  const WaitingNote note("Reading " + name);
   std::optional<Index> index;
   directory.openForReading(log, [&] { index = Index::open(directory.path(), {}, mode); });
   return *index;

@@ -25,8 +25,8 @@ Examples:
 
 ExitCode runVerify(const std::string& name) {
   const Index index = [&] {
-    const WaitingNote note("Checking " + name);
     Index opened = openIndex(name, std::nullopt, false);
+    const WaitingNote note("Checking " + name);
     opened.verify();
     return opened;
   }();

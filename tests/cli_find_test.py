@@ -322,8 +322,14 @@ class StreamTest(TerminalTest):
 class WaitingTest(TerminalTest):
     tables = True
 
-    def test_checking_says_for_how_long_it_has_been_at_it(self):
+    def test_reading_tables_says_for_how_long_it_has_been_at_it(self):
         self.index()
+        for verb in (["find", "--color", "never"], ["verify"]):
+            with self.subTest(verb=verb):
+                self.expect_waiting(verb)
+
+    def expect_waiting(self, verb):
+        arguments = [*verb, self.dogs] + (["golden"] if verb[0] == "find" else [])
         with open(self.path("dogs", EDGES), "rb") as table:
             fcntl.flock(table, fcntl.LOCK_EX)
 
@@ -331,15 +337,17 @@ class WaitingTest(TerminalTest):
                 time.sleep(2.5)
                 fcntl.flock(table, fcntl.LOCK_UN)
 
-            shown = self.on_terminal("verify", self.dogs, meanwhile=unlock_late)
+            shown = self.on_terminal(*arguments, meanwhile=unlock_late)
         self.assertEqual(self.code, 0)
-        self.assertIn(f"\r\x1b[KChecking {self.dogs} ... 1 s", shown)
+        self.assertIn(f"\r\x1b[KReading {self.dogs} ... 1 s", shown)
         self.assertIn("\r\x1b[Kwordcatcher: waiting for", shown)
-        self.assertRegex(shown, r"\r\x1b\[K[^\r]* is whole: .*\n$")
+        self.assertRegex(shown, r"\r\x1b\[K[^\r]*(is whole: |\tgolden )[^\r]*\n$")
 
     def test_short_work_says_nothing(self):
         self.index()
-        self.assertNotIn("Checking", self.on_terminal("verify", self.dogs))
+        shown = self.on_terminal("verify", self.dogs)
+        self.assertNotIn("Checking", shown)
+        self.assertNotIn("Reading", shown)
 
 
 class ExplainTest(cli_test.CommandTest):
