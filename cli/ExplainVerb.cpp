@@ -62,8 +62,11 @@ void addExplainVerb(CLI::App& program, ChosenVerb& chosen) {
   const auto arguments = std::make_shared<Arguments>();
   auto* const query =
       verb->add_flag("--query", arguments->query, "Explain the distance of \"wordcatcher query\"");
-  for (auto* const option : addMatchOptions(*verb, arguments->options)) {
-    option->excludes(query);
+  for (const auto& options :
+       {addListOptions(*verb, arguments->options), addMatchOptions(*verb, arguments->options)}) {
+    for (auto* const option : options) {
+      option->excludes(query);
+    }
   }
   verb->add_flag("--json", arguments->json, "Print a JSON object");
   addModeOption(*verb, arguments->mode,

@@ -90,20 +90,23 @@ std::vector<CLI::Option*> addMatchOptions(CLI::App& verb, FindOptions& options) 
   return {maxCost, minWords, edits, transpositions};
 }
 
-void addListOptions(CLI::App& verb, FindOptions& options) {
-  addCount(verb, "--limit", options.limit, 0, "Matches a text at the most, the best ones")
-      ->default_str(std::to_string(options.limit));
-  verb.add_option_function<std::string>(
-          "--overlaps",
-          [&options](const std::string& name) { options.overlaps = kOverlaps.at(name); },
-          "Matches whose ranges in the text overlap.\nall: every one"
-          "\nno-sub: none within the larger range of another"
-          "\nlongest: those with the longest range\nDefault: all")
-      ->check(CLI::IsMember(std::vector<std::string>{"all", "no-sub", "longest"}))
-      ->type_name("WHICH");
-  addCount(verb, "--max-postings", options.maxPostings, 0,
-           "Phrases under the words of a text that are looked at")
-      ->default_str(std::to_string(options.maxPostings));
+std::vector<CLI::Option*> addListOptions(CLI::App& verb, FindOptions& options) {
+  auto* const limit =
+      addCount(verb, "--limit", options.limit, 0, "Matches a text at the most, the best ones")
+          ->default_str(std::to_string(options.limit));
+  auto* const overlaps =
+      verb.add_option_function<std::string>(
+              "--overlaps",
+              [&options](const std::string& name) { options.overlaps = kOverlaps.at(name); },
+              "Matches whose ranges in the text overlap.\nall: every one"
+              "\nno-sub: none within the larger range of another"
+              "\nlongest: those with the longest range\nDefault: all")
+          ->check(CLI::IsMember(std::vector<std::string>{"all", "no-sub", "longest"}))
+          ->type_name("WHICH");
+  auto* const maxPostings = addCount(verb, "--max-postings", options.maxPostings, 0,
+                                     "Phrases under the words of a text that are looked at")
+                                ->default_str(std::to_string(options.maxPostings));
+  return {limit, overlaps, maxPostings};
 }
 
 }  // namespace wordcatcher::cli

@@ -12,13 +12,14 @@ class Option;
 
 namespace wordcatcher::cli {
 
-// Both add options to a verb; `options` must live until the command line was parsed.
+// Both add options to a verb, for finding as for explaining, and return them; `options` must live
+// until the command line was parsed.
 
-/// What counts as a match: the same for finding and for explaining. Returns the options added.
+/// What counts as a match.
 std::vector<CLI::Option*> addMatchOptions(CLI::App& verb, FindOptions& options);
 
 /// Which of the matches are listed.
-void addListOptions(CLI::App& verb, FindOptions& options);
+std::vector<CLI::Option*> addListOptions(CLI::App& verb, FindOptions& options);
 
 }  // namespace wordcatcher::cli
 

@@ -1,11 +1,13 @@
 # What `cmake --install` gives a host: the library, its headers, a CMake package and a pkg-config
-# file.
+# file. The component `library` is what a compiled host needs, `development` what compiling one needs
+# beside it.
 include(CMakePackageConfigHelpers)
+set(CMAKE_INSTALL_DEFAULT_COMPONENT_NAME development)
 
 set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/wordcatcher)
 
 install(TARGETS wordcatcher EXPORT wordcatcherTargets
-  LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
+  LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT library NAMELINK_COMPONENT development
   FILE_SET HEADERS DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}
   FILE_SET generated_headers DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 install(EXPORT wordcatcherTargets NAMESPACE wordcatcher:: DESTINATION ${package_dir})

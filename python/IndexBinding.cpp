@@ -161,7 +161,7 @@ std::string valueUtf8(const py::str& value) {
   std::string utf8 = storedUtf8(value);
   if (utf8 != searchedUtf8(value)) {
     throw Error(ErrorCode::badInput,
-                "The value holds a lone surrogate, which no stored value does.");
+                "The value holds a lone surrogate, which no stored value does; take it out.");
   }
   return utf8;
 }

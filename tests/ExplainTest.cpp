@@ -177,6 +177,49 @@ TEST(ExplainTest, TellsWhyAPhraseIsAbsent) {
                {"Only 2 of its words are", "cost of 1 "});
 }
 
+TEST(ExplainTest, TellsWhyAMatchIsNotListed) {
+  const auto index = indexOf(Entries{{"New York", "New York"},
+                                     {"York", "York"},
+                                     {"York Minster", "York Minster"},
+                                     {"York Minster School", "York Minster School"}});
+  const std::string text = "new york minster";
+  FindOptions options;
+  options.limit = 3;
+  expectAbsent(index.explain(text, "York", options), {"not among the first 3"});
+  options.limit = 4;
+  EXPECT_TRUE(index.explain(text, "York", options).isFound);
+  options.overlaps = Overlaps::noSub;
+  expectAbsent(index.explain(text, "York", options), {"within the larger one"});
+  EXPECT_TRUE(index.explain(text, "New York", options).isFound);
+  options.overlaps = Overlaps::longest;
+  EXPECT_TRUE(index.explain(text, "York Minster", options).isFound);
+  expectAbsent(index.explain(text, "New York", options), {"overlaps that of another match"});
+  expectAbsent(index.explain(text, "York", options), {"overlaps that of another match"});
+  options.limit = 0;
+  expectAbsent(index.explain(text, "York Minster", options), {"not among the first 0"});
+}
+
+TEST(ExplainTest, TellsOfTheBudgetOfPostings) {
+  const auto index = indexOf(
+      Entries{{"Lake Geneva", "Geneva"}, {"Lake Como", "Como"}, {"Lake Constance", "Constance"}});
+  FindOptions options;
+  options.maxPostings = 2;
+  const auto found = index.find("lake", options);
+  ASSERT_TRUE(found.truncated);
+  std::size_t listed = 0;
+  for (const std::string value : {"Geneva", "Como", "Constance"}) {
+    const auto explained = index.explain("lake", value, options);
+    const bool isListed = std::any_of(found.matches.begin(), found.matches.end(),
+                                      [&](const auto& match) { return match.value == value; });
+    listed += isListed ? 1 : 0;
+    EXPECT_EQ(explained.isFound, isListed) << value;
+    if (!isListed) {
+      expectAbsent(explained, {"budget of postings"});
+    }
+  }
+  EXPECT_LT(listed, 3U);
+}
+
 TEST(ExplainTest, NumbersAreNotNear) {
   const auto explained = places().explain("route 67", "Route 66");
   ASSERT_EQ(explained.words.size(), 2U);

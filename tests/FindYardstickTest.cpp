@@ -193,6 +193,27 @@ TEST(FindYardstickTest, EveryLimitGivesTheFirstOfAll) {
   }
 }
 
+TEST(FindYardstickTest, EveryLimitWhereAPhraseHoldsSeveralNearWords) {
+  // "Stone" is as near to "stove" as to "store". The phrase that holds both is paired by the more
+  // frequent one, so it comes behind those of the rarer one, whose list it stands first in.
+  Entries entries = {{"stove store", "both"}};
+  const auto add = [&entries](const std::string& word, std::size_t count, std::size_t length) {
+    for (std::size_t i = 0; i < count; ++i) {
+      const std::string other(length, static_cast<char>('f' + i));
+      entries.emplace_back(word + ' ' + other, word + ' ' + other);
+    }
+  };
+  add("shone", 4, 4);
+  add("store", 2, 9);
+  add("stove", 5, 5);
+  const Both both(entries);
+  for (const std::string text : {"stone", "a stone", "stone age stone"}) {
+    const auto all = both.expectSame(text, unlimited());
+    EXPECT_EQ(all.size(), entries.size()) << text;
+    both.expectBeginnings(text, unlimited(), all);
+  }
+}
+
 TEST(FindYardstickTest, EveryBoundOfCostAndWords) {
   const Both all(asEntries(allRows({"a", "ab", "ba"}, 2)));
   for (const auto& text : allRows({"a", "b", "ba"}, 2)) {

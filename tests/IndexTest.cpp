@@ -210,6 +210,27 @@ TEST_P(WordIndexTest, WhatCannotBeOpenedIsASentence) {
   EXPECT_EQ(codeOf([&] { Index::open(path); }), ErrorCode::damaged);
 }
 
+TEST_P(WordIndexTest, TheSentenceOfWhatCannotBeOpenedSaysWhatToDo) {
+  buildWords();
+  std::filesystem::create_directory(directory.file("empty"));
+  std::filesystem::create_directory(directory.file("short"));
+  for (const std::string table : {"edgeTable.tdb", "dataTable.tdb", "finalTable.tdb"}) {
+    writeFile(directory.file("short/" + table), "short");
+  }
+  for (const std::string& name :
+       {std::string("missing.wci"), std::string("empty"), std::string("short"),
+        std::string("edgeTable.tdb"), std::string(300, 'n')}) {
+    try {
+      Index::open(directory.file(name));
+      ADD_FAILURE() << name << " was opened";
+    } catch (const Error& error) {
+      const std::string sentence = error.what();
+      EXPECT_NE(sentence.find("; "), std::string::npos) << sentence;
+      EXPECT_TRUE(sentence.ends_with('.')) << sentence;
+    }
+  }
+}
+
 TEST_P(WordIndexTest, ACopySurvivesAFileThatShrinks) {
   const std::string path = buildWords();
   const Index index = Index::open(path, {.load = Index::Load::copy});

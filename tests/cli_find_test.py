@@ -369,6 +369,13 @@ class ExplainTest(cli_test.CommandTest):
         self.assertEqual((told["isStored"], told["isFound"]), (True, False))
         self.assertEqual(len(told["objections"]), 1)
 
+    def test_a_match_that_the_limit_or_an_overlap_cuts_off_has_a_reason(self):
+        text = "my goldan retriver"
+        self.succeed("explain", "--limit", "2", self.dogs, text, BRIDGE)
+        for cut, reason in ((("--limit", "1"), "first 1 "), (("--overlaps", "no-sub"), "range")):
+            self.assertEqual(self.run_it("explain", *cut, self.dogs, text, BRIDGE), 1, self.out)
+            self.assertIn(reason, self.out)
+
     def test_query_explains_the_classic_distance(self):
         text = "goldan retriver pupy"
         distance = json.loads(self.succeed("query", "--json", self.dogs, text))["matches"][0]
@@ -381,6 +388,8 @@ class ExplainTest(cli_test.CommandTest):
         self.fail_with("VALUE", of=["explain", self.dogs, "golden"])
         self.fail_with("--query", "--max-cost",
                        of=["explain", "--query", "--max-cost", "1", self.dogs, "golden", BRIDGE])
+        self.fail_with("--query", "--limit",
+                       of=["explain", "--query", "--limit", "1", self.dogs, "golden", BRIDGE])
 
 
 class TablesExplainTest(ExplainTest):

@@ -318,8 +318,8 @@ WORDCATCHER_EXPORT void wordcatcher_matches_free(wordcatcher_matches* matches);
 typedef struct wordcatcher_explanation wordcatcher_explanation;
 
 /** Why a value (a data string) has its cost for a text, or why wordcatcher_index_find() does not
-   list it with these options, which may be NULL. Linear in the values of the index. Fails as
-   wordcatcher_index_find() does. */
+   list it with these options, which may be NULL. Linear in the values of the index, beside some
+   calls of wordcatcher_index_find(), as which it fails. */
 WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_explain(
     const wordcatcher_index* index, const char* text, size_t text_length, const char* value,
     size_t value_length, const wordcatcher_find_options* options,
@@ -342,7 +342,7 @@ WORDCATCHER_EXPORT const char* wordcatcher_explanation_text(
 WORDCATCHER_EXPORT bool wordcatcher_explanation_is_stored(
     const wordcatcher_explanation* explanation);
 
-/** Whether the explained call lists the value (limit and overlaps aside). */
+/** Whether the explained call lists the value. */
 WORDCATCHER_EXPORT bool wordcatcher_explanation_is_found(
     const wordcatcher_explanation* explanation);
 

@@ -135,6 +135,8 @@ def test_explain(index: Index) -> None:
     assert "Paired: trinidat with trinidad, 1 edit\n" in str(explanation)
     assert '"begin":2,"end":10' in explanation.to_json()
     assert not index.explain("trinidat", "Tobago").is_stored
+    assert index.explain("trinidat", "Trinidad and Tobago", limit=1).is_found
+    assert not index.explain("trinidat", "Trinidad and Tobago", limit=0).is_found
     with pytest.raises(Error) as failure:
         index.explain("trinidat", "Tobago\udcff")
     assert failure.value.code == "bad_input"

@@ -106,7 +106,7 @@ struct WORDCATCHER_EXPORT FindExplanation {
   std::string value;  ///< the host's
 
   bool isStored = false;                ///< whether the index holds the value
-  bool isFound = false;                 ///< whether find() lists it, limit and overlaps aside
+  bool isFound = false;                 ///< whether find() lists it
   bool truncated = false;               ///< whether a budget cut words of the text off
   std::vector<TextWord> words;          ///< of the text, in its order
   std::vector<std::string> phrase;      ///< the words of the phrase that fits best

@@ -6,6 +6,7 @@
 #include <map>
 #include <numeric>
 #include <set>
+#include <string>
 #include <utility>
 
 #include "wordcatcher/fuzzy/EditDistance.h"
@@ -186,6 +187,36 @@ void object(const RankedPhrase& phrase, const FindOptions& options, FindExplanat
   }
 }
 
+bool lists(const FindResult& result, std::string_view value) {
+  return std::any_of(result.matches.begin(), result.matches.end(),
+                     [value](const FoundPhrase& match) { return match.value == value; });
+}
+
+/// Why a value that matches is not listed all the same; nothing if it is.
+std::optional<std::string> omissionOf(const SearchImage& image, const FindText& text,
+                                      std::string_view value, FindOptions options, bool joins) {
+  const Overlaps overlaps = options.overlaps;
+  const std::size_t limit = options.limit;
+  const FindResult result = findPhrases(image, text, options, joins);
+  if (lists(result, value)) {
+    return std::nullopt;
+  }
+  options.limit = std::numeric_limits<std::size_t>::max();
+  const bool isCutByLimit = (overlaps == Overlaps::all && !result.truncated) ||
+                            lists(findPhrases(image, text, options, joins), value);
+  if (isCutByLimit) {
+    return "It is not among the first " + std::to_string(limit) + " in order, which is the limit.";
+  }
+  options.overlaps = Overlaps::all;
+  if (overlaps != Overlaps::all && lists(findPhrases(image, text, options, joins), value)) {
+    return overlaps == Overlaps::noSub
+               ? "Its range in the text lies within the larger one of another match."
+               : "Its range in the text overlaps that of another match, which is longer or comes "
+                 "first.";
+  }
+  return "The budget of postings was used up before it was looked at.";
+}
+
 }  // namespace
 
 std::optional<std::uint32_t> valueNumber(const SearchImage& image, std::string_view value) {
@@ -229,14 +260,16 @@ FindExplanation explainFind(const SearchImage& image, const FindText& text, std:
   const auto admitted = finder.judge(*number);
   const RankedPhrase phrase = admitted ? *admitted : finder.judgeAnyway(*number);
   auto pairs = finder.pairsOf(phrase);
-  explanation.isFound = admitted.has_value();
   explanation.cost = phrase.cost;
   explanation.words = comparedWords(image, text, phrase, options.transpositions);
   listUnpaired(image, text, phrase, pairs, explanation);
   explanation.pairs = hitsOf(image, text, phrase, std::move(pairs));
   if (!admitted) {
     object(phrase, options, explanation);
+  } else if (auto omission = omissionOf(image, text, value, options, joins)) {
+    explanation.objections.push_back(*std::move(omission));
   }
+  explanation.isFound = explanation.objections.empty();
   return explanation;
 }
 

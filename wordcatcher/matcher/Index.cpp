@@ -51,7 +51,8 @@ bool exists(const std::string& path) {
 [[noreturn]] void throwNoTable(const std::string& prefix, const std::string& table, int code) {
   throw Error(code == ENOENT ? ErrorCode::notFound : ErrorCode::notReadable,
               "There is no classic index at " + prefix + ": " + table + " cannot be read (" +
-                  std::generic_category().message(code) + ").");
+                  std::generic_category().message(code) +
+                  "); check the path, or index the phrases again with tables there.");
 }
 
 /// The tables' own failures are only lines in the log, so what can be told beforehand is told here.
@@ -132,7 +133,8 @@ Index Index::open(const std::string& path, const Options& options, MatchingMode 
     checkFinished(prefix);
     if (tables.getMode() != kReading) {
       throw Error(ErrorCode::notReadable,
-                  "The classic index at " + prefix + " cannot be opened; the log says why.");
+                  "The classic index at " + prefix +
+                      " cannot be opened; see in the log which table failed, and index again.");
     }
     return Index(
         std::make_shared<const State>(State{tables.sharedImage(), mode, options, WordSegmenter()}));
@@ -142,7 +144,8 @@ Index Index::open(const std::string& path, const Options& options, MatchingMode 
   const std::uint32_t stored = image->header().mode;
   if (stored > modeNumber(MatchingMode::phoneticWords)) {
     throw Error(ErrorCode::notAnIndex, "The search image " + path +
-                                           " has a matching mode that this version does not know.");
+                                           " has a matching mode that this version does not know; "
+                                           "use a newer version, or build it again.");
   }
   return Index(std::make_shared<const State>(
       State{std::move(image), static_cast<MatchingMode>(stored), options, WordSegmenter()}));

@@ -126,8 +126,8 @@ class WORDCATCHER_EXPORT Index {
   /// The same with options: how many, how far, which of those that overlap.
   FindResult find(std::string_view text, const FindOptions& options) const;
 
-  /// Why a value has its cost for a text, or why find() does not list it. Linear in the index's
-  /// values. Throws as find() does.
+  /// Why a value has its cost for a text, or why find() does not list it with these options. Linear
+  /// in the index's values, beside some calls of find(). Throws as find() does.
   FindExplanation explain(std::string_view text, std::string_view value) const;
 
   /// The same for what find() does with these options.

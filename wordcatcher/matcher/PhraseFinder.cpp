@@ -199,7 +199,9 @@ void PhraseFinder::judgeAll(std::span<const std::uint32_t> values) {
       return;
     }
     if (_judged.insert(value).isNew) {
-      judgeAndKeep(value);
+      if (const auto phrase = judge(value)) {
+        keep(*phrase);
+      }
     }
   }
 }
@@ -326,20 +328,22 @@ void PhraseFinder::read(const Segment& segment) {
     if (!spendPosting()) {
       return;
     }
-    if (_judged.insert(value).isNew && !judgeAndKeep(value) && isAlone) {
+    if (_judged.insert(value).isNew && !judgeAndKeep(value, source) && isAlone) {
       return;
     }
   }
 }
 
 /// False when the value is not kept, nor would be any value behind it of the same class that shares
-/// the same one word with the text: one with several phrases says nothing about those.
-bool PhraseFinder::judgeAndKeep(std::uint32_t value) {
+/// just the source's word with the text. One with several phrases says nothing about those, nor one
+/// that is paired by another of its words, under which there are more phrases.
+bool PhraseFinder::judgeAndKeep(std::uint32_t value, const Source& source) {
   const auto phrase = judge(value);
   if (!phrase) {
     return true;
   }
-  return keep(*phrase) || phrase->phrase.size() != _image.phrasesOf(value).size();
+  return keep(*phrase) || phrase->phrase.size() != _image.phrasesOf(value).size() ||
+         phrase->rarity > source.values.size();
 }
 
 /// Whether the phrase is among the best so far.

@@ -113,7 +113,7 @@ class PhraseFinder {
   bool isOfOneLength(const Segment& segment) const;
   void judgeJoined();
   void judgeAll(std::span<const std::uint32_t> values);
-  bool judgeAndKeep(std::uint32_t value);
+  bool judgeAndKeep(std::uint32_t value, const Source& source);
   bool spendPosting();
   bool keep(const RankedPhrase& phrase);
   bool isFull() const noexcept { return _kept.size() >= _limit; }

@@ -45,7 +45,8 @@ class Descriptor {
     throw Error(ErrorCode::notFound, "There is no index at " + path + " (" + reason +
                                          "); check the path, or build one there.");
   }
-  throw Error(ErrorCode::notReadable, "The index " + path + " cannot be read (" + reason + ").");
+  throw Error(ErrorCode::notReadable, "The index " + path + " cannot be read (" + reason +
+                                          "); check its permissions and its path.");
 }
 
 std::vector<std::byte> readAll(int descriptor, std::size_t bytes, const std::string& path) {
