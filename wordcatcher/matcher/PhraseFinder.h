@@ -22,8 +22,10 @@
 #include <cstdint>
 #include <optional>
 #include <span>
+#include <string>
 #include <vector>
 
+#include "wordcatcher/fuzzy/NearWords.h"
 #include "wordcatcher/matcher/Find.h"
 #include "wordcatcher/matcher/FindText.h"
 #include "wordcatcher/matcher/NumberIndex.h"
@@ -42,6 +44,7 @@ struct RankedPhrase {
   std::uint64_t length = 0;  // words of the phrase
   std::uint32_t value = 0;
   std::span<const std::uint32_t> phrase;  // its words in the image, flag and all
+  std::uint64_t steps = 0;                // that were left when it was paired
 };
 
 /// Finds the phrases of one text. Used once, by one thread. Throws Error (damaged).
@@ -61,7 +64,7 @@ class PhraseFinder {
   /// The same, whatever its cost is and however few of its words are paired.
   RankedPhrase judgeAnyway(std::uint32_t value);
 
-  /// The pairs of a phrase, in its order.
+  /// The pairs of a phrase that was judged, in its order: the ones that it was judged by.
   std::vector<Pair> pairsOf(const RankedPhrase& phrase);
 
   /// Whether a budget cut something off.
@@ -98,6 +101,7 @@ class PhraseFinder {
   };
 
   void lookUpWords();
+  std::u16string textOf(const NearWord& near, std::size_t length) const;
   void lookUpJoins();
   void lookUpSplits();
   void makeTable();
@@ -139,6 +143,7 @@ class PhraseFinder {
   Pairing _pairing;
   std::uint64_t _postings;  // budgets that are left
   std::uint64_t _steps;
+  std::uint64_t _phraseWords;  // that may still be read of phrases, each value being read once
   bool _truncated = false;
   NumberIndex _judged;
   std::vector<RankedPhrase> _kept;  // a heap, the last in order on top, once it is full
