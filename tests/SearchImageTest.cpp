@@ -301,9 +301,9 @@ std::map<SectionKind, std::size_t> unseenFlips(const ImageBytes& good) {
 }
 
 TEST(DamagedImageTest, OnlyContentNeedsItsChecksum) {
-  // Another letter or number of words, or a border between two data strings elsewhere, makes another
-  // image that is as good. What has one right value, given the rest, is checked against it; so are
-  // words whose letters all stand in the trees, as they do here.
+  // Another letter or number of words, or a border between two data strings elsewhere, makes
+  // another image that is as good. What has one right value, given the rest, is checked against it;
+  // so are words whose letters all stand in the trees, as they do here.
   const std::set<SectionKind> content = {SectionKind::labels, SectionKind::valueOffsets,
                                          SectionKind::valueText, SectionKind::countedWords};
   const ImageBytes bytes = testing::riverImage();

@@ -11,8 +11,8 @@ namespace wordcatcher {
 
 namespace {
 
-// Up to this many postings, or this part of all values, sorting them costs less than marking them in
-// an array of all values.
+// Up to this many postings, or this part of all values, sorting them costs less than marking them
+// in an array of all values.
 constexpr std::size_t kShortLists = 4096;
 constexpr std::size_t kShortPart = 16;
 

@@ -35,8 +35,8 @@ class WORDCATCHER_EXPORT KXMetaphone {
   /// Throws std::runtime_error if ICU's data, which holds them, is missing.
   KXMetaphone();
 
-  /// The same, with a copy of rules that are loaded already, at a tenth of the cost. Several threads
-  /// may make theirs from the same rules while nobody uses these.
+  /// The same, with a copy of rules that are loaded already, at a tenth of the cost. Several
+  /// threads may make theirs from the same rules while nobody uses these.
   explicit KXMetaphone(const WordSegmenter& rules);
 
   ~KXMetaphone();
