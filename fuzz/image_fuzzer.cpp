@@ -40,7 +40,7 @@ void ask(const SearchImage& image, std::u16string_view query, std::int64_t dista
   std::uint64_t values = 0;
   for (const auto& hit : hits) {
     require(hit.distance <= distance);
-    require(image.textOf(hit.word).size() == hit.length);
+    require(image.textOf(hit.word, hit.length).size() == hit.length);
     for (const std::uint32_t value : image.postingsOf(hit.word)) {
       require(image.valueText(value).size() <= image.bytes().size());
       image.countedWordsOf(value);

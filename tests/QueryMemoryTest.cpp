@@ -27,7 +27,7 @@ using testing::TemporaryDirectory;
 constexpr std::size_t kBytesPerWordUnit = 64;
 constexpr std::size_t kBytesPerTextByte = 32;
 constexpr std::size_t kBytesPerPosting = 64;
-constexpr std::size_t kFixedBytes = 16384;
+constexpr std::size_t kFixedBytes = 1U << 19U;
 constexpr std::size_t kBytesPerIndexWord = 16;
 constexpr std::size_t kBytesPerWordOfFind = 512;
 
@@ -248,6 +248,36 @@ TEST_P(QueryMemoryTest, OfManyValues) {
   many.expectWithinBound("one word", "lake");
   // Words that find nothing put every phrase out of reach, so that nothing is due to the result.
   many.expectWithinBound("no matches", "lake wxwxwxwx zyzyzyzy");
+}
+
+TEST_P(QueryMemoryTest, OfAValueWithManyPhrases) {
+  const TemporaryDirectory directory;
+  const std::string path = directory.file("phrases.wci");
+  IndexBuilder builder(path, {.mode = GetParam(), .tables = {}});
+  for (int i = 0; i < 100000; ++i) {
+    builder.add("lake" + std::to_string(i), "lakes");
+  }
+  builder.add("new island", "lakes");
+  builder.commit();
+  Opened many(path, GetParam());
+  many.expectWithinBound("two words", "new island");
+  std::string words = "new island";
+  for (char letter = 'a'; letter <= 'z'; ++letter) {
+    words += std::string(" new") + letter + " island" + letter;
+  }
+  many.expectWithinBound("many words", words);
+}
+
+TEST_P(QueryMemoryTest, OfTextsThatRepeatTheWordsOfAPhrase) {
+  const TemporaryDirectory directory;
+  const std::string path = directory.file("phrases.wci");
+  IndexBuilder builder(path, {.mode = GetParam(), .tables = {}});
+  builder.add(repeated("duran ", 1500), "many");
+  builder.add("duranduran duran", "joined");
+  builder.commit();
+  Opened duran(path, GetParam());
+  duran.expectWithinBound("one word over and over", repeated("duran ", 6000));
+  duran.expectWithinBound("two words over and over", repeated("duran durane ", 6000));
 }
 
 TEST_P(QueryMemoryTest, OfManyLetters) {

@@ -14,6 +14,7 @@ namespace {
 using image::TreeSlot;
 
 constexpr std::size_t kMaxJoined = 64;
+constexpr std::uint32_t kNoWord = UINT32_MAX;
 
 std::vector<std::uint16_t> labelsOf(const SearchImage& image, std::u16string_view word) {
   std::vector<std::uint16_t> labels;
@@ -163,24 +164,19 @@ std::optional<std::uint32_t> exactWord(const SearchImage& image, std::u16string_
 std::vector<std::pair<std::uint32_t, std::uint32_t>> wordsJoinedIn(const SearchImage& image,
                                                                    std::u16string_view word) {
   auto labels = labelsOf(image, word);
-  // By length: each length has one word at the most, and a damaged image may tell of many.
-  constexpr std::uint32_t kNone = UINT32_MAX;
-  std::vector<std::uint32_t> heads;
+  // By length: words differ, so at most one of each length is the word's beginning.
+  std::vector<std::uint32_t> heads(labels.size(), kNoWord);
   forEachWordAlong(image, false, labels, [&](std::uint32_t other, std::size_t length) {
     if (length > 0 && length < labels.size()) {
-      heads.resize(labels.size(), kNone);
       heads[length] = other;
     }
   });
   std::vector<std::pair<std::uint32_t, std::uint32_t>> joined;
-  if (heads.empty()) {
-    return joined;
-  }
   std::reverse(labels.begin(), labels.end());
   forEachWordAlong(image, true, labels, [&](std::uint32_t other, std::size_t length) {
-    const std::size_t headLength = labels.size() - length;
-    if (length > 0 && headLength > 0 && heads[headLength] != kNone && joined.size() < kMaxJoined) {
-      joined.emplace_back(heads[headLength], other);
+    if (length > 0 && length < labels.size() && heads[labels.size() - length] != kNoWord &&
+        joined.size() < kMaxJoined) {
+      joined.emplace_back(heads[labels.size() - length], other);
     }
   });
   return joined;

@@ -30,8 +30,8 @@ std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view wo
 /// The word of the image that is this one. Linear in the word.
 std::optional<std::uint32_t> exactWord(const SearchImage& image, std::u16string_view word);
 
-/// Pairs of words of the image which, written as one, are this word. Linear in the word, a search
-/// of words with very many common beginnings and ends aside: at most 64 pairs are looked at.
+/// Pairs of words of the image which, written as one, are this word: at most 64. Linear in the
+/// word.
 std::vector<std::pair<std::uint32_t, std::uint32_t>> wordsJoinedIn(const SearchImage& image,
                                                                    std::u16string_view word);
 

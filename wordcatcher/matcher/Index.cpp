@@ -109,7 +109,9 @@ struct Index::State {
   }
 
   /// A word of the image as UTF-8; unpaired surrogates, which no text has, appear as U+FFFD.
-  std::string wordText(std::uint32_t word) const { return displayUtf8(image->textOf(word)); }
+  std::string wordText(const WordHit& hit) const {
+    return displayUtf8(image->textOf(hit.word, hit.length));
+  }
 
   FindText cut(std::string_view text, const EditLimits& limits) const;
 
@@ -170,7 +172,7 @@ Index::QueryResult Index::State::queryWholeText(const std::u16string& text) cons
   });
   result.matches.reserve(hits.size());
   for (const auto& hit : hits) {
-    result.matches.push_back({wordText(hit.word), hit.distance, dataOf(hit.word)});
+    result.matches.push_back({wordText(hit), hit.distance, dataOf(hit.word)});
   }
   return result;
 }
@@ -232,7 +234,7 @@ Index::SearchResult Index::search(std::string_view word, std::int64_t maxDistanc
   const auto hits = searchImage(*_state->image, toLower(*units), maxDistance);
   result.matches.reserve(hits.size());
   for (const auto& hit : hits) {
-    result.matches.push_back({_state->wordText(hit.word), hit.distance, _state->dataOf(hit.word)});
+    result.matches.push_back({_state->wordText(hit), hit.distance, _state->dataOf(hit.word)});
   }
   return result;
 }

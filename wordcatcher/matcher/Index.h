@@ -32,7 +32,7 @@ namespace wordcatcher {
 /// that texts of strangers cannot make it run away. Beside its result a query needs at most
 /// 64 bytes for each code unit of its longest word, 32 for each byte of the text and 64 for each
 /// posting of the words that it finds (a word without any counts as one), and, whatever the text,
-/// 16 KB and 16 bytes for each word of the index. find() needs 512 bytes for each word of the text
+/// 512 KB and 16 bytes for each word of the index. find() needs 512 bytes for each word of the text
 /// more; what it finds are the words within the edit limits.
 class WORDCATCHER_EXPORT Index {
  public:

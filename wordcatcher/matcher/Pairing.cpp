@@ -10,6 +10,11 @@ namespace {
 // Longer phrases are paired word by word: trying all goes as deep as there are words.
 constexpr std::size_t kMaxTriedWords = 256;
 
+// A phrase that repeats words of a text that repeats them has as many ways of pairing as both have
+// words, multiplied.
+constexpr std::size_t kFewOptions = 4096;
+constexpr std::size_t kOptionsATextWord = 8;
+
 auto quality(const PairingScore& score) {
   return std::make_tuple(score.gain, score.words, score.exact, ~score.breaks);
 }
@@ -32,6 +37,10 @@ void Pairing::start() {
 void Pairing::nextWord() { ++_phraseWords; }
 
 void Pairing::add(const PairOption& option) {
+  if (_options.size() >= kFewOptions && _options.size() / kOptionsATextWord >= _used.size()) {
+    _isExact = false;
+    return;
+  }
   const std::uint32_t position = _phraseWords - 1;
   const auto number = static_cast<std::uint32_t>(_options.size());
   if (_words.empty() || _words.back().position != position) {
@@ -227,6 +236,8 @@ void Pairing::tryFrom(std::size_t word, std::uint64_t& steps) {
     return;
   }
   const Word& at = _words[word];
+  // Also those that are taken, of which there may be many.
+  steps -= std::min<std::uint64_t>(steps, at.endOption - at.firstOption);
   const bool isTaken =
       !_current.empty() &&
       _current.back().phrasePosition + _current.back().option.phraseWords > at.position;

@@ -54,7 +54,8 @@ class Pairing {
   explicit Pairing(std::size_t textWords) : _used(textWords) {}
 
   /// Begins a phrase, and names the ways of pairing its words: nextWord() for each word in order,
-  /// each followed by its options, ascending by position.
+  /// each followed by its options, ascending by position. What goes beyond 4,096 options and 8 a
+  /// word of the text is left out, and isExact() is false from then on.
   void start();
   void nextWord();
   void add(const PairOption& option);

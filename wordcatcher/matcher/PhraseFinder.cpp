@@ -7,7 +7,6 @@
 #include <tuple>
 #include <unordered_map>
 
-#include "wordcatcher/fuzzy/NearWords.h"
 #include "wordcatcher/storage/PhraseWords.h"
 #include "wordcatcher/text/CodeUnitOrder.h"
 
@@ -37,7 +36,8 @@ PhraseFinder::PhraseFinder(const SearchImage& image, const FindText& text,
       _options(options),
       _pairing(text.words.size()),
       _postings(options.maxPostings),
-      _steps(options.maxPostings * kStepsAPosting) {
+      _steps(options.maxPostings * kStepsAPosting),
+      _phraseWords(image.phraseWordCount()) {
   lookUpWords();
   if (joins) {
     lookUpJoins();
@@ -57,8 +57,8 @@ void PhraseFinder::lookUpWords() {
     if (isNew) {
       place->second = nearWords(_image, word.word, word.limit, _options.transpositions);
       if (_text.hasNumbers && !holdsDigit(word.word)) {
-        std::erase_if(place->second, [this](const NearWord& near) {
-          return near.edits > 0 && holdsDigit(_image.textOf(near.word));
+        std::erase_if(place->second, [&](const NearWord& near) {
+          return near.edits > 0 && holdsDigit(textOf(near, word.word.size()));
         });
       }
     }
@@ -66,6 +66,14 @@ void PhraseFinder::lookUpWords() {
       _wordOptions.push_back({near.word, {position, 1, 1, static_cast<std::uint8_t>(near.edits)}});
     }
   }
+}
+
+/// The text of a word near one of so many code units. In a damaged image it may be any length.
+std::u16string PhraseFinder::textOf(const NearWord& near, std::size_t length) const {
+  if (_image.labelsOf(near.word).size() > length + near.edits) {
+    _image.throwDamaged("a word is longer than its place in a tree says");
+  }
+  return _image.textOf(near.word);
 }
 
 /// Neighbours in the text that are one stored word.
@@ -149,6 +157,8 @@ void PhraseFinder::rankWords() {
 
 void PhraseFinder::makeSources() {
   _sources.reserve(_distinctWords);
+  // All lists together are no longer than all postings, so that what is made of them is bounded.
+  std::uint64_t postings = _image.postingCount();
   for (auto each = _wordOptions.begin(); each != _wordOptions.end();) {
     const std::uint32_t word = each->word;
     Source source = {UINT32_MAX, UINT32_MAX, _image.postingsOf(word)};
@@ -159,6 +169,10 @@ void PhraseFinder::makeSources() {
         source.edits = std::min<std::uint32_t>(source.edits, option.edits);
       }
     }
+    if (source.values.size() > postings) {
+      _image.throwDamaged("posting lists overlap");
+    }
+    postings -= source.values.size();
     if (source.edits != UINT32_MAX) {
       _sources.push_back(source);
     }
@@ -338,11 +352,16 @@ void PhraseFinder::read(const Segment& segment) {
 /// just the source's word with the text. One with several phrases says nothing about those, nor one
 /// that is paired by another of its words, under which there are more phrases.
 bool PhraseFinder::judgeAndKeep(std::uint32_t value, const Source& source) {
+  const std::uint64_t words = _image.phrasesOf(value).size();
+  if (words > _phraseWords) {
+    _image.throwDamaged("phrases overlap");
+  }
+  _phraseWords -= words;
   const auto phrase = judge(value);
   if (!phrase) {
     return true;
   }
-  return keep(*phrase) || phrase->phrase.size() != _image.phrasesOf(value).size() ||
+  return keep(*phrase) || phrase->phrase.size() != words ||
          phrase->rarity > source.values.size();
 }
 

@@ -22,8 +22,10 @@
 #include <cstdint>
 #include <optional>
 #include <span>
+#include <string>
 #include <vector>
 
+#include "wordcatcher/fuzzy/NearWords.h"
 #include "wordcatcher/matcher/Find.h"
 #include "wordcatcher/matcher/FindText.h"
 #include "wordcatcher/matcher/NumberIndex.h"
@@ -99,6 +101,7 @@ class PhraseFinder {
   };
 
   void lookUpWords();
+  std::u16string textOf(const NearWord& near, std::size_t length) const;
   void lookUpJoins();
   void lookUpSplits();
   void makeTable();
@@ -140,6 +143,7 @@ class PhraseFinder {
   Pairing _pairing;
   std::uint64_t _postings;  // budgets that are left
   std::uint64_t _steps;
+  std::uint64_t _phraseWords;  // that may still be read of phrases, each value being read once
   bool _truncated = false;
   NumberIndex _judged;
   std::vector<RankedPhrase> _kept;  // a heap, the last in order on top, once it is full

@@ -41,10 +41,8 @@ std::optional<SpanAnswer> SpanShortcut::run(std::u16string_view text) {
     return std::nullopt;
   }
   _candidates = candidatesOf(_words[*few]);
-  _ofCandidates.reserve(_candidates.size() * _words.size());
-  for (const std::uint32_t value : _candidates) {
-    const auto distances = distancesOf(value);
-    _ofCandidates.insert(_ofCandidates.end(), distances.begin(), distances.end());
+  if (!judgeCandidates()) {
+    return std::nullopt;
   }
   for (std::size_t word = 0; word < _words.size(); ++word) {
     bool bringsAnyCandidate = false;
@@ -147,6 +145,32 @@ std::vector<std::uint32_t> SpanShortcut::candidatesOf(const Word& word) const {
   return values;
 }
 
+/// False when that would take too long.
+bool SpanShortcut::judgeCandidates() {
+  _ofCandidates.reserve(_candidates.size() * _words.size());
+  for (const std::uint32_t value : _candidates) {
+    if (!spendOn(value)) {
+      return false;
+    }
+    const auto distances = distancesOf(value);
+    _ofCandidates.insert(_ofCandidates.end(), distances.begin(), distances.end());
+  }
+  return true;
+}
+
+/// Whether there is still room for what distancesOf() does. Once there is not, there is none for
+/// anything.
+bool SpanShortcut::spendOn(std::uint32_t value) {
+  const std::uint64_t comparisons =
+      _image.phrasesOf(value).size() * (_words.size() + kComparisonsAWord);
+  if (comparisons > _comparisons) {
+    _comparisons = 0;
+    return false;
+  }
+  _comparisons -= comparisons;
+  return true;
+}
+
 /// The distances of a stored word for the words of the text.
 std::span<const std::uint8_t> SpanShortcut::distancesOfWord(std::uint32_t word) {
   const auto [ordinal, isNew] = _judged.insert(word);
@@ -227,6 +251,9 @@ bool SpanShortcut::bringsOther(std::size_t a, std::size_t b) {
   for (const std::uint32_t hit : knownHits(a)) {
     const auto postings = _image.postingsOf(hit);
     for (const std::uint32_t value : postings.first(std::min(postings.size(), kWitnesses))) {
+      if (!spendOn(value)) {
+        return false;
+      }
       if (distancesOf(value)[b] == kNone) {
         return true;
       }

@@ -14,7 +14,8 @@
 //   some value tells the two apart.
 // - Are there as many hits as counted words? Mostly every word has one.
 //
-// Where a cheap answer is missing the query is left to SpanQuery.
+// Where a cheap answer is missing the query is left to SpanQuery; so it is where phrases are so
+// long, or so many under one value, that comparing them is not cheap.
 
 #include <cstdint>
 #include <memory>
@@ -58,7 +59,14 @@ class SpanShortcut {
   };
   static constexpr std::uint8_t kNone = UINT8_MAX;  // no distance
 
+  // Of a word of a phrase with one of the text. Bounds the time, whatever the image's bytes are,
+  // and the memory; a stored word is remembered as well, in the room of some distances.
+  static constexpr std::uint64_t kMaxComparisons = 1U << 16U;
+  static constexpr std::uint64_t kComparisonsAWord = 8;
+
   bool cut(std::u16string_view text);
+  bool judgeCandidates();
+  bool spendOn(std::uint32_t value);
   void addWord(std::u16string_view token);
   void lookUp(Word& word);
   std::uint64_t valuesOf(const Word& word) const;
@@ -78,6 +86,7 @@ class SpanShortcut {
   WordSegmenter& _segmenter;
   SpanQueryLimits _limits;
   bool _truncated = false;
+  std::uint64_t _comparisons = kMaxComparisons;  // that may still be made
   std::int64_t _countedWords = 0;
   std::vector<Word> _words;
   std::vector<std::size_t> _occurrences;  // of words in the text, in its order

@@ -40,6 +40,7 @@ class SearchImage {
   std::uint32_t valueCount() const noexcept { return _valueCount; }
   std::uint64_t unitCount() const noexcept { return _wordText.size(); }  // of all words
   std::uint64_t postingCount() const noexcept { return _postings.size(); }
+  std::uint64_t phraseWordCount() const noexcept { return _phraseWords.size(); }  // of all phrases
 
   /// The label of a code unit; 0 when no word holds it. Logarithmic in the number of labels.
   std::uint16_t labelOf(char16_t unit) const noexcept;
@@ -72,6 +73,15 @@ class SearchImage {
   }
 
   std::u16string textOf(std::uint32_t word) const;
+
+  /// The same for a word of so many code units, as a tree says. Throws Error (damaged) for another
+  /// length: words that overlap could make a text far longer than the image of many hits.
+  std::u16string textOf(std::uint32_t word, std::size_t length) const {
+    if (labelsOf(word).size() != length) {
+      throwDamaged("a word does not have the length of its place in a tree");
+    }
+    return textOf(word);
+  }
 
   /// One of the two trees, and the word that stands at each of its places.
   struct Tree {
