@@ -48,6 +48,7 @@ void ask(const SearchImage& image, std::u16string_view query, std::int64_t dista
     values += hit.values;
   }
   require(values <= image.postingCount());
+  require(wordcatcher::testing::queriesWithinBounds(image, query, distance));
   require(wordcatcher::testing::findsWithinBounds(image, query, distance));
 }
 

@@ -4,10 +4,32 @@
 #include <string>
 
 #include "wordcatcher/matcher/FoundPhrases.h"
+#include "wordcatcher/matcher/SpanShortcut.h"
 #include "wordcatcher/text/Unicode.h"
 #include "wordcatcher/text/WordSegmenter.h"
 
 namespace wordcatcher::testing {
+
+bool queriesWithinBounds(const SearchImage& image, std::u16string_view text, std::int64_t edits) {
+  static WordSegmenter segmenter;
+  constexpr std::size_t kMostWords = 100;
+  constexpr std::size_t kMostUnits = 1024;
+  const SpanQueryLimits limits = {std::clamp<std::int64_t>(edits, 0, 2), 2, 3, kMostWords,
+                                  kMostUnits};
+  std::u16string words(text);
+  words += u' ';
+  words += text.substr(text.size() / 2);
+  const auto isBounded = [&image](const std::optional<std::vector<ScoredValue>>& scored) {
+    return !scored || scored->size() <= image.valueCount();
+  };
+  if (const auto answer = SpanShortcut(image, segmenter, limits).run(words)) {
+    if (!isBounded(answer->scored)) {
+      return false;
+    }
+  }
+  std::int64_t wordsMatched = 0;
+  return isBounded(SpanQuery(image, segmenter, limits, wordsMatched).run(words));
+}
 
 bool findsWithinBounds(const SearchImage& image, std::u16string_view text, std::int64_t edits) {
   static WordSegmenter segmenter;

@@ -91,6 +91,7 @@ void ask(const SearchImage& image, std::u16string_view query, std::int64_t dista
     }
   }
   ASSERT_LE(values, image.postingCount());
+  ASSERT_TRUE(testing::queriesWithinBounds(image, query, distance));
   ASSERT_TRUE(testing::findsWithinBounds(image, query, distance));
 }
 
