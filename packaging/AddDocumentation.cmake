@@ -27,11 +27,7 @@ foreach(component IN LISTS CPACK_COMPONENTS_ALL)
   endforeach()
 
   write_copyright(${doc}/copyright "${CPACK_WORDCATCHER_${name}_CONTAINS}")
-  configure_file(${CPACK_WORDCATCHER_PACKAGING}/changelog ${doc}/changelog.Debian COPYONLY)
+  configure_file(${CPACK_WORDCATCHER_PACKAGING}/changelog ${doc}/changelog.Debian
+    COPYONLY NO_SOURCE_PERMISSIONS)
   compress(${doc}/changelog.Debian)
-
-  file(CHMOD_RECURSE ${share}
-    FILE_PERMISSIONS OWNER_READ OWNER_WRITE GROUP_READ WORLD_READ
-    DIRECTORY_PERMISSIONS
-      OWNER_READ OWNER_WRITE OWNER_EXECUTE GROUP_READ GROUP_EXECUTE WORLD_READ WORLD_EXECUTE)
 endforeach()
