@@ -8,8 +8,8 @@
 
 namespace wordcatcher::testing {
 
-/// Queries an image of any content for a text, in both ways: whether no more is found than the image
-/// has. Throws Error as they do.
+/// Queries an image of any content for a text, in both ways: whether no more is found than the
+/// image has. Throws Error as they do.
 bool queriesWithinBounds(const SearchImage& image, std::u16string_view text, std::int64_t edits);
 
 /// Finds the phrases of a text in an image of any content, and explains the first: whether what
