@@ -22,6 +22,7 @@
 #include "cli/InputLines.h"
 #include "cli/Output.h"
 #include "cli/ProgressBar.h"
+#include "cli/ReadingBar.h"
 
 namespace wordcatcher::cli {
 
@@ -61,10 +62,7 @@ class Texts {
   Texts(const std::vector<std::string>& texts, int stop) : _texts(texts) {
     if (texts.empty()) {
       _lines.emplace("-", stop);
-      // Where the answers appear on the screen they tell well enough how far the work has come.
-      if (const auto bytes = _lines->bytesInAll(); bytes && isatty(STDOUT_FILENO) == 0) {
-        _progress.emplace(ProgressBar::Options{bytes, "bytes", std::chrono::seconds(1)});
-      }
+      _progress.emplace(*_lines);
     }
   }
 
@@ -72,9 +70,7 @@ class Texts {
     if (!_lines) {
       return _taken < _texts.size() ? std::optional(_texts[_taken++]) : std::nullopt;
     }
-    if (_progress) {
-      _progress->show(_lines->bytesTaken());
-    }
+    _progress->show();
     return _lines->nextBytes();
   }
 
@@ -82,7 +78,7 @@ class Texts {
   const std::vector<std::string>& _texts;
   std::size_t _taken = 0;
   std::optional<InputLines> _lines;
-  std::optional<ProgressBar> _progress;
+  std::optional<ReadingBar> _progress;
 };
 
 class AnswerStream {

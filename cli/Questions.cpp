@@ -3,6 +3,7 @@
 #include <utility>
 
 #include "cli/Output.h"
+#include "cli/ReadingBar.h"
 #include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher::cli {
@@ -34,7 +35,9 @@ ExitCode Questions::answerEach(const Answer& answer) const {
     }
     if (_questions.empty()) {
       InputLines lines("-");
+      ReadingBar progress(lines);
       while (const auto question = lines.next()) {
+        progress.show();
         ask(*question);
         output.flush();
       }

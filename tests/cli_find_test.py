@@ -291,6 +291,11 @@ class StreamTest(TerminalTest):
             self.assertEqual(done.stderr.count(b"\n"), 1, done.stderr)
 
     def test_progress_over_a_file_when_it_takes_longer_than_a_second(self):
+        for verb in ("find", "query"):
+            with self.subTest(verb=verb):
+                self.expect_progress(verb)
+
+    def expect_progress(self, verb):
         texts = self.write("texts.txt", "goldan retriver\n" * 20000)
         reader, writer = os.pipe()
         answers = bytearray()
@@ -305,7 +310,7 @@ class StreamTest(TerminalTest):
         late = threading.Thread(target=read_late)
         late.start()
         with open(texts, "rb") as stdin:
-            shown = self.on_terminal("find", self.dogs, stdin=stdin, stdout=writer,
+            shown = self.on_terminal(verb, self.dogs, stdin=stdin, stdout=writer,
                                      meanwhile=lambda: os.close(writer))
         late.join()
         self.assertRegex(shown, r"^\r\x1b\[K\[#* *\] \d+ % of 320000 bytes")

@@ -119,8 +119,8 @@ class WORDCATCHER_EXPORT Index {
   ///
   /// Ranges are of the text as given, in bytes, half-open. Words are those of Unicode's rules; at
   /// most Options::maxQueryWords are looked at, a word of more than Options::maxWordUnits is not
-  /// looked up, and a budget of postings bounds the time. Throws Error (badInput) for edit limits
-  /// that are too large.
+  /// looked up, and FindOptions::maxPostings bounds the phrases that are judged. Throws Error
+  /// (badInput) for edit limits that are too large.
   FindResult find(std::string_view text) const;
 
   /// The same with options: how many, how far, which of those that overlap.

@@ -361,8 +361,7 @@ bool PhraseFinder::judgeAndKeep(std::uint32_t value, const Source& source) {
   if (!phrase) {
     return true;
   }
-  return keep(*phrase) || phrase->phrase.size() != words ||
-         phrase->rarity > source.values.size();
+  return keep(*phrase) || phrase->phrase.size() != words || phrase->rarity > source.values.size();
 }
 
 /// Whether the phrase is among the best so far.

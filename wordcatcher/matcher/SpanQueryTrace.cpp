@@ -47,7 +47,7 @@ void SpanQueryTrace::lookUp(std::u16string_view word, const std::vector<WordHit>
 
 void SpanQueryTrace::count(std::int64_t countedWords, std::int64_t uncountedLength, bool found) {
   tell("The text counts " + counted(countedWords, "word") + " (longer than " +
-       counted(uncountedLength, "code unit") + ", or all when every word is looked up).");
+       counted(uncountedLength, "letter") + ", or all when every word is looked up).");
   if (!found) {
     tell("No word brings any value, so nothing is found.");
   }
