@@ -2,8 +2,10 @@
 
 #include <unistd.h>
 
+#include <chrono>
 #include <filesystem>
 #include <system_error>
+#include <thread>
 #include <utility>
 
 namespace wordcatcher::cli {
@@ -64,6 +66,17 @@ std::uint64_t NewImage::write(IndexBuilder& builder) {
 
 void NewImage::discardForGood() {
   std::unique_lock lock(_returning);
+  // Writing goes on meanwhile, and may just be about to make its second file beside the target.
+  constexpr auto kOneStep = std::chrono::milliseconds(10);
+  while (discardOnce()) {
+    std::this_thread::sleep_for(kOneStep);
+  }
+  lock.release();
+}
+
+/// Whether there was anything to take away.
+bool NewImage::discardOnce() const {
+  bool found = false;
   const fs::path target(_target);
   const std::string stem = '.' + target.filename().string().substr(0, kCommonNameBytes);
   visitFiles(target.has_parent_path() ? target.parent_path() : ".", [&](const fs::path& path) {
@@ -72,10 +85,10 @@ void NewImage::discardForGood() {
     if ((extension == ".tmp" || extension == ".old") &&
         path.filename().string().starts_with(stem) && lstat(path.c_str(), &status) == 0 &&
         S_ISREG(status.st_mode) && isOurs(status)) {
-      unlink(path.c_str());
+      found |= unlink(path.c_str()) == 0;
     }
   });
-  lock.release();
+  return found;
 }
 
 bool NewImage::isOurs(const struct stat& status) const {

@@ -30,6 +30,7 @@ class NewImage {
   void discardForGood();
 
  private:
+  bool discardOnce() const;
   bool isOurs(const struct stat& status) const;
 
   std::string _target;
