@@ -59,6 +59,7 @@ std::set<Range> rangesWithoutSubranges(const std::vector<FoundPhrase>& matches) 
   // Ascending by beginning, of equal ones the longest first: what comes later lies within an
   // earlier one if it ends no later than any of them.
   std::vector<Range> ranges;
+  ranges.reserve(matches.size());
   for (const auto& match : matches) {
     ranges.push_back(rangeOf(match));
   }
@@ -172,9 +173,9 @@ void listUnpaired(const SearchImage& image, const FindText& text, const RankedPh
 void object(const RankedPhrase& phrase, const FindOptions& options, FindExplanation& explanation) {
   auto& objections = explanation.objections;
   if (phrase.phrase.empty()) {
-    objections.push_back("Its phrase holds no word.");
+    objections.emplace_back("Its phrase holds no word.");
   } else if (phrase.words == 0) {
-    objections.push_back("None of its words is near enough to a word of the text.");
+    objections.emplace_back("None of its words is near enough to a word of the text.");
   } else if (phrase.words < options.minWords) {
     objections.push_back("Only " + std::to_string(phrase.words) + " of its words " +
                          (phrase.words == 1 ? "is" : "are") + " in the text, and at least " +
@@ -253,7 +254,7 @@ FindExplanation explainFind(const SearchImage& image, const FindText& text, std:
   const auto number = valueNumber(image, value);
   explanation.isStored = number.has_value();
   if (!number) {
-    explanation.objections.push_back("The index holds no such data string.");
+    explanation.objections.emplace_back("The index holds no such data string.");
     return explanation;
   }
   PhraseFinder finder(image, text, options, joins);
