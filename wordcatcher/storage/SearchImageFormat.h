@@ -84,6 +84,8 @@ struct PhraseShape {
   std::uint16_t mostWords = 0;    // of the one with the most
   std::uint16_t units = 0;        // the least code units of the words of one of the former
 
+  // The lint takes the 0 that the compiler compares with for a null pointer.
+  // NOLINTNEXTLINE(modernize-use-nullptr)
   friend auto operator<=>(const PhraseShape&, const PhraseShape&) = default;
 };
 inline constexpr std::uint32_t kShapeCap = 0xFFFF;
