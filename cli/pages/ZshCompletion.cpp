@@ -8,7 +8,7 @@ namespace wordcatcher::cli {
 namespace {
 
 /// The first line of a description, as it may stand in the brackets or between the colons of a
-/// specification in single quotes.
+/// description in single quotes.
 std::string message(const std::string& description) {
   std::string text;
   for (const char c : description.substr(0, description.find('\n'))) {
