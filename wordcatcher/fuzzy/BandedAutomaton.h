@@ -103,6 +103,16 @@ struct Band {
     return states & (matching * kStarts);
   }
 
+  /// The distance of the best of some states of one lane, of which there must be one.
+  static std::uint32_t distanceOf(std::uint64_t accepted) noexcept {
+    return static_cast<std::uint32_t>(std::countr_zero(accepted)) / kColumns;
+  }
+
+  /// The columns in use in the row of so many edits of lane 0.
+  static constexpr std::uint64_t rowOf(std::uint64_t states, unsigned edits) {
+    return states >> (edits * kColumns) & kRow;
+  }
+
   /// The columns in use in any row of lane 0.
   static constexpr std::uint64_t columnsOf(std::uint64_t states) {
     std::uint64_t columns = states;
@@ -111,37 +121,6 @@ struct Band {
     }
     return columns & kRow;
   }
-
-  /// The states from which words of a given rest can still be accepted. `ahead` is the query's rest
-  /// less the word's: a state of e edits in column c needs |ahead - (c - K)| further edits.
-  static constexpr unsigned kAheadCap = 2 * K + 1;
-  struct Reach {
-    std::uint64_t notTooFarBehind[2 * kAheadCap + 1];
-    std::uint64_t notTooFarAhead[2 * kAheadCap + 1];
-  };
-  static constexpr std::size_t reachEntry(std::int64_t ahead) {
-    constexpr auto cap = static_cast<std::int64_t>(kAheadCap);
-    return static_cast<std::size_t>((ahead < -cap ? -cap : (ahead > cap ? cap : ahead)) + cap);
-  }
-  static constexpr Reach makeReach() {
-    Reach reach = {};
-    for (int ahead = -static_cast<int>(kAheadCap); ahead <= static_cast<int>(kAheadCap); ++ahead) {
-      const auto entry = reachEntry(ahead);
-      for (unsigned e = 0; e <= K; ++e) {
-        for (unsigned c = 0; c < kColumns; ++c) {
-          const int lead = static_cast<int>(c) - static_cast<int>(K);
-          const int spare = static_cast<int>(K - e);
-          const std::uint64_t bit = std::uint64_t{1} << (e * kColumns + c);
-          reach.notTooFarBehind[entry] |= lead >= ahead - spare ? bit : 0;
-          reach.notTooFarAhead[entry] |= lead <= ahead + spare ? bit : 0;
-        }
-      }
-      reach.notTooFarBehind[entry] = inLanes(reach.notTooFarBehind[entry]);
-      reach.notTooFarAhead[entry] = inLanes(reach.notTooFarAhead[entry]);
-    }
-    return reach;
-  }
-  static constexpr Reach kReach = makeReach();
 };
 
 /// A query prepared for simulation at up to K edits.
@@ -180,6 +159,15 @@ class BandedPattern {
   BandedPattern& operator=(const BandedPattern&) = delete;
 
   std::size_t length() const noexcept { return _units.size(); }
+
+  /// How many code units of the query a step looks at, and the label of one of them; 0 where there
+  /// is none, or it stands for any.
+  static constexpr unsigned kWindow = B::kColumns;
+  std::uint16_t labelAt(std::size_t depth, unsigned column) const noexcept {
+    const std::size_t p = depth + column - K;
+    return p < _units.size() && !_units[p].any ? _units[p].label : 0;
+  }
+
   std::uint64_t validAt(std::size_t depth) const noexcept { return _states[depth].valid; }
   std::uint64_t acceptingAt(std::size_t depth) const noexcept { return _states[depth].accepting; }
 
@@ -206,16 +194,18 @@ class BandedPattern {
     return B::matched(states, matching(depth, label));
   }
 
-  /// The bits, in a tree's sets of children, of the labels that match from these states.
-  std::uint64_t wantedChildren(std::uint64_t states, std::size_t depth) const noexcept {
-    std::uint64_t wanted = 0;
-    for (std::uint64_t columns = B::columnsOf(states); columns != 0; columns &= columns - 1) {
-      const std::size_t p = depth + static_cast<std::size_t>(std::countr_zero(columns)) - K;
-      if (p < _units.size()) {
-        wanted |= childBits(_units[p]);
-      }
+  /// The columns behind which a code unit may match.
+  std::uint64_t matchableColumns(std::uint64_t states) const noexcept {
+    return B::columnsOf(states);
+  }
+
+  /// The bits, in a tree's sets of children, of the labels that match behind a column.
+  std::uint64_t childBits(std::size_t depth, unsigned column) const noexcept {
+    const std::size_t p = depth + column - K;
+    if (p < _units.size() && _units[p].any) {
+      return ~(std::uint64_t{1} << image::kEndBit);
     }
-    return wanted;
+    return image::childBit(labelAt(depth, column));
   }
 
  private:
@@ -230,13 +220,6 @@ class BandedPattern {
       return 0;
     }
     return column >= B::kColumns ? B::kRow : (std::uint64_t{1} << column) - 1;
-  }
-
-  static std::uint64_t childBits(const QueryUnit& unit) noexcept {
-    if (unit.any) {
-      return ~(std::uint64_t{1} << image::kEndBit);
-    }
-    return unit.label == 0 ? 0 : std::uint64_t{1} << image::labelBit(unit.label);
   }
 
   void addToTable(const QueryUnit& unit, std::uint64_t bit) noexcept {

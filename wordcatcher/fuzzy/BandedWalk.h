@@ -16,16 +16,12 @@
 #include <utility>
 #include <vector>
 
-#include "wordcatcher/fuzzy/BandedAutomaton.h"
+#include "wordcatcher/fuzzy/LazyAutomaton.h"
 #include "wordcatcher/storage/LeafTails.h"
 #include "wordcatcher/storage/SearchImage.h"
+#include "wordcatcher/storage/WalkMemory.h"
 
 namespace wordcatcher {
-
-template <unsigned K>
-std::uint32_t distanceOf(std::uint64_t accepted) {
-  return static_cast<std::uint32_t>(std::countr_zero(accepted)) / Band<K>::kColumns;
-}
 
 /// What a walk may visit at the most: each slot, each place of a word and each code unit of the
 /// words once. More means that the image is no tree, and would make the walk's time or memory grow
@@ -38,10 +34,11 @@ class VisitBudget {
         _places(image.wordCount()),
         _units(image.unitCount()) {}
 
-  void spendSlot() {
-    if (_slots-- == 0) {
+  void spendSlots(std::uint64_t count) {
+    if (count > _slots) {
       fail("a tree has more branches than places");
     }
+    _slots -= count;
   }
   void spendPlaces(std::uint64_t first, std::uint64_t count) {
     if (count > _places || first + count > _image.wordCount()) {
@@ -68,84 +65,34 @@ class VisitBudget {
   std::uint64_t _units;
 };
 
-/// A list that grows and is emptied many times, where each addition costs no call.
-template <typename Element>
-class WalkList {
- public:
-  void push(const Element& element) {
-    if (_size == _elements.size()) {
-      grow();
-    }
-    _elements[_size++] = element;
-  }
-  void clear() noexcept { _size = 0; }
-  bool empty() const noexcept { return _size == 0; }
-  void swap(WalkList& other) noexcept {
-    _elements.swap(other._elements);
-    std::swap(_size, other._size);
-  }
-  const Element* begin() const noexcept { return _elements.data(); }
-  const Element* end() const noexcept { return _elements.data() + _size; }
-
- private:
-  [[gnu::noinline]] void grow() { _elements.resize(std::max<std::size_t>(32, 2 * _size)); }
-
-  std::vector<Element> _elements;
-  std::size_t _size = 0;
-};
-
-/// What a walk keeps of the level that it reads and of the next; one walk after the other may use
-/// the same.
-struct WalkMemory {
-  /// An inner place that was reached.
-  struct Place {
-    std::uint64_t states;
-    std::uint64_t children;  // but for the end of a word
-    std::uint64_t wanted;    // of these, those that can keep the automaton alive
-    std::uint32_t first;     // its first child
-  };
-  /// A word that ends at an inner place: its leaf is the place's first child.
-  struct Ending {
-    std::uint32_t slot;
-    std::uint32_t distance;
-  };
-  /// A word that was accepted.
-  struct Found {
-    std::uint32_t place;
-    std::uint32_t distance;
-    std::size_t length;
-  };
-
-  WalkList<Place> level;
-  WalkList<Place> nextLevel;
-  WalkList<Ending> endings;
-  WalkList<Ending> nextEndings;
-  WalkList<Found> found;
-};
-
-/// With two lanes, a word is accepted when lane 0 accepts it, at the distance in lane 1, if that
-/// accepts it, too: forward as from the start; backward so that nothing is left out behind the last
-/// code unit read, which is the word's first.
+/// One walk; see LazyAutomaton for what it accepts.
+///
+/// Each level takes three passes: over the children of its places, of which those are kept at which
+/// the automaton is alive; over these, to tell leaves and places; and over the leaves. So each has
+/// few branches, and those that there are can mostly be foretold.
 template <unsigned K, unsigned Lanes, typename Pattern = BandedPattern<K, Lanes>>
 class BandedWalk {
  public:
   using B = typename Pattern::B;
+  using Automaton = LazyAutomaton<K, Lanes, Pattern>;
+  using Number = typename Automaton::Number;
 
+  /// All must live as long as this does; of walks with the same memory one is run after the other.
   BandedWalk(const SearchImage& image, const SearchImage::Tree& tree, bool backward,
              const Pattern& pattern, WalkMemory& memory)
       : _image(image),
         _tree(tree),
         _backward(backward),
-        _pattern(pattern),
+        _automaton(pattern, backward, memory.automaton),
         _memory(memory),
         _budget(image, tree) {}
 
   /// Calls `accept(word, distance, length)` for each word accepted.
   template <typename Accept>
   void run(std::uint64_t start, Accept accept) {
+    begin();
     const TreeSlot& root = _tree.slots[0];
-    _memory.level.push(
-        {start, root.children & ~kEnd, wantedOf(root.children, start, 0), root.index()});
+    _memory.level.add({root.children & ~kEnd, root.index(), _automaton.at(0, start)});
     finish(0, accept);
   }
 
@@ -153,11 +100,11 @@ class BandedWalk {
   template <typename Accept>
   void runAfterInsertion(Accept accept) {
     if constexpr (K > 0) {
-      const std::uint64_t inserted =
-          B::closed(B::inLanes(std::uint64_t{1} << (B::kColumns + K - 1))) & _pattern.validAt(1);
+      begin();
       const TreeSlot& root = _tree.slots[0];
-      forEachChild(root.children & ~kEnd, root.children & ~kEnd, root.index(),
-                   [&](std::uint16_t, const TreeSlot& slot) { enter(slot, inserted, 0, 1); });
+      reachAll(root.children & ~kEnd, root.index(),
+               [state = _automaton.afterInsertion()](std::uint16_t) { return state; });
+      sortOut(1);
       goOn();
       finish(1, accept);
     }
@@ -173,27 +120,37 @@ class BandedWalk {
     std::uint32_t place;
     std::uint32_t word;
     std::size_t depth;
-    std::uint64_t states;
-    std::uint64_t unclosed;
+    Number state;
   };
   static constexpr std::size_t kLeafWords = 64;
 
+  /// Bounds the memory for places of which it is not known yet what they are.
+  static constexpr std::size_t kSortedAtOnce = 1024;
+
+  void begin() {
+    _automaton.begin();
+    _memory.clear();
+  }
+
   template <typename Accept>
   void finish(std::size_t depth, Accept& accept) {
-    for (; !_memory.level.empty() || !_memory.endings.empty(); ++depth) {
+    for (; _memory.level.size() + _memory.endings.size() > 0; ++depth) {
       for (const auto& ending : _memory.endings) {
         readEnding(ending, depth);
       }
       for (const auto& place : _memory.level) {
         expand(place, depth);
+        if (_memory.reached.size() >= kSortedAtOnce) {
+          sortOut(depth + 1);
+        }
       }
+      sortOut(depth + 1);
       goOn();
     }
     readLeafWords();
     for (const auto& found : _memory.found) {
       accept(wordAt(found.place), found.distance, found.length);
     }
-    _memory.found.clear();
   }
 
   void goOn() {
@@ -215,105 +172,119 @@ class BandedWalk {
     return _tree.order.empty() ? place : _tree.order[place];
   }
 
-  const TreeSlot& childAt(std::size_t child) const {
-    if (child >= _tree.slots.size()) {
+  /// The block of a place's children.
+  const TreeSlot* childrenAt(std::size_t first, std::size_t count) const {
+    if (first + count > _tree.slots.size()) {
       _image.throwDamaged("a tree leads out of its section");
     }
-    return _tree.slots[child];
+    return _tree.slots.data() + first;
   }
 
-  /// The children of a place that can keep the automaton alive. When only matches do, no other
-  /// child is looked at.
-  std::uint64_t wantedOf(std::uint64_t children, std::uint64_t states, std::size_t depth) const {
-    const std::uint64_t byEdit = _pattern.editedAt(states, depth) & _pattern.validAt(depth + 1);
-    return children & ((byEdit & B::kLane) != 0 ? ~kEnd : _pattern.wantedChildren(states, depth));
+  void expand(const WalkMemory::Place& place, std::size_t depth) {
+    const std::uint64_t wanted = place.children & _automaton[place.state].wanted;
+    const auto step = [&](std::uint16_t label) {
+      return _automaton.next(place.state, depth, label);
+    };
+    if (wanted == place.children) {
+      reachAll(place.children, place.first, step);
+    } else {
+      reachSome(place.children, wanted, place.first, step);
+    }
   }
 
-  /// Calls `visit(label, slot)` for every child in `wanted`.
-  template <typename Visit>
-  void forEachChild(std::uint64_t children, std::uint64_t wanted, std::size_t first, Visit visit) {
+  /// The places behind the edges to all children.
+  template <typename Step>
+  void reachAll(std::uint64_t children, std::size_t first, Step step) {
+    const std::uint64_t common = children & ~kRare;
+    const std::size_t count = bitCount(common);
+    _budget.spendSlots(count);
+    const TreeSlot* slot = childrenAt(first, count);
+    WalkMemory::Reached* end = _memory.reached.roomFor(count);
+    for (std::uint64_t bits = common; bits != 0; bits &= bits - 1, ++slot) {
+      end = reach(*slot, step(static_cast<std::uint16_t>(std::countr_zero(bits))), end);
+    }
+    _memory.reached.endAt(end);
+    if ((children & kRare) != 0) {
+      reachRare(first + count, step);
+    }
+  }
+
+  /// The places behind the edges to some of them.
+  template <typename Step>
+  void reachSome(std::uint64_t children, std::uint64_t wanted, std::size_t first, Step step) {
     const std::uint64_t common = children & ~kRare;
     for (std::uint64_t bits = common & wanted; bits != 0; bits &= bits - 1) {
-      const auto label = static_cast<unsigned>(std::countr_zero(bits));
-      _budget.spendSlot();
-      visit(static_cast<std::uint16_t>(label),
-            childAt(first + bitCount(common & ((std::uint64_t{1} << label) - 1))));
+      const std::size_t child = first + bitCount(common & ((bits & -bits) - 1));
+      reachOne(*childrenAt(child, 1), step(static_cast<std::uint16_t>(std::countr_zero(bits))));
     }
-    if ((wanted & kRare) == 0) {
-      return;
+    if ((wanted & kRare) != 0) {
+      reachRare(first + bitCount(common), step);
     }
-    for (std::size_t child = first + bitCount(common);; ++child) {
-      const TreeSlot& slot = childAt(child);
+  }
+
+  template <typename Step>
+  void reachRare(std::size_t child, Step step) {
+    for (;; ++child) {
+      const TreeSlot& slot = *childrenAt(child, 1);
       if (slot.label < image::kRareBit) {
         _image.throwDamaged("a tree leads out of its section");
       }
-      _budget.spendSlot();
-      visit(slot.label, slot);
+      reachOne(slot, step(slot.label));
       if (slot.isLastChild()) {
         return;
       }
     }
   }
 
-  void expand(const WalkMemory::Place& place, std::size_t depth) {
-    const std::uint64_t states = place.states;
-    const std::uint64_t valid = _pattern.validAt(depth + 1);
-    const std::uint64_t byEdit = _pattern.editedAt(states, depth) & valid;
-    const auto ahead =
-        static_cast<std::int64_t>(_pattern.length()) - static_cast<std::int64_t>(depth) - 1;
-    forEachChild(place.children, place.wanted, place.first,
-                 [&](std::uint16_t label, const TreeSlot& slot) {
-                   const std::uint64_t match = _pattern.matchedAt(states, depth, label);
-                   std::uint64_t next = (byEdit | B::closed(match)) & valid;
-                   next &= B::kReach.notTooFarAhead[B::reachEntry(ahead - slot.shortest)];
-                   if (slot.longest < image::kLengthCap) {
-                     next &= B::kReach.notTooFarBehind[B::reachEntry(ahead - slot.longest)];
-                   }
-                   if ((next & B::kLane) != 0) {
-                     enter(slot, next, byEdit | match, depth + 1);
-                   }
-                 });
+  void reachOne(const TreeSlot& slot, Number state) {
+    _budget.spendSlots(1);
+    _memory.reached.endAt(reach(slot, state, _memory.reached.roomFor(1)));
   }
 
-  /// A place behind an edge, at which the automaton is in `states`, or `unclosed` when nothing is
-  /// left out of the query behind the edge.
-  void enter(const TreeSlot& slot, std::uint64_t states, std::uint64_t unclosed,
-             std::size_t depth) {
-    if (slot.isLeaf()) {
-      enterLeaf(slot, states, unclosed, depth);
-      return;
-    }
-    const std::uint64_t wanted = wantedOf(slot.children & ~kEnd, states, depth);
-    const std::uint64_t accepted =
-        (slot.children & kEnd) != 0 ? acceptedAt(states, unclosed, depth) : 0;
-    if ((wanted | accepted) == 0 || slot.index() >= _tree.slots.size()) {
-      return;
-    }
-    __builtin_prefetch(&_tree.slots[slot.index()]);
-    if (accepted != 0) {
-      _memory.nextEndings.push({slot.index(), distanceOf<K>(accepted)});
-    }
-    if (wanted != 0) {
-      const std::uint32_t ends = slot.children & kEnd;
-      _memory.nextLevel.push({states, slot.children & ~kEnd, wanted, slot.index() + ends});
-    }
+  /// A place is kept if words behind it are of a length that can still be accepted. None is in the
+  /// dead state.
+  WalkMemory::Reached* reach(const TreeSlot& slot, Number state, WalkMemory::Reached* end) const {
+    const auto& at = _automaton[state];
+    *end = {slot.children, slot.target, state};
+    return end + (static_cast<int>(slot.shortest <= at.mostRest) &
+                  static_cast<int>(slot.longest >= at.leastRest));
   }
 
-  /// The accepting states at the end of a word, in lane 0.
-  std::uint64_t acceptedAt(std::uint64_t states, std::uint64_t unclosed, std::size_t depth) const {
-    const std::uint64_t accepting = _pattern.acceptingAt(depth);
-    if constexpr (Lanes == 1) {
-      return states & accepting;
-    } else {
-      return (states & accepting & B::kLane) == 0
-                 ? 0
-                 : ((_backward ? unclosed : states) & accepting) >> B::kLaneBits;
+  /// Adds the places reached to the next level, after so many code units, and reads the leaves.
+  void sortOut(std::size_t depth) {
+    const std::size_t count = _memory.reached.size();
+    WalkMemory::Place* levelEnd = _memory.nextLevel.roomFor(count);
+    WalkMemory::Ending* endingsEnd = _memory.nextEndings.roomFor(count);
+    WalkMemory::Reached* leavesEnd = _memory.leaves.roomFor(count);
+    const TreeSlot* slots = _tree.slots.data();
+    for (const auto& reached : _memory.reached) {
+      const auto& state = _automaton[reached.state];
+      const std::uint32_t index = reached.target & TreeSlot::kIndex;
+      const unsigned isLeaf = reached.target / TreeSlot::kLeaf;
+      const auto ends = static_cast<std::uint32_t>(reached.children & kEnd);
+      const unsigned isWanted = (reached.children & state.wanted) != 0 ? 1 : 0;
+      const unsigned isAccepted = state.distance != Automaton::kNotAccepted ? 1 : 0;
+      __builtin_prefetch(slots + (isLeaf != 0 ? 0 : index));
+      *leavesEnd = reached;
+      leavesEnd += isLeaf;
+      *levelEnd = {reached.children & ~kEnd, index + ends, reached.state};
+      levelEnd += isWanted & ~isLeaf;
+      *endingsEnd = {index, state.distance};
+      endingsEnd += isAccepted & ends & ~isLeaf;
     }
+    _memory.nextLevel.endAt(levelEnd);
+    _memory.nextEndings.endAt(endingsEnd);
+    _memory.leaves.endAt(leavesEnd);
+    _memory.reached.clear();
+    for (const auto& leaf : _memory.leaves) {
+      readLeaf(leaf, depth);
+    }
+    _memory.leaves.clear();
   }
 
   void readEnding(const WalkMemory::Ending& ending, std::size_t length) {
-    const TreeSlot& leaf = childAt(ending.slot);
-    _budget.spendSlot();
+    const TreeSlot& leaf = *childrenAt(ending.slot, 1);
+    _budget.spendSlots(1);
     _budget.spendPlaces(leaf.index(), 1);
     addFound(leaf.index(), ending.distance, length);
   }
@@ -322,24 +293,25 @@ class BandedWalk {
     if (!_tree.order.empty()) {
       __builtin_prefetch(&_tree.order[place]);
     }
-    _memory.found.push({place, distance, length});
+    _memory.found.add({place, distance, length});
   }
 
-  void enterLeaf(const TreeSlot& slot, std::uint64_t states, std::uint64_t unclosed,
-                 std::size_t depth) {
-    _budget.spendPlaces(slot.index(), image::leafWords(slot));
-    if (image::hasTails(slot)) {
-      readTails(slot, states, unclosed, depth);
+  void readLeaf(const WalkMemory::Reached& leaf, std::size_t depth) {
+    const std::uint32_t first = leaf.target & TreeSlot::kIndex;
+    const std::uint64_t words = image::leafWords(leaf.children);
+    _budget.spendPlaces(first, words);
+    if (image::hasTails(leaf.children)) {
+      readTails(leaf, depth);
       return;
     }
-    for (std::uint64_t i = 0; i < slot.children; ++i) {
-      const auto place = static_cast<std::uint32_t>(slot.index() + i);
+    for (std::uint64_t i = 0; i < words; ++i) {
+      const auto place = static_cast<std::uint32_t>(first + i);
       if (_tree.order.empty()) {
         _image.prefetchOffsetOf(place);
       } else {
         __builtin_prefetch(&_tree.order[place]);
       }
-      _leafWords[_leafWordCount++] = {place, 0, depth, states, unclosed};
+      _leafWords[_leafWordCount++] = {place, 0, depth, leaf.state};
       if (_leafWordCount == kLeafWords) {
         readLeafWords();
       }
@@ -347,52 +319,33 @@ class BandedWalk {
   }
 
   /// The words of a leaf by what its slot says of them.
-  void readTails(const TreeSlot& leaf, std::uint64_t states, std::uint64_t unclosed,
-                 std::size_t depth) {
+  void readTails(const WalkMemory::Reached& leaf, std::size_t depth) {
     using Tails = image::LeafTails;
     // Where the automaton was after so many labels, for the words that share them.
-    struct {
-      std::uint64_t states;
-      std::uint64_t unclosed;
-    } reached[Tails::kCodes + 1];
-    reached[0] = {states, unclosed};
-    std::size_t alive = 0;
-    std::size_t length = 0;
+    std::array<Number, Tails::kCodes + 1> reached;
+    reached[0] = leaf.state;
+    std::size_t position = 0;
     std::uint64_t codes = leaf.children & Tails::kAllCodes;
-    const std::uint64_t words = image::leafWords(leaf);
-    for (std::uint32_t word = 0; word < words; ++word) {
-      std::size_t position = 0;
-      if (word > 0) {
-        position = codes & Tails::kCodeMask;
-        codes >>= Tails::kCodeBits;
-        if (position > length) {
-          _image.throwDamaged("a leaf shares more than there is");
-        }
-        alive = std::min(alive, position);
-      }
-      bool isAlive = position == alive;
+    auto place = leaf.target & TreeSlot::kIndex;
+    for (auto words = image::leafWords(leaf.children);; ++place) {
       for (; (codes & Tails::kCodeMask) != 0; codes >>= Tails::kCodeBits, ++position) {
-        if (isAlive) {
-          const auto& from = reached[position];
-          const auto label = static_cast<std::uint16_t>(codes & Tails::kCodeMask);
-          const std::uint64_t byEdit = _pattern.editedAt(from.states, depth + position);
-          const std::uint64_t match = _pattern.matchedAt(from.states, depth + position, label);
-          auto& to = reached[position + 1];
-          to.unclosed = byEdit | match;
-          to.states = (byEdit | B::closed(match)) & _pattern.validAt(depth + position + 1);
-          isAlive = (to.states & B::kLane) != 0;
-          alive += isAlive ? 1 : 0;
-        }
+        const auto label = static_cast<std::uint16_t>(codes & Tails::kCodeMask);
+        reached[position + 1] = _automaton.next(reached[position], depth + position, label);
+      }
+      const std::uint32_t distance = _automaton[reached[position]].distance;
+      if (distance != Automaton::kNotAccepted) {
+        addFound(place, distance, depth + position);
+      }
+      if (--words == 0) {
+        return;
       }
       codes >>= Tails::kCodeBits;
-      length = position;
-      if (!isAlive) {
-        continue;
+      const std::size_t shared = codes & Tails::kCodeMask;
+      codes >>= Tails::kCodeBits;
+      if (shared > position) {
+        _image.throwDamaged("a leaf shares more than there is");
       }
-      const auto& end = reached[position];
-      if (const auto accepted = acceptedAt(end.states, end.unclosed, depth + position)) {
-        addFound(leaf.index() + word, distanceOf<K>(accepted), depth + position);
-      }
+      position = shared;
     }
   }
 
@@ -418,28 +371,22 @@ class BandedWalk {
     if (labels.size() < leaf.depth) {
       return;
     }
-    std::uint64_t states = leaf.states;
-    std::uint64_t unclosed = leaf.unclosed;
+    Number state = leaf.state;
     std::size_t depth = leaf.depth;
-    for (; depth < labels.size() && (states & B::kLane) != 0; ++depth) {
+    for (; depth < labels.size() && state != Automaton::kDead; ++depth) {
       const std::uint16_t label = _backward ? labels[labels.size() - 1 - depth] : labels[depth];
-      const std::uint64_t byEdit = _pattern.editedAt(states, depth);
-      const std::uint64_t match = _pattern.matchedAt(states, depth, label);
-      unclosed = byEdit | match;
-      states = (byEdit | B::closed(match)) & _pattern.validAt(depth + 1);
+      state = _automaton.next(state, depth, label);
     }
-    if (depth < labels.size() || (states & B::kLane) == 0) {
-      return;
-    }
-    if (const std::uint64_t accepted = acceptedAt(states, unclosed, depth)) {
-      addFound(leaf.place, distanceOf<K>(accepted), depth);
+    const std::uint32_t distance = _automaton[state].distance;
+    if (distance != Automaton::kNotAccepted) {
+      addFound(leaf.place, distance, depth);
     }
   }
 
   const SearchImage& _image;
   const SearchImage::Tree& _tree;
   bool _backward;
-  const Pattern& _pattern;
+  Automaton _automaton;
   WalkMemory& _memory;
   VisitBudget _budget;
   std::array<LeafWord, kLeafWords> _leafWords;

@@ -101,7 +101,7 @@ std::optional<std::uint32_t> judge(const SearchImage& image, const BandedPattern
     states = pattern.step(states, depth, labels[depth]);
   }
   const std::uint64_t accepted = states == 0 ? 0 : states & pattern.acceptingAt(labels.size());
-  return accepted == 0 ? std::nullopt : std::optional(distanceOf<K>(accepted));
+  return accepted == 0 ? std::nullopt : std::optional(Band<K>::distanceOf(accepted));
 }
 
 /// Of K edits at least one half of the query carries few: K / 2 in the first or the rest less one
@@ -121,9 +121,9 @@ void searchByHalves(const SearchImage& image, const Query& query, HitList& hits)
   const std::vector<QueryUnit> reversed(query.units.rbegin(), query.units.rend());
   const BandedPattern<K, kLanes> first(query.units, half, kInFirst);
   const BandedPattern<K, kLanes> second(reversed, length - half, kInSecond);
-  WalkMemory memory;
-  BandedWalk<K, kLanes> forward(image, image.forward(), false, first, memory);
-  BandedWalk<K, kLanes> backward(image, image.backward(), true, second, memory);
+  const auto memory = image.lendWalkMemory();
+  BandedWalk<K, kLanes> forward(image, image.forward(), false, first, *memory);
+  BandedWalk<K, kLanes> backward(image, image.backward(), true, second, *memory);
   if constexpr (kLanes == 2) {
     const auto accept = [&hits](std::uint32_t word, std::uint32_t distance, std::size_t size) {
       hits.add(word, distance, size);
@@ -151,8 +151,8 @@ void searchBanded(const SearchImage& image, const Query& query, HitList& hits) {
     return;
   }
   const BandedPattern<K> pattern(query.units, 0, K);
-  WalkMemory memory;
-  BandedWalk<K, 1> walk(image, image.forward(), false, pattern, memory);
+  const auto memory = image.lendWalkMemory();
+  BandedWalk<K, 1> walk(image, image.forward(), false, pattern, *memory);
   const auto accept = [&hits](std::uint32_t word, std::uint32_t distance, std::size_t size) {
     hits.add(word, distance, size);
   };

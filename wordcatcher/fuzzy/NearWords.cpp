@@ -100,11 +100,11 @@ void searchWithin(const SearchImage& image, const std::vector<std::uint16_t>& la
   const auto accept = [&found](std::uint32_t word, std::uint32_t edits, std::size_t) {
     found.push_back({word, edits});
   };
-  WalkMemory memory;
+  const auto memory = image.lendWalkMemory();
   using Walk = BandedWalk<K, 1, SwapPattern<K>>;
   if (labels.size() < kMinSplitLength) {
     const SwapPattern<K> whole(labels, swaps, 0, K);
-    Walk(image, image.forward(), false, whole, memory).run(whole.start(), accept);
+    Walk(image, image.forward(), false, whole, *memory).run(whole.start(), accept);
     return;
   }
   constexpr unsigned kInFirst = K / 2;
@@ -113,8 +113,8 @@ void searchWithin(const SearchImage& image, const std::vector<std::uint16_t>& la
   const std::vector<std::uint16_t> reversed(labels.rbegin(), labels.rend());
   const SwapPattern<K> first(labels, swaps, half, kInFirst);
   const SwapPattern<K> second(reversed, swaps, labels.size() - half, kInSecond);
-  Walk(image, image.forward(), false, first, memory).run(first.start(), accept);
-  Walk(image, image.backward(), true, second, memory).run(second.start(), accept);
+  Walk(image, image.forward(), false, first, *memory).run(first.start(), accept);
+  Walk(image, image.backward(), true, second, *memory).run(second.start(), accept);
 }
 
 }  // namespace

@@ -63,26 +63,18 @@ struct SwapBand {
     return next;
   }
 
-  static constexpr std::size_t reachEntry(std::int64_t ahead) { return Plain::reachEntry(ahead); }
+  static std::uint32_t distanceOf(std::uint64_t accepted) noexcept {
+    return Plain::distanceOf(accepted);
+  }
 
-  /// A swap's state is, for the length of what is left, what it leads to: one column up.
-  static constexpr typename Plain::Reach makeReach() {
-    typename Plain::Reach reach = {};
-    for (std::size_t entry = 0; entry < std::size(reach.notTooFarBehind); ++entry) {
-      reach.notTooFarBehind[entry] = withSwaps(Plain::kReach.notTooFarBehind[entry]);
-      reach.notTooFarAhead[entry] = withSwaps(Plain::kReach.notTooFarAhead[entry]);
-    }
-    return reach;
+  /// The columns in use in the row of so many edits; a swap's state counts as what it leads to, one
+  /// column up.
+  static constexpr std::uint64_t rowOf(std::uint64_t states, unsigned edits) {
+    const std::uint64_t plain = Plain::rowOf(states, edits);
+    return edits == 0
+               ? plain
+               : plain | ((states >> (kPlainBits + (edits - 1) * kColumns) & Plain::kRow) << 1);
   }
-  static constexpr std::uint64_t withSwaps(std::uint64_t states) {
-    std::uint64_t swaps = 0;
-    for (unsigned e = 1; e <= K; ++e) {
-      const std::uint64_t row = states >> (e * kColumns) & Plain::kRow;
-      swaps |= (row >> 1) << ((e - 1) * kColumns);
-    }
-    return states | swaps << kPlainBits;
-  }
-  static constexpr typename Plain::Reach kReach = makeReach();
 
   /// The columns in use in any row of the plain states.
   static constexpr std::uint64_t columnsOf(std::uint64_t states) {
@@ -143,6 +135,15 @@ class SwapPattern {
   SwapPattern& operator=(const SwapPattern&) = delete;
 
   std::size_t length() const noexcept { return _labels.size(); }
+
+  /// How many code units of the query a step looks at, and the label of one of them; 0 where there
+  /// is none.
+  static constexpr unsigned kWindow = B::kColumns + 1;
+  std::uint16_t labelAt(std::size_t depth, unsigned column) const noexcept {
+    const std::size_t p = depth + column - K;
+    return p < _labels.size() ? _labels[p] : 0;
+  }
+
   std::uint64_t validAt(std::size_t depth) const noexcept { return _states[depth].valid; }
   std::uint64_t acceptingAt(std::size_t depth) const noexcept { return _states[depth].accepting; }
 
@@ -159,20 +160,15 @@ class SwapPattern {
     return B::matched(states, matching(depth, label));
   }
 
-  /// The bits, in a tree's sets of children, of the labels that match from these states.
-  std::uint64_t wantedChildren(std::uint64_t states, std::size_t depth) const noexcept {
-    std::uint64_t columns = B::columnsOf(states) | B::swapColumnsOf(states);
-    if (_swaps) {
-      columns |= B::columnsOf(states) << 1;
-    }
-    std::uint64_t wanted = 0;
-    for (; columns != 0; columns &= columns - 1) {
-      const std::size_t p = depth + static_cast<std::size_t>(std::countr_zero(columns)) - K;
-      if (p < _labels.size() && _labels[p] != 0) {
-        wanted |= std::uint64_t{1} << image::labelBit(_labels[p]);
-      }
-    }
-    return wanted;
+  /// The columns behind which a code unit may match.
+  std::uint64_t matchableColumns(std::uint64_t states) const noexcept {
+    const std::uint64_t columns = B::columnsOf(states);
+    return columns | B::swapColumnsOf(states) | (_swaps ? columns << 1 : 0);
+  }
+
+  /// The bits, in a tree's sets of children, of the labels that match behind a column.
+  std::uint64_t childBits(std::size_t depth, unsigned column) const noexcept {
+    return image::childBit(labelAt(depth, column));
   }
 
  private:

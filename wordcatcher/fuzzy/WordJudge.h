@@ -45,8 +45,7 @@ class WordJudge {
     if (states == 0) {
       return std::nullopt;
     }
-    const auto distance =
-        static_cast<std::uint32_t>(std::countr_zero(states)) / Band<kMaxDistance>::kColumns;
+    const std::uint32_t distance = Band<kMaxDistance>::distanceOf(states);
     return distance <= _maxDistance ? std::optional(distance) : std::nullopt;
   }
 

@@ -68,13 +68,15 @@ struct LeafTails {
   };
 };
 
-/// The number of words of a leaf, with tails or without.
-inline std::uint64_t leafWords(const TreeSlot& leaf) {
-  const std::uint64_t withTails = leaf.children >> LeafTails::kCountShift;
-  return withTails != 0 ? withTails : leaf.children;
+/// The number of words of a leaf, with tails or without, from its slot or the slot's `children`.
+inline std::uint64_t leafWords(std::uint64_t children) {
+  const std::uint64_t withTails = children >> LeafTails::kCountShift;
+  return withTails != 0 ? withTails : children;
 }
+inline std::uint64_t leafWords(const TreeSlot& leaf) { return leafWords(leaf.children); }
 
-inline bool hasTails(const TreeSlot& leaf) { return leaf.children >> LeafTails::kCountShift != 0; }
+inline bool hasTails(std::uint64_t children) { return children >> LeafTails::kCountShift != 0; }
+inline bool hasTails(const TreeSlot& leaf) { return hasTails(leaf.children); }
 
 }  // namespace wordcatcher::image
 

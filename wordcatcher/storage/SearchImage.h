@@ -10,6 +10,7 @@
 
 #include "wordcatcher/storage/SearchImageFormat.h"
 #include "wordcatcher/storage/TwoWidths.h"
+#include "wordcatcher/storage/WalkMemory.h"
 
 namespace wordcatcher {
 
@@ -90,6 +91,10 @@ class SearchImage {
   };
   const Tree& forward() const noexcept { return _forward; }
   const Tree& backward() const noexcept { return _backward; }
+
+  /// Memory for walks of the trees, which may be in any state; for one thread at a time. It must be
+  /// gone before the image is.
+  WalkMemoryPool::Loan lendWalkMemory() const { return _walkMemory.lend(); }
 
   /// The values of a word, ascending; each is below valueCount() or the image is damaged.
   std::span<const std::uint32_t> postingsOf(std::uint32_t word) const;
@@ -178,6 +183,8 @@ class SearchImage {
   std::span<const std::uint32_t> _phraseOffsets;
   std::span<const std::uint32_t> _phraseWords;
   std::span<const image::PhraseClass> _phraseClasses;
+
+  mutable WalkMemoryPool _walkMemory;
 };
 
 }  // namespace wordcatcher

@@ -131,6 +131,11 @@ inline constexpr unsigned kLengthCap = 255;
 /// The bit of `children` that a label has.
 inline constexpr unsigned labelBit(unsigned label) { return label < kRareBit ? label : kRareBit; }
 
+/// A set of that bit; for label 0, which no edge has, the empty set.
+inline constexpr std::uint64_t childBit(unsigned label) {
+  return label == 0 ? 0 : std::uint64_t{1} << labelBit(label);
+}
+
 }  // namespace wordcatcher::image
 
 #endif

@@ -1,0 +1,218 @@
+#ifndef WORDCATCHER_FUZZY_LAZYAUTOMATON_H
+#define WORDCATCHER_FUZZY_LAZYAUTOMATON_H
+
+// The deterministic automaton of a query, made while a tree is walked in step with it.
+//
+// A walk reads many code units from few sets of states: of a thousand steps some seventy differ. So
+// a set of states gets a number when it is first met, and a step is made once from each for each
+// class of code units: those that match nothing within reach are one class, and each that does is
+// one of its own. All further steps are read from a table. This is the subset construction on
+// demand (Aho, Lam, Sethi, Ullman, "Compilers", section 3.7.4).
+
+#include <algorithm>
+#include <array>
+#include <bit>
+#include <cstddef>
+#include <cstdint>
+#include <tuple>
+#include <utility>
+#include <vector>
+
+#include "wordcatcher/fuzzy/BandedAutomaton.h"
+#include "wordcatcher/storage/LeafTails.h"
+#include "wordcatcher/storage/SearchImageFormat.h"
+#include "wordcatcher/storage/WalkMemory.h"
+
+namespace wordcatcher {
+
+/// `Pattern` is a BandedPattern or a SwapPattern. With two lanes a word is accepted when lane 0
+/// accepts it, at the distance in lane 1, if that accepts it, too: forward as from the start;
+/// backward so that nothing is left out behind the last code unit read, which is the word's first.
+template <unsigned K, unsigned Lanes, typename Pattern>
+class LazyAutomaton {
+ public:
+  using B = typename Pattern::B;
+  using Number = std::uint32_t;
+  using State = AutomatonMemory::State;
+  static constexpr Number kDead = 0;
+  static constexpr std::uint32_t kNotAccepted = UINT32_MAX;
+
+  /// Both must live as long as this does.
+  LazyAutomaton(const Pattern& pattern, bool backward, AutomatonMemory& memory)
+      : _pattern(pattern), _backward(backward), _memory(memory) {}
+
+  /// Takes possession of the memory; before all else.
+  void begin() {
+    _memory.states.assign(1, {.distance = kNotAccepted});
+    _memory.steps.assign(kClasses, kDead);
+    _memory.slots.assign(kFewestSlots, 0);
+    _memory.classes.clear();
+  }
+
+  /// The state of a set of states of the pattern's after `depth` code units, at which no word ends.
+  Number at(std::size_t depth, std::uint64_t set) { return numberOf(depth, set, kNotAccepted); }
+
+  /// The state after one code unit that can only be an insertion.
+  Number afterInsertion() {
+    const std::uint64_t set =
+        B::closed(B::inLanes(std::uint64_t{1} << (B::kColumns + K - 1))) & _pattern.validAt(1);
+    return set == 0 ? kDead : numberOf(1, set, distanceOf(1, set, set));
+  }
+
+  /// The state behind a code unit read in another, which is after `depth` code units.
+  Number next(Number from, std::size_t depth, std::uint16_t label) {
+    const std::size_t step = from * kClasses + classOf(depth, label);
+    const Number to = _memory.steps[step];
+    return to != kUnknown ? to : make(step, from, depth, label);
+  }
+
+  const State& operator[](Number state) const noexcept { return _memory.states[state]; }
+
+ private:
+  static constexpr std::size_t kFewestSlots = 256;
+  static constexpr Number kUnknown = UINT32_MAX;
+  static constexpr std::uint64_t kEnd = std::uint64_t{1} << image::kEndBit;
+  /// Labels that match within reach, and all others; a power of two, so that rows are shifted to.
+  static constexpr std::size_t kClasses = std::bit_ceil(Pattern::kWindow + 1U);
+  static_assert(Pattern::kWindow <=
+                std::tuple_size_v<decltype(AutomatonMemory::Classes::ofColumn)>);
+
+  std::uint8_t classOf(std::size_t depth, std::uint16_t label) const noexcept {
+    return label < image::kRareBit ? _memory.classes[depth].ofLabel[label]
+                                   : classOfRare(depth, label);
+  }
+
+  std::uint8_t classOfRare(std::size_t depth, std::uint16_t label) const noexcept {
+    for (unsigned column = 0; column < Pattern::kWindow; ++column) {
+      if (_pattern.labelAt(depth, column) == label) {
+        return _memory.classes[depth].ofColumn[column];
+      }
+    }
+    return 0;
+  }
+
+  /// For one more depth.
+  void addClasses() {
+    const std::size_t depth = _memory.classes.size();
+    auto& classes = _memory.classes.emplace_back();
+    std::uint8_t last = 0;
+    for (unsigned column = 0; column < Pattern::kWindow; ++column) {
+      const std::uint16_t label = _pattern.labelAt(depth, column);
+      if (label == 0) {
+        continue;
+      }
+      const std::uint8_t known = classOf(depth, label);
+      classes.ofColumn[column] = known != 0 ? known : ++last;
+      if (label < image::kRareBit) {
+        classes.ofLabel[label] = classes.ofColumn[column];
+      }
+    }
+  }
+
+  [[gnu::noinline]] Number make(std::size_t step, Number from, std::size_t depth,
+                                std::uint16_t label) {
+    const std::uint64_t set = _memory.states[from].set;
+    const std::uint64_t byEdit = _pattern.editedAt(set, depth);
+    const std::uint64_t match = _pattern.matchedAt(set, depth, label);
+    const std::uint64_t next = (byEdit | B::closed(match)) & _pattern.validAt(depth + 1);
+    const Number to = (next & B::kLane) == 0
+                          ? kDead
+                          : numberOf(depth + 1, next, distanceOf(depth + 1, next, byEdit | match));
+    _memory.steps[step] = to;
+    return to;
+  }
+
+  /// The distance at the end of a word. `unclosed`: the states without those that only leaving out
+  /// code units behind the last one read leads to.
+  std::uint32_t distanceOf(std::size_t depth, std::uint64_t set,
+                           std::uint64_t unclosed) const noexcept {
+    const std::uint64_t accepting = _pattern.acceptingAt(depth);
+    std::uint64_t accepted = set & accepting & B::kLane;
+    if constexpr (Lanes == 2) {
+      accepted = accepted == 0 ? 0 : ((_backward ? unclosed : set) & accepting) >> B::kLaneBits;
+    }
+    return accepted == 0 ? kNotAccepted : B::distanceOf(accepted);
+  }
+
+  Number numberOf(std::size_t depth, std::uint64_t set, std::uint32_t distance) {
+    if (2 * _memory.states.size() >= _memory.slots.size()) {
+      grow();
+    }
+    Number& slot = slotOf(depth, set, distance);
+    if (slot == 0) {
+      slot = static_cast<Number>(_memory.states.size());
+      // A leaf's tails are read to their ends, even if nothing can be accepted any more.
+      while (_memory.classes.size() <= depth + image::LeafTails::kCodes) {
+        addClasses();
+      }
+      const std::uint64_t byEdit = _pattern.editedAt(set, depth) & _pattern.validAt(depth + 1);
+      const std::uint64_t wanted = (byEdit & B::kLane) != 0 ? ~kEnd : matchingChildren(depth, set);
+      const auto [least, most] = restOf(depth, set);
+      _memory.states.push_back(
+          {set, wanted, least, most, distance, static_cast<std::uint32_t>(depth)});
+      _memory.steps.resize(_memory.steps.size() + kClasses, kUnknown);
+    }
+    return slot;
+  }
+
+  /// How many code units a word may still have. A state of e edits in column c, behind which the
+  /// query has r code units, allows r - (K - e) to r + (K - e); r is less by one for each column.
+  std::pair<std::uint16_t, std::uint16_t> restOf(std::size_t depth, std::uint64_t set) const {
+    std::uint64_t most = 0;
+    std::uint64_t least = 0;
+    for (unsigned edits = 0; edits <= K; ++edits) {
+      const std::uint64_t row = B::rowOf(set, edits);
+      most |= row << edits;
+      least |= row << (K - edits);
+    }
+    const auto restOfMiddle =
+        static_cast<std::int64_t>(_pattern.length()) - static_cast<std::int64_t>(depth);
+    const auto capped = [](std::int64_t length) {
+      return static_cast<std::uint16_t>(
+          std::clamp<std::int64_t>(length, 0, std::int64_t{image::kLengthCap}));
+    };
+    return {capped(restOfMiddle + K - (std::bit_width(least) - 1)),
+            capped(restOfMiddle + 2 * std::int64_t{K} - std::countr_zero(most))};
+  }
+
+  /// The labels that lead on from a set of states without an edit.
+  std::uint64_t matchingChildren(std::size_t depth, std::uint64_t set) const {
+    const std::uint64_t columns = _pattern.matchableColumns(set);
+    std::uint64_t children = 0;
+    for (unsigned column = 0; column < Pattern::kWindow; ++column) {
+      children |= _pattern.childBits(depth, column) & -(columns >> column & 1);
+    }
+    return children;
+  }
+
+  Number& slotOf(std::size_t depth, std::uint64_t set, std::uint32_t distance) {
+    // Knuth's multiplicative hashing, see NumberIndex.h.
+    constexpr std::uint64_t kGoldenRatio = 0x9E3779B97F4A7C15;
+    auto& slots = _memory.slots;
+    const std::uint64_t mixed = (set ^ (std::uint64_t{depth} << 48U)) * kGoldenRatio;
+    std::size_t slot = (mixed >> 32U) & (slots.size() - 1);
+    for (; slots[slot] != 0; slot = (slot + 1) & (slots.size() - 1)) {
+      const State& state = _memory.states[slots[slot]];
+      if (state.set == set && state.depth == depth && state.distance == distance) {
+        break;
+      }
+    }
+    return slots[slot];
+  }
+
+  void grow() {
+    _memory.slots.assign(2 * _memory.slots.size(), 0);
+    for (Number number = 1; number < _memory.states.size(); ++number) {
+      const State& state = _memory.states[number];
+      slotOf(state.depth, state.set, state.distance) = number;
+    }
+  }
+
+  const Pattern& _pattern;
+  bool _backward;
+  AutomatonMemory& _memory;
+};
+
+}  // namespace wordcatcher
+
+#endif
