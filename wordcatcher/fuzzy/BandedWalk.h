@@ -330,7 +330,7 @@ class BandedWalk {
     for (auto words = image::leafWords(leaf.children);; ++place) {
       for (; (codes & Tails::kCodeMask) != 0; codes >>= Tails::kCodeBits, ++position) {
         const auto label = static_cast<std::uint16_t>(codes & Tails::kCodeMask);
-        reached[position + 1] = _automaton.next(reached[position], depth + position, label);
+        reached[position + 1] = _automaton.nextAnywhere(reached[position], depth + position, label);
       }
       const std::uint32_t distance = _automaton[reached[position]].distance;
       if (distance != Automaton::kNotAccepted) {

@@ -44,7 +44,8 @@ class LazyAutomaton {
   /// Takes possession of the memory; before all else.
   void begin() {
     _memory.states.assign(1, {.distance = kNotAccepted});
-    _memory.steps.assign(kClasses, kDead);
+    _memory.steps.resize(kFewestSlots / 2 * kClasses);
+    std::fill_n(_memory.steps.begin(), kClasses, kDead);
     _memory.slots.assign(kFewestSlots, 0);
     _memory.classes.clear();
   }
@@ -64,6 +65,11 @@ class LazyAutomaton {
     const std::size_t step = from * kClasses + classOf(depth, label);
     const Number to = _memory.steps[step];
     return to != kUnknown ? to : make(step, from, depth, label);
+  }
+
+  /// The same, also beyond the depths of all states that are not dead.
+  Number nextAnywhere(Number from, std::size_t depth, std::uint16_t label) {
+    return next(from, std::min(depth, _memory.classes.size() - 1), label);
   }
 
   const State& operator[](Number state) const noexcept { return _memory.states[state]; }
@@ -122,6 +128,14 @@ class LazyAutomaton {
     return to;
   }
 
+  void addSteps(Number state) {
+    const std::size_t first = state * kClasses;
+    if (first == _memory.steps.size()) {
+      _memory.steps.resize(2 * first);
+    }
+    std::fill_n(_memory.steps.begin() + static_cast<std::ptrdiff_t>(first), kClasses, kUnknown);
+  }
+
   /// The distance at the end of a word. `unclosed`: the states without those that only leaving out
   /// code units behind the last one read leads to.
   std::uint32_t distanceOf(std::size_t depth, std::uint64_t set,
@@ -141,8 +155,7 @@ class LazyAutomaton {
     Number& slot = slotOf(depth, set, distance);
     if (slot == 0) {
       slot = static_cast<Number>(_memory.states.size());
-      // A leaf's tails are read to their ends, even if nothing can be accepted any more.
-      while (_memory.classes.size() <= depth + image::LeafTails::kCodes) {
+      while (_memory.classes.size() <= depth) {
         addClasses();
       }
       const std::uint64_t byEdit = _pattern.editedAt(set, depth) & _pattern.validAt(depth + 1);
@@ -150,7 +163,7 @@ class LazyAutomaton {
       const auto [least, most] = restOf(depth, set);
       _memory.states.push_back(
           {set, wanted, least, most, distance, static_cast<std::uint32_t>(depth)});
-      _memory.steps.resize(_memory.steps.size() + kClasses, kUnknown);
+      addSteps(slot);
     }
     return slot;
   }

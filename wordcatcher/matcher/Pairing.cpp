@@ -29,6 +29,7 @@ void Pairing::start() {
   _options.clear();
   _words.clear();
   _phraseWords = 0;
+  _mostGain = 0;
   _hasJoins = false;
   _best.clear();
   _bestScore = {};
@@ -48,7 +49,10 @@ void Pairing::add(const PairOption& option) {
   }
   Word& word = _words.back();
   word.endOption = number + 1;
-  word.bestGain = std::max(word.bestGain, option.gain());
+  if (option.gain() > word.bestGain) {
+    _mostGain += option.gain() - word.bestGain;
+    word.bestGain = option.gain();
+  }
   _hasJoins = _hasJoins || option.textWords + option.phraseWords > 2;
   _options.push_back(option);
 }

@@ -60,6 +60,9 @@ class Pairing {
   void nextWord();
   void add(const PairOption& option);
 
+  /// What pairing all words could gain at the most, if none stood in another's way.
+  std::uint64_t mostGain() const noexcept { return _mostGain; }
+
   /// The best pairing of what was named. `steps` is a budget, which the work is taken off: when it
   /// is used up, the best pairing so far is taken, and isExact() is false from then on.
   PairingScore solve(std::uint64_t& steps);
@@ -99,6 +102,7 @@ class Pairing {
   std::vector<Onward> _onward;
   std::vector<PairingScore> _reachableFrom;  // the most that words from one on can add
   std::uint32_t _phraseWords = 0;
+  std::uint64_t _mostGain = 0;
   bool _hasJoins = false;
   bool _isExact = true;
   std::vector<Pair> _current;

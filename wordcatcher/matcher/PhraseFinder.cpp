@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <bit>
 #include <iterator>
+#include <numeric>
 #include <string_view>
 #include <tuple>
 #include <unordered_map>
@@ -15,11 +16,36 @@ namespace wordcatcher {
 namespace {
 
 constexpr std::uint32_t kJoinEdits = 1;
+constexpr char16_t kFirstBeyondAscii = 0x80;
 
 // Trying all pairings of a phrase takes steps, which cost about as much as a posting.
 constexpr std::uint64_t kStepsAPosting = 1;
 
+// So many postings before a phrase is looked at, memory is asked for it, and twice as many before for
+// where it is.
+constexpr std::size_t kValuesAhead = 4;
+
+// Costs above are rare.
+constexpr std::size_t kCountedBounds = 64;
+
 std::uint64_t apart(std::uint64_t a, std::uint64_t b) { return a < b ? b - a : a - b; }
+
+/// The items by their buckets, in each in their order. Linear in both: for what differs little, this
+/// is faster than to compare.
+template <typename Item, typename BucketOf>
+std::vector<Item> sortedByCounting(const std::vector<Item>& items, std::size_t buckets,
+                                   BucketOf bucketOf) {
+  std::vector<std::uint32_t> places(buckets + 1);
+  for (const Item& item : items) {
+    ++places[bucketOf(item) + 1];
+  }
+  std::partial_sum(places.begin(), places.end(), places.begin());
+  std::vector<Item> sorted(items.size());
+  for (const Item& item : items) {
+    sorted[places[bucketOf(item)]++] = item;
+  }
+  return sorted;
+}
 
 /// All of the order but the code units and the value.
 auto keyOf(const RankedPhrase& phrase) {
@@ -56,9 +82,16 @@ void PhraseFinder::lookUpWords() {
     const auto [place, isNew] = known.try_emplace(word.word);
     if (isNew) {
       place->second = nearWords(_image, word.word, word.limit, _options.transpositions);
+      for (const NearWord& near : place->second) {
+        _image.prefetchPostingsOf(near.word);
+        _image.prefetchOffsetOf(near.word);
+      }
+      for (const NearWord& near : place->second) {
+        _image.prefetchLabelsOf(near.word);
+      }
       if (_text.hasNumbers && !holdsDigit(word.word)) {
         std::erase_if(place->second, [&](const NearWord& near) {
-          return near.edits > 0 && holdsDigit(textOf(near, word.word.size()));
+          return near.edits > 0 && isNumber(near, word.word.size());
         });
       }
     }
@@ -68,12 +101,23 @@ void PhraseFinder::lookUpWords() {
   }
 }
 
-/// The text of a word near one of so many code units. In a damaged image it may be any length.
-std::u16string PhraseFinder::textOf(const NearWord& near, std::size_t length) const {
-  if (_image.labelsOf(near.word).size() > length + near.edits) {
+/// Whether a word near one of so many code units holds a digit. In a damaged image it may be any
+/// length.
+bool PhraseFinder::isNumber(const NearWord& near, std::size_t length) const {
+  const auto labels = _image.labelsOf(near.word);
+  if (labels.size() > length + near.edits) {
     _image.throwDamaged("a word is longer than its place in a tree says");
   }
-  return _image.textOf(near.word);
+  for (std::size_t i = 0; i < labels.size(); ++i) {
+    const char16_t unit = _image.unitOf(labels[i]);
+    if (unit >= u'0' && unit <= u'9') {
+      return true;
+    }
+    if (unit >= kFirstBeyondAscii) {
+      return holdsDigit(_image.textOf(near.word));
+    }
+  }
+  return false;
 }
 
 /// Neighbours in the text that are one stored word.
@@ -177,6 +221,8 @@ void PhraseFinder::makeSources() {
       _sources.push_back(source);
     }
   }
+  _sources = sortedByCounting(_sources, _text.words.size(),
+                              [](const Source& source) { return source.rank; });
 }
 
 /// Phrases in which words are joined or split are judged before all others, for which the bounds
@@ -243,18 +289,21 @@ std::uint64_t PhraseFinder::leastCost(const Source& source,
 
 void PhraseFinder::addSegments(std::uint32_t number, std::vector<Segment>& segments) const {
   const Source& source = _sources[number];
+  if (source.values.empty()) {
+    return;
+  }
   const auto classes = _image.phraseClasses();
-  std::uint32_t begin = 0;
-  while (begin < source.values.size()) {
-    const auto next = std::upper_bound(classes.begin(), classes.end(), source.values[begin],
-                                       [](std::uint32_t value, const image::PhraseClass& each) {
-                                         return value < each.firstValue;
-                                       });
+  auto next = classes.begin();
+  for (std::uint32_t begin = 0; begin < source.values.size();) {
+    next = std::upper_bound(next, classes.end(), source.values[begin],
+                            [](std::uint32_t value, const image::PhraseClass& each) {
+                              return value < each.firstValue;
+                            });
     if (next == classes.begin()) {
       _image.throwDamaged("its classes of phrases leave out values");
     }
     auto end = static_cast<std::uint32_t>(source.values.size());
-    if (next != classes.end()) {
+    if (next != classes.end() && source.values.back() >= next->firstValue) {
       const auto found =
           std::lower_bound(source.values.begin() + begin, source.values.end(), next->firstValue);
       // At least one, even if the image's lists do not ascend.
@@ -267,17 +316,23 @@ void PhraseFinder::addSegments(std::uint32_t number, std::vector<Segment>& segme
   }
 }
 
+/// By their bounds; of those with the same bound, the ones of rarer words first.
 std::vector<PhraseFinder::Segment> PhraseFinder::segments() const {
   std::vector<Segment> segments;
-  segments.reserve(_sources.size());
+  segments.reserve(2 * _sources.size());
   for (std::uint32_t source = 0; source < _sources.size(); ++source) {
     addSegments(source, segments);
   }
-  std::sort(segments.begin(), segments.end(), [this](const Segment& a, const Segment& b) {
-    return std::tie(a.bound, _sources[a.source].rank, a.source, a.begin) <
-           std::tie(b.bound, _sources[b.source].rank, b.source, b.begin);
+  // Nearly all bounds are small.
+  auto sorted = sortedByCounting(segments, kCountedBounds + 1, [](const Segment& segment) {
+    return std::min<std::uint64_t>(segment.bound, kCountedBounds);
   });
-  return segments;
+  const auto large = std::find_if(sorted.begin(), sorted.end(), [](const Segment& segment) {
+    return segment.bound >= kCountedBounds;
+  });
+  std::stable_sort(large, sorted.end(),
+                   [](const Segment& a, const Segment& b) { return a.bound < b.bound; });
+  return sorted;
 }
 
 std::vector<RankedPhrase> PhraseFinder::run(std::size_t limit) {
@@ -338,11 +393,23 @@ void PhraseFinder::read(const Segment& segment) {
   const Source& source = _sources[segment.source];
   const auto values = source.values.subspan(segment.begin, segment.end - segment.begin);
   const bool isAlone = isLast(source) && isOfOneLength(segment);
-  for (const std::uint32_t value : values) {
+  for (std::size_t i = 0; i < std::min(values.size(), 2 * kValuesAhead); ++i) {
+    _image.prefetchPhrasesOf(values[i]);
+  }
+  for (std::size_t i = 0; i < std::min(values.size(), kValuesAhead); ++i) {
+    _image.prefetchPhraseWordsOf(values[i]);
+  }
+  for (std::size_t i = 0; i < values.size(); ++i) {
+    if (i + 2 * kValuesAhead < values.size()) {
+      _image.prefetchPhrasesOf(values[i + 2 * kValuesAhead]);
+    }
+    if (i + kValuesAhead < values.size()) {
+      _image.prefetchPhraseWordsOf(values[i + kValuesAhead]);
+    }
     if (!spendPosting()) {
       return;
     }
-    if (_judged.insert(value).isNew && !judgeAndKeep(value, source) && isAlone) {
+    if (_judged.insert(values[i]).isNew && !judgeAndKeep(values[i], source) && isAlone) {
       return;
     }
   }
@@ -352,16 +419,23 @@ void PhraseFinder::read(const Segment& segment) {
 /// just the source's word with the text. One with several phrases says nothing about those, nor one
 /// that is paired by another of its words, under which there are more phrases.
 bool PhraseFinder::judgeAndKeep(std::uint32_t value, const Source& source) {
-  const std::uint64_t words = _image.phrasesOf(value).size();
-  if (words > _phraseWords) {
+  const auto phrases = _image.phrasesOf(value);
+  if (phrases.size() > _phraseWords) {
     _image.throwDamaged("phrases overlap");
   }
-  _phraseWords -= words;
-  const auto phrase = judge(value);
-  if (!phrase) {
+  _phraseWords -= phrases.size();
+  if (image::firstPhrase(phrases).size() < phrases.size()) {
+    if (const auto phrase = judge(value)) {
+      keep(*phrase);
+    }
     return true;
   }
-  return keep(*phrase) || phrase->phrase.size() != words || phrase->rarity > source.values.size();
+  namePairs(phrases);
+  if (isFull() && costOf(phrases, _pairing.mostGain()) > _kept.front().cost) {
+    return false;
+  }
+  const RankedPhrase phrase = solve(value, phrases);
+  return !isWithinBounds(phrase) || keep(phrase) || phrase.rarity > source.values.size();
 }
 
 /// Whether the phrase is among the best so far.
@@ -432,12 +506,17 @@ void PhraseFinder::namePairs(std::span<const std::uint32_t> phrase) {
   }
 }
 
-RankedPhrase PhraseFinder::judgePhrase(std::uint32_t value, std::span<const std::uint32_t> phrase) {
-  namePairs(phrase);
+std::uint64_t PhraseFinder::costOf(std::span<const std::uint32_t> phrase,
+                                   std::uint64_t gain) const noexcept {
+  return 2 * (_text.words.size() + phrase.size()) - gain;
+}
+
+/// The best pairing of what namePairs() named.
+RankedPhrase PhraseFinder::solve(std::uint32_t value, std::span<const std::uint32_t> phrase) {
   RankedPhrase ranked;
   ranked.steps = _steps;
   const PairingScore score = _pairing.solve(_steps);
-  ranked.cost = 2 * (_text.words.size() + phrase.size()) - score.gain;
+  ranked.cost = costOf(phrase, score.gain);
   ranked.words = score.words;
   ranked.exact = score.exact;
   ranked.breaks = score.breaks;
@@ -460,7 +539,8 @@ std::optional<RankedPhrase> PhraseFinder::bestOf(std::uint32_t value, Admit admi
   while (!phrases.empty()) {
     const auto phrase = image::firstPhrase(phrases);
     phrases = phrases.subspan(phrase.size());
-    const RankedPhrase judged = judgePhrase(value, phrase);
+    namePairs(phrase);
+    const RankedPhrase judged = solve(value, phrase);
     if (admit(judged) && (!best || comesBefore(judged, *best))) {
       best = judged;
     }
@@ -479,7 +559,11 @@ std::optional<RankedPhrase> PhraseFinder::judge(std::uint32_t value) {
 
 RankedPhrase PhraseFinder::judgeAnyway(std::uint32_t value) {
   const auto best = bestOf(value, [](const RankedPhrase&) { return true; });
-  return best ? *best : judgePhrase(value, {});
+  if (!best) {
+    namePairs({});
+    return solve(value, {});
+  }
+  return *best;
 }
 
 std::vector<Pair> PhraseFinder::pairsOf(const RankedPhrase& phrase) {

@@ -101,7 +101,7 @@ class PhraseFinder {
   };
 
   void lookUpWords();
-  std::u16string textOf(const NearWord& near, std::size_t length) const;
+  bool isNumber(const NearWord& near, std::size_t length) const;
   void lookUpJoins();
   void lookUpSplits();
   void makeTable();
@@ -124,7 +124,8 @@ class PhraseFinder {
   template <typename Admit>
   std::optional<RankedPhrase> bestOf(std::uint32_t value, Admit admit);
   bool isWithinBounds(const RankedPhrase& phrase) const;
-  RankedPhrase judgePhrase(std::uint32_t value, std::span<const std::uint32_t> phrase);
+  RankedPhrase solve(std::uint32_t value, std::span<const std::uint32_t> phrase);
+  std::uint64_t costOf(std::span<const std::uint32_t> phrase, std::uint64_t gain) const noexcept;
   std::span<const WordOption> optionsOf(std::uint32_t word) const;
   std::uint64_t unitsOf(std::span<const std::uint32_t> phrase) const;
 

@@ -239,11 +239,7 @@ std::u16string SearchImage::textOf(std::uint32_t word) const {
   const Labels labels = labelsOf(word);
   text.reserve(labels.size());
   for (std::size_t i = 0; i < labels.size(); ++i) {
-    const std::uint16_t label = labels[i];
-    if (label >= _labels.size()) {
-      throwDamaged("a word holds a label that is not there");
-    }
-    text += static_cast<char16_t>(_labels[label]);
+    text += unitOf(labels[i]);
   }
   return text;
 }

@@ -73,6 +73,14 @@ class SearchImage {
     }
   }
 
+  /// The code unit of a label of a word.
+  char16_t unitOf(std::uint16_t label) const {
+    if (label >= _labels.size()) {
+      throwDamaged("a word holds a label that is not there");
+    }
+    return static_cast<char16_t>(_labels[label]);
+  }
+
   std::u16string textOf(std::uint32_t word) const;
 
   /// The same for a word of so many code units, as a tree says. Throws Error (damaged) for another
@@ -125,9 +133,17 @@ class SearchImage {
     }
     return _phraseWords.subspan(begin, end - begin);
   }
+
+  /// Ask memory early for what phrasesOf() will read: first the offset, some time later the words.
+  /// Any value may be given.
   void prefetchPhrasesOf(std::uint32_t value) const noexcept {
     if (value < _valueCount) {
       __builtin_prefetch(&_phraseOffsets[value]);
+    }
+  }
+  void prefetchPhraseWordsOf(std::uint32_t value) const noexcept {
+    if (value < _valueCount && _phraseOffsets[value] < _phraseWords.size()) {
+      __builtin_prefetch(&_phraseWords[_phraseOffsets[value]]);
     }
   }
 
