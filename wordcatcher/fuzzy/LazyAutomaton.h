@@ -69,7 +69,7 @@ class LazyAutomaton {
 
   /// The same, also beyond the depths of all states that are not dead.
   Number nextAnywhere(Number from, std::size_t depth, std::uint16_t label) {
-    return next(from, std::min(depth, _memory.classes.size() - 1), label);
+    return next(from, std::min(depth, _lastDepth), label);
   }
 
   const State& operator[](Number state) const noexcept { return _memory.states[state]; }
@@ -100,6 +100,7 @@ class LazyAutomaton {
   /// For one more depth.
   void addClasses() {
     const std::size_t depth = _memory.classes.size();
+    _lastDepth = depth;
     auto& classes = _memory.classes.emplace_back();
     std::uint8_t last = 0;
     for (unsigned column = 0; column < Pattern::kWindow; ++column) {
@@ -224,6 +225,7 @@ class LazyAutomaton {
   const Pattern& _pattern;
   bool _backward;
   AutomatonMemory& _memory;
+  std::size_t _lastDepth = 0;  // that has classes
 };
 
 }  // namespace wordcatcher
