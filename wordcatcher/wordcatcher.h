@@ -6,13 +6,25 @@
    Wordcatcher for C, and for every language that can call C: finds, inside free text, phrases that
    were stored earlier, tolerating spelling mistakes.
 
-       wordcatcher_index* index;
-       wordcatcher_findings* findings;
-       wordcatcher_error error;
-       if (wordcatcher_index_open("names.wci", NULL, &index, &error) != WORDCATCHER_OK ||
-           wordcatcher_index_find(index, text, WORDCATCHER_NUL, NULL, &findings, &error) !=
-               WORDCATCHER_OK) {
-         fprintf(stderr, "%s\n", error.message);
+       #include <stdio.h>
+       #include "wordcatcher/wordcatcher.h"
+
+       int main(void) {
+         wordcatcher_index* index = NULL;
+         wordcatcher_findings* findings = NULL;
+         wordcatcher_error error;
+         if (wordcatcher_index_open("names.wci", NULL, &index, &error) != WORDCATCHER_OK ||
+             wordcatcher_index_find(index, "holidays in tobbago", WORDCATCHER_NUL, NULL, &findings,
+                                    &error) != WORDCATCHER_OK) {
+           fprintf(stderr, "%s\n", error.message);
+         }
+         for (size_t i = 0; i < wordcatcher_findings_count(findings); ++i) {
+           puts(wordcatcher_findings_at(findings, i)->value);
+         }
+         wordcatcher_findings_free(findings);
+         wordcatcher_index_close(index);
+         return error.code == WORDCATCHER_OK ? 0 : 1;
+       }
 
    1. Handles. Types without a body are opaque. Whatever a function hands out through a `**`
       argument is the caller's, who gives it back to the one function that takes it back
