@@ -159,8 +159,9 @@ TEST(FindBudgetTest, NoMatchesAtAll) {
 
 TEST(FindBudgetTest, EditLimitsThatAreTooLarge) {
   const auto index = indexOfPhrases({"Thames", "Severn"});
-  for (const auto limit : {&EditLimits::shortEdits, &EditLimits::mediumEdits,
-                           &EditLimits::longEdits, &EditLimits::wholeTextEdits}) {
+  for (const auto limit :
+       {&EditLimits::shortEdits, &EditLimits::mediumEdits, &EditLimits::longEdits,
+        &EditLimits::wholeTextEdits, &EditLimits::numberEdits}) {
     FindOptions options;
     options.edits.*limit = EditLimits::kMaxEdits;
     EXPECT_NO_THROW(index.find("thames", options));

@@ -201,7 +201,8 @@ enum {
 
 /** What wordcatcher_index_find() looks for and how much of it. The lengths that make a word short,
    medium or long are UTF-16 code units of its lower-case form; an edit is one code unit replaced,
-   inserted or left out. Edits are at most 3 each. */
+   inserted or left out. Edits are at most 3 each. Words that hold a digit are only found exactly,
+   which `number_edits` alone relaxes. */
 typedef struct wordcatcher_find_options {
   size_t size;               /**< set by wordcatcher_find_options_init() */
   size_t limit;              /**< matches at the most: the first ones of all; 10 */
@@ -216,6 +217,8 @@ typedef struct wordcatcher_find_options {
   int32_t transpositions;    /**< not 0: two neighbours swapped are one edit, not two; 1 */
   int32_t overlaps;          /**< WORDCATCHER_OVERLAPS_...; all */
   uint64_t max_postings;     /**< postings (phrases under a word) that are looked at; 2,000,000 */
+  uint64_t number_edits;     /**< edits of a word when it or the stored word holds a digit: at most
+                                those that its length allows; 0 */
 } wordcatcher_find_options;
 
 /** Fills the options with the defaults named above. `size`: sizeof *options. NULL does nothing. */
@@ -265,7 +268,8 @@ WORDCATCHER_EXPORT const wordcatcher_finding* wordcatcher_findings_at(
 WORDCATCHER_EXPORT const wordcatcher_hit* wordcatcher_findings_hit(
     const wordcatcher_findings* findings, size_t finding, size_t hit);
 
-/** Whether a budget cut something off. */
+/** Whether a budget cut something off. Then there may be better phrases than these, and another
+   limit may list others. */
 WORDCATCHER_EXPORT bool wordcatcher_findings_truncated(const wordcatcher_findings* findings);
 
 /** Gives the result back. */

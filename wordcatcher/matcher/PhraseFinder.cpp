@@ -58,7 +58,8 @@ void PhraseFinder::lookUpWords() {
       place->second = nearWords(_image, word.word, word.limit, _options.transpositions);
       if (_text.hasNumbers && !holdsDigit(word.word)) {
         std::erase_if(place->second, [&](const NearWord& near) {
-          return near.edits > 0 && holdsDigit(textOf(near, word.word.size()));
+          return near.edits > _options.edits.numberEdits &&
+                 holdsDigit(textOf(near, word.word.size()));
         });
       }
     }
