@@ -5,6 +5,7 @@
 #include <charconv>
 #include <cstdint>
 #include <map>
+#include <optional>
 #include <string>
 
 namespace wordcatcher::cli {
@@ -39,14 +40,20 @@ CLI::Option* addCount(CLI::App& verb, const std::string& name, Number& number, s
                                             " with commas between, such as 0,1,2");
 }
 
-std::uint32_t parsedLimit(const std::string& text) {
-  std::uint32_t limit = 0;
+[[noreturn]] void throwBadLengths() {
+  throw CLI::ValidationError("--lengths",
+                             "give 2 whole numbers with a comma between, the smaller one first, "
+                             "such as 2,5");
+}
+
+/// A whole number of digits alone, up to `most`; nothing for anything else.
+template <typename Number>
+std::optional<Number> parsedNumber(const std::string& text, Number most) {
+  Number number = 0;
   const char* const end = text.data() + text.size();
-  const auto [stop, error] = std::from_chars(text.data(), end, limit);
-  if (error != std::errc() || stop != end || limit > EditLimits::kMaxEdits) {
-    throwBadEdits();
-  }
-  return limit;
+  const auto [stop, error] = std::from_chars(text.data(), end, number);
+  return error == std::errc() && stop == end && number <= most ? std::optional(number)
+                                                               : std::nullopt;
 }
 
 /// Sets the limits of short, medium and long words and, if it is given, that of whole texts.
@@ -58,17 +65,69 @@ void setEdits(const std::string& list, EditLimits& edits) {
     throwBadEdits();
   }
   for (std::size_t i = 0; i < limits.size(); ++i) {
-    *targets.at(i) = parsedLimit(limits[i]);
+    const auto limit = parsedNumber(limits[i], EditLimits::kMaxEdits);
+    if (!limit) {
+      throwBadEdits();
+    }
+    *targets.at(i) = *limit;
   }
+}
+
+void setNumberEdits(const std::string& number, EditLimits& edits) {
+  const auto limit = parsedNumber(number, EditLimits::kMaxEdits);
+  if (!limit) {
+    throw CLI::ValidationError("--number-edits",
+                               "give a number from 0 to " + std::to_string(EditLimits::kMaxEdits));
+  }
+  edits.numberEdits = *limit;
+}
+
+/// Sets up to which lengths words are short and medium.
+void setLengths(const std::string& list, EditLimits& edits) {
+  const auto lengths = CLI::detail::split(list, ',');
+  if (lengths.size() != 2) {
+    throwBadLengths();
+  }
+  const auto shortLength = parsedNumber(lengths[0], SIZE_MAX);
+  const auto mediumLength = parsedNumber(lengths[1], SIZE_MAX);
+  if (!shortLength || !mediumLength || *shortLength > *mediumLength) {
+    throwBadLengths();
+  }
+  edits.shortLength = *shortLength;
+  edits.mediumLength = *mediumLength;
 }
 
 std::string editsDescription() {
   const EditLimits edits;
   return "Edits that a word of the text may have:\nof up to " + std::to_string(edits.shortLength) +
          " letters, of up to " + std::to_string(edits.mediumLength) +
-         ", of more; a 4th number is for whole texts.\nDefault: " +
+         ", of more (see --lengths);\na 4th number is for whole texts. Words that hold a digit\n"
+         "are only found exactly (see --number-edits).\nDefault: " +
          std::to_string(edits.shortEdits) + ',' + std::to_string(edits.mediumEdits) + ',' +
          std::to_string(edits.longEdits) + ',' + std::to_string(edits.wholeTextEdits);
+}
+
+std::string numberEditsDescription() {
+  return "Edits that a word may have if it, or the stored word, holds\na digit; at most those that "
+         "its length allows.\nDefault: " +
+         std::to_string(EditLimits().numberEdits);
+}
+
+std::string lengthsDescription() {
+  const EditLimits edits;
+  return "The letters up to which a word has the first of the --edits,\nand the "
+         "second.\nDefault: " +
+         std::to_string(edits.shortLength) + ',' + std::to_string(edits.mediumLength);
+}
+
+/// Adds an option for text that is taken apart as it is set.
+CLI::Option* addLimits(CLI::App& verb, const std::string& name,
+                       void (*set)(const std::string& text, EditLimits& edits), EditLimits& edits,
+                       const std::string& description, const std::string& type) {
+  return verb
+      .add_option_function<std::string>(
+          name, [&edits, set](const std::string& text) { set(text, edits); }, description)
+      ->type_name(type);
 }
 
 }  // namespace
@@ -80,14 +139,15 @@ std::vector<CLI::Option*> addMatchOptions(CLI::App& verb, FindOptions& options) 
                                   "Words of a phrase that the text must hold")
                              ->default_str(std::to_string(options.minWords));
   auto* const edits =
-      verb.add_option_function<std::string>(
-              "--edits", [&options](const std::string& list) { setEdits(list, options.edits); },
-              editsDescription())
-          ->type_name("LIST");
+      addLimits(verb, "--edits", &setEdits, options.edits, editsDescription(), "LIST");
+  auto* const numberEdits = addLimits(verb, "--number-edits", &setNumberEdits, options.edits,
+                                      numberEditsDescription(), "N");
+  auto* const lengths =
+      addLimits(verb, "--lengths", &setLengths, options.edits, lengthsDescription(), "LIST");
   auto* const transpositions = verb.add_flag_callback(
       "--no-transpositions", [&options] { options.transpositions = false; },
       "Count two neighbouring letters that changed places as two edits, not one");
-  return {maxCost, minWords, edits, transpositions};
+  return {maxCost, minWords, edits, numberEdits, lengths, transpositions};
 }
 
 std::vector<CLI::Option*> addListOptions(CLI::App& verb, FindOptions& options) {

@@ -12,6 +12,9 @@ namespace {
 constexpr const char* kBegin = "Where it begins in the text, in code points, as slices count.";
 constexpr const char* kEnd = "Where it ends in the text: the code point behind its last one.";
 constexpr const char* kTruncated = "Whether a budget cut something off.";
+constexpr const char* kFindTruncated =
+    "Whether a budget cut something off. Then there may be better phrases than these, and another\n"
+    "limit may list others.";
 constexpr const char* kText = "The text that was asked about.";
 constexpr const char* kValue = "The value that was asked about.";
 constexpr const char* kIsStored = "Whether the index holds the value.";
@@ -25,9 +28,11 @@ medium_length   a longer one of up to so many is medium; all others are long.
 short_edits     Edits of a short word,
 medium_edits    of a medium one,
 long_edits      of a long one,
-whole_text_edits  of a whole text, in an index of whole texts; each at most 3.
+whole_text_edits  of a whole text, in an index of whole texts,
+number_edits    of a word when it or the stored word holds a digit: at most those that its length
+                allows; each at most 3.
 
-Words that hold a digit are only found exactly.)";
+Words that hold a digit are only found exactly, which number_edits alone relaxes.)";
 
 void bindLimits(py::module_& module) {
   const EditLimits limits;
@@ -37,10 +42,11 @@ void bindLimits(py::module_& module) {
                                  ", medium_edits=" + std::to_string(limits.mediumEdits) +
                                  ", long_edits=" + std::to_string(limits.longEdits) +
                                  ", whole_text_edits=" + std::to_string(limits.wholeTextEdits) +
-                                 ")";
+                                 ", number_edits=" + std::to_string(limits.numberEdits) + ")";
   const auto make = [](const py::object& shortLength, const py::object& mediumLength,
                        const py::object& shortEdits, const py::object& mediumEdits,
-                       const py::object& longEdits, const py::object& wholeTextEdits) {
+                       const py::object& longEdits, const py::object& wholeTextEdits,
+                       const py::object& numberEdits) {
     const auto edits = [](const py::object& value, const char* name) {
       const std::uint64_t number = count(value, name);
       if (number > EditLimits::kMaxEdits) {
@@ -49,10 +55,10 @@ void bindLimits(py::module_& module) {
       }
       return static_cast<std::uint32_t>(number);
     };
-    return EditLimits{
-        count(shortLength, "short_length"), count(mediumLength, "medium_length"),
-        edits(shortEdits, "short_edits"),   edits(mediumEdits, "medium_edits"),
-        edits(longEdits, "long_edits"),     edits(wholeTextEdits, "whole_text_edits")};
+    return EditLimits{count(shortLength, "short_length"), count(mediumLength, "medium_length"),
+                      edits(shortEdits, "short_edits"),   edits(mediumEdits, "medium_edits"),
+                      edits(longEdits, "long_edits"),     edits(wholeTextEdits, "whole_text_edits"),
+                      edits(numberEdits, "number_edits")};
   };
   bindRecord(
       module, "EditLimits", documented("EditLimits(" + parameters, kLimitsDoc).c_str(),
@@ -61,12 +67,15 @@ void bindLimits(py::module_& module) {
       Field{"short_edits", &EditLimits::shortEdits, "Edits of a short word."},
       Field{"medium_edits", &EditLimits::mediumEdits, "Edits of a medium word."},
       Field{"long_edits", &EditLimits::longEdits, "Edits of a long word."},
-      Field{"whole_text_edits", &EditLimits::wholeTextEdits, "Edits of a whole text."})
+      Field{"whole_text_edits", &EditLimits::wholeTextEdits, "Edits of a whole text."},
+      Field{"number_edits", &EditLimits::numberEdits,
+            "Edits of a word when it or the stored word holds a digit."})
       .def(py::init(make), py::kw_only(), py::arg("short_length") = limits.shortLength,
            py::arg("medium_length") = limits.mediumLength,
            py::arg("short_edits") = limits.shortEdits, py::arg("medium_edits") = limits.mediumEdits,
            py::arg("long_edits") = limits.longEdits,
            py::arg("whole_text_edits") = limits.wholeTextEdits,
+           py::arg("number_edits") = limits.numberEdits,
            documented("__init__(self, " + parameters, "Makes limits.").c_str());
 }
 
@@ -90,7 +99,7 @@ void bindFind(py::module_& module) {
       module, "FindResult",
       "The phrases that a text holds, a sequence of FoundPhrase with the best one first.",
       Field{"matches", &FindResult::matches, "All of them, as a tuple."},
-      Field{"truncated", &FindResult::truncated, kTruncated});
+      Field{"truncated", &FindResult::truncated, kFindTruncated});
   bindSequence(result);
 }
 
@@ -137,12 +146,18 @@ void bindFindExplanation(py::module_& module) {
   bindRecord(module, "WordComparison", "A word of a phrase beside a word of the text.",
              Field{"word", &Comparison::word, "Of the phrase."},
              Field{"edits", &Comparison::edits, "Between the two."},
+             Field{"limit", &Comparison::limit,
+                   "Edits that the two may have: less if one of them holds a digit."},
              Field{"within", &Comparison::within, "Whether the two may be paired."});
   bindRecord(
       module, "TextWord", "A word of the text.", Field{"begin", &TextWord::begin, kBegin},
       Field{"end", &TextWord::end, kEnd}, Field{"word", &TextWord::word, "As it is looked up."},
-      Field{"limit", &TextWord::limit, "Edits that it may have."},
-      Field{"comparisons", &TextWord::comparisons, "With each word of the phrase, in its order."});
+      Field{"written", &TextWord::written, "If that is a code, as it is in the text; else empty."},
+      Field{"length_limit", &TextWord::lengthLimit, "Edits that it may have by its length."},
+      Field{"limit", &TextWord::limit, "Edits that it may have: less if it holds a digit."},
+      Field{"is_looked_up", &TextWord::isLookedUp, "False for a word that is too long."},
+      Field{"comparisons", &TextWord::comparisons,
+            "With the words of the phrase, in its order; with some or none if truncated."});
   bindRecord(
       module, "FindExplanation",
       "Why a value has its cost for a text, or why find() does not list it.\n\n"
@@ -155,7 +170,8 @@ void bindFindExplanation(py::module_& module) {
       Field{"phrase", &FindExplanation::phrase, "The words of the phrase that fits best."},
       Field{"pairs", &FindExplanation::pairs, "What was paired, in the order of the text."},
       Field{"missing", &FindExplanation::missing, "Words of the phrase that the text lacks."},
-      Field{"surplus", &FindExplanation::surplus, "Words of the text that are left over."},
+      Field{"surplus", &FindExplanation::surplus,
+            "Words of the text that are left over; in an index of codes with their codes."},
       Field{"edits", &FindExplanation::edits, "Of the pairs."},
       Field{"cost", &FindExplanation::cost, "Edits, and 2 for each missing and surplus word."},
       Field{"objections", &FindExplanation::objections,

@@ -3,7 +3,9 @@
 #include <gtest/gtest.h>
 #include <rapidcheck/gtest.h>
 
+#include <stdexcept>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "wordcatcher/text/Unicode.h"
@@ -60,6 +62,26 @@ RC_GTEST_PROP(ByteOffsetsTest, OfPiecesOfCharacters, ()) {
                                      '\x98', '\x80', '\xED', '\xA0');
   expectOffsetsOf(*rc::gen::container<std::string>(byte));
   RC_ASSERT(!::testing::Test::HasFailure());
+}
+
+TEST(UnicodeTest, WhatIsLongerThanIcuCountsIsRefusedWithAdvice) {
+  constexpr std::size_t kTooLong = std::size_t{1} << 31;
+  // Nothing behind the first is read.
+  const std::u16string_view units(u"a", kTooLong);
+  const std::string_view bytes("a", kTooLong);
+  const auto expectRefused = [](const auto& convert) {
+    try {
+      convert();
+      ADD_FAILURE() << "It was taken.";
+    } catch (const std::length_error& error) {
+      EXPECT_STREQ(
+          error.what(),
+          "A text must not be longer than 2,147,483,647 code units; give it in shorter pieces.");
+    }
+  };
+  expectRefused([&] { toLower(units); });
+  expectRefused([&] { toUpper(units); });
+  expectRefused([&] { decodeUtf8(bytes); });
 }
 
 }  // namespace

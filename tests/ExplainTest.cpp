@@ -52,13 +52,18 @@ void expectSameInJson(const FindExplanation& explained) {
   for (const auto& word : explained.words) {
     json comparisons = json::array();
     for (const auto& other : word.comparisons) {
-      comparisons.push_back(
-          {{"word", other.word}, {"edits", other.edits}, {"within", other.within}});
+      comparisons.push_back({{"word", other.word},
+                             {"edits", other.edits},
+                             {"limit", other.limit},
+                             {"within", other.within}});
     }
     words.push_back({{"begin", word.begin},
                      {"end", word.end},
                      {"word", word.word},
+                     {"written", word.written},
+                     {"lengthLimit", word.lengthLimit},
                      {"limit", word.limit},
+                     {"isLookedUp", word.isLookedUp},
                      {"comparisons", comparisons}});
   }
   EXPECT_EQ(object.at("words"), words);
@@ -88,7 +93,10 @@ TEST(ExplainTest, TellsWhatAPhraseCosts) {
   EXPECT_EQ(word.begin, 3U);
   EXPECT_EQ(word.end, 11U);
   EXPECT_EQ(word.word, "trinidat");
+  EXPECT_EQ(word.written, "") << "it is no code";
   EXPECT_EQ(word.limit, 2U);
+  EXPECT_EQ(word.lengthLimit, 2U);
+  EXPECT_TRUE(word.isLookedUp);
   ASSERT_EQ(word.comparisons.size(), 3U);
   EXPECT_EQ(word.comparisons[0].word, "trinidad");
   EXPECT_EQ(word.comparisons[0].edits, 1U);
@@ -153,9 +161,6 @@ void expectAbsent(const FindExplanation& explained, const Values& reasons) {
 
 TEST(ExplainTest, TellsWhyAPhraseIsAbsent) {
   const auto index = places();
-  const auto unknown = index.explain("trinidad", "Trinidad");
-  EXPECT_FALSE(unknown.isStored);
-  expectAbsent(unknown, {"holds no such data string"});
   const auto far = index.explain("tribidax bosmian", "Route 66");
   EXPECT_TRUE(far.isStored);
   EXPECT_EQ(far.cost, 8U);
@@ -185,12 +190,19 @@ TEST(ExplainTest, TellsWhyAMatchIsNotListed) {
   const std::string text = "new york minster";
   FindOptions options;
   options.limit = 3;
-  expectAbsent(index.explain(text, "York", options), {"not among the first 3"});
+  expectAbsent(index.explain(text, "York", options),
+               {"not among the first 3 in order, which is the limit: its place is 4."});
   options.limit = 4;
   EXPECT_TRUE(index.explain(text, "York", options).isFound);
   options.overlaps = Overlaps::noSub;
   expectAbsent(index.explain(text, "York", options), {"within the larger one"});
   EXPECT_TRUE(index.explain(text, "New York", options).isFound);
+  options.limit = 1;
+  expectAbsent(index.explain(text, "York", options), {"within the larger one"});
+  EXPECT_TRUE(index.explain(text, "New York", options).isFound);
+  expectAbsent(index.explain(text, "York Minster", options),
+               {"not among the first 1 in order, which is the limit: its place is 2."});
+  options.limit = 4;
   options.overlaps = Overlaps::longest;
   EXPECT_TRUE(index.explain(text, "York Minster", options).isFound);
   expectAbsent(index.explain(text, "New York", options), {"overlaps that of another match"});
@@ -220,12 +232,149 @@ TEST(ExplainTest, TellsOfTheBudgetOfPostings) {
   EXPECT_LT(listed, 3U);
 }
 
+TEST(ExplainTest, TheBudgetMayHideThePlace) {
+  const auto index = indexOfPhrases({"Lake", "Lake Como", "Lake Geneva", "Lake Constance"});
+  FindOptions options;
+  options.limit = 1;
+  options.maxPostings = 2;
+  ASSERT_FALSE(index.find("lake", options).truncated);
+  std::size_t hidden = 0;
+  for (const std::string value : {"Lake Como", "Lake Geneva", "Lake Constance"}) {
+    const auto explained = index.explain("lake", value, options);
+    expectAbsent(explained, {"not among the first 1 in order, which is the limit"});
+    hidden +=
+        explained.objections[0].find("does not suffice to tell its place") != std::string::npos ? 1
+                                                                                                : 0;
+  }
+  EXPECT_EQ(hidden, 2U) << "of three, one more can be looked at";
+}
+
+TEST(ExplainTest, AValueThatIsNotExactIsNamedAsFindPrintsIt) {
+  const auto index = places();
+  const auto explained = index.explain("trinidad", "Trinidad and Tobago");
+  EXPECT_FALSE(explained.isStored);
+  expectAbsent(explained, {"The index holds no such data string; give one just as find prints it, "
+                           "such as \"Trinidad and Tobago{ TT }\"."});
+  expectAbsent(index.explain("zealand", "new zeland{ GB }"), {"\"New Zealand{ NZ }\""});
+  for (const std::string value : {"Xyzzyx", "", "..."}) {
+    const auto strange = index.explain("trinidad", value);
+    EXPECT_FALSE(strange.isStored);
+    expectAbsent(strange, {"give one just as find prints it."});
+  }
+  const auto texts = indexOf(Entries{{"Baker Street", "B{ 1 }"}}, MatchingMode::wholeText);
+  expectAbsent(texts.explain("x", "baker streat"), {"such as \"B{ 1 }\""});
+  const auto sounds = indexOf(Entries{{"Catherine", "C{ 1 }"}}, MatchingMode::phoneticWords);
+  expectAbsent(sounds.explain("x", "Kathryn"), {"such as \"C{ 1 }\""});
+}
+
 TEST(ExplainTest, NumbersAreNotNear) {
   const auto explained = places().explain("route 67", "Route 66");
   ASSERT_EQ(explained.words.size(), 2U);
-  EXPECT_EQ(explained.words[1].comparisons.at(1).edits, 1U);
-  EXPECT_FALSE(explained.words[1].comparisons.at(1).within);
+  const auto& number = explained.words[1];
+  EXPECT_EQ(number.limit, 0U);
+  EXPECT_EQ(number.lengthLimit, 0U) << "so short a word is not near anything";
+  EXPECT_EQ(number.comparisons.at(1).edits, 1U);
+  EXPECT_FALSE(number.comparisons.at(1).within);
   EXPECT_EQ(explained.cost, 4U);
+}
+
+TEST(ExplainTest, TellsThatADigitKeepsWordsApart) {
+  const auto index = indexOfPhrases({"covid19 vaccine", "b2b"});
+  const auto stored = index.explain("covidy", "covid19 vaccine");
+  ASSERT_EQ(stored.words.size(), 1U);
+  EXPECT_EQ(stored.words[0].limit, 2U);
+  EXPECT_EQ(stored.words[0].comparisons.at(0).edits, 2U);
+  EXPECT_EQ(stored.words[0].comparisons.at(0).limit, 0U);
+  EXPECT_EQ(stored.words[0].comparisons.at(1).limit, 2U);
+  EXPECT_NE(stored.toText().find("  covidy, up to 2 edits: covid19 2 (words with a digit must be "
+                                 "the same), vaccine 6\n"),
+            std::string::npos)
+      << stored.toText();
+  expectAbsent(stored, {"None",
+                        "A word that holds a digit must be the same, and \"covidy\" is 2 "
+                        "edits from \"covid19\"."});
+  const auto given = index.explain("b2c", "b2b");
+  EXPECT_EQ(given.words.at(0).limit, 0U);
+  EXPECT_EQ(given.words.at(0).lengthLimit, 1U);
+  EXPECT_NE(given.toText().find("  b2c, up to 0 edits as it holds a digit: b2b 1 (words with a "
+                                "digit must be the same)\n"),
+            std::string::npos)
+      << given.toText();
+  expectAbsent(given, {"None", R"("b2c" is 1 edit from "b2b".)"});
+  // It says so only where that is the reason.
+  EXPECT_TRUE(index.explain("covidy vaccine", "covid19 vaccine").isFound);
+  expectAbsent(index.explain("covid", "b2b"), {"None"});
+  FindOptions dear;
+  dear.maxCost = 0;
+  expectAbsent(index.explain("b2b b2c", "b2b", dear), {"cost"});
+  expectAbsent(indexOfPhrases({"b2b b2c"}).explain("b2b", "b2b b2c", dear), {"cost"});
+}
+
+TEST(ExplainTest, TellsOfTheEditsOfNumbers) {
+  const auto index = indexOfPhrases({"covid19 vaccine", "b2b"});
+  FindOptions options;
+  options.edits.numberEdits = 1;
+  const auto found = index.explain("b2c", "b2b", options);
+  EXPECT_EQ(found.cost, 1U);
+  EXPECT_EQ(found.words.at(0).limit, 1U);
+  EXPECT_NE(found.toText().find("  b2c, up to 1 edit: b2b 1 (near)\n"), std::string::npos);
+  const auto far = index.explain("covidy", "covid19 vaccine", options);
+  EXPECT_EQ(far.words.at(0).comparisons.at(0).limit, 1U);
+  EXPECT_NE(far.toText().find("covid19 2 (words with a digit: up to 1 edit), "), std::string::npos);
+  expectAbsent(far, {"None", "may have up to 1 edit, and \"covidy\" is 2 edits from"});
+  options.edits.numberEdits = 3;
+  EXPECT_EQ(index.explain("b2c", "b2b", options).words.at(0).limit, 1U) << "no more than others";
+  EXPECT_EQ(index.explain("covidy", "covid19 vaccine", options).cost, 4U);
+}
+
+TEST(ExplainTest, ComparesAsManyWordsAsTheBudgetAllows) {
+  std::string text;
+  std::string phrase;
+  for (int i = 0; i < 400; ++i) {
+    text += "tarn ";
+    phrase += "tree ";
+  }
+  const auto index = indexOfPhrases({phrase, "tree"});
+  const auto explained = index.explain(text + "tree", phrase);
+  EXPECT_TRUE(explained.truncated);
+  EXPECT_TRUE(explained.isFound) << "what is compared for people does not count";
+  std::size_t comparisons = 0;
+  for (const auto& word : explained.words) {
+    comparisons += word.comparisons.size();
+    EXPECT_TRUE(word.isLookedUp);
+  }
+  EXPECT_EQ(explained.words.size(), 401U);
+  EXPECT_EQ(comparisons, FindExplanation::kMaxSteps / FindExplanation::kComparisonSteps);
+  EXPECT_EQ(explained.words.front().comparisons.size(), 400U);
+  EXPECT_TRUE(explained.words.back().comparisons.empty());
+  EXPECT_NE(explained.toText().find("  tree, up to 1 edit: ... (beyond the budget)\n"),
+            std::string::npos);
+  expectSameInJson(explained);
+  EXPECT_FALSE(index.explain(text, "tree").truncated);
+}
+
+TEST(ExplainTest, ComparingLongWordsTakesMoreOfTheBudget) {
+  Index::Options budgets;
+  budgets.maxWordUnits = 5000;
+  const std::string tree(4096, 't');
+  const auto index = indexOfPhrases({tree, tree + " tree"}, MatchingMode::words, budgets);
+  EXPECT_FALSE(index.explain(tree, tree).truncated) << "just as much as there is";
+  const auto explained = index.explain(tree, tree + " tree");
+  EXPECT_TRUE(explained.truncated);
+  EXPECT_EQ(explained.words.at(0).comparisons.size(), 1U);
+  EXPECT_EQ(explained.missing, Values{"tree"});
+}
+
+TEST(ExplainTest, NothingIsComparedBehindWhatIsBeyondTheBudget) {
+  Index::Options budgets;
+  budgets.maxWordUnits = 5000;
+  const std::string tree(4000, 't');
+  const std::string phrase = tree + ' ' + tree;
+  const auto index = indexOfPhrases({phrase}, MatchingMode::words, budgets);
+  const auto explained = index.explain(tree + " tree", phrase);
+  EXPECT_TRUE(explained.truncated);
+  EXPECT_EQ(explained.words.at(0).comparisons.size(), 1U);
+  EXPECT_TRUE(explained.words.at(1).comparisons.empty()) << "there would be room for it";
 }
 
 TEST(ExplainTest, SwapsCountAsTheOptionSays) {
@@ -280,6 +429,19 @@ TEST(ExplainTest, OtherModes) {
   EXPECT_EQ(code.words.at(1).word, "k0rn");
   EXPECT_EQ(code.words.at(1).limit, 0U);
   EXPECT_EQ(code.words.at(1).begin, 5U);
+  EXPECT_EQ(code.words.at(1).written, "Kathryn");
+  EXPECT_EQ(code.surplus, Values{"dear (tr)"});
+  expectSameInJson(code);
+  EXPECT_EQ(code.toText(),
+            "Text:   dear Kathryn\n"
+            "Value:  C\n"
+            "Phrase: k0rn\n"
+            "  dear (tr), up to 0 edits: k0rn 3\n"
+            "  Kathryn (k0rn), up to 0 edits: k0rn 0 (near)\n"
+            "Paired: Kathryn with k0rn, 0 edits\n"
+            "Missing from the text: none\n"
+            "Left over in the text: dear (tr)\n"
+            "Cost: 2 = 0 edits + 2 x 0 missing + 2 x 1 left over\n");
   expectAbsent(sounds.explain("Kathryn", "P"), {"None"});
 }
 
@@ -370,10 +532,14 @@ TEST_P(ExplainQueryTest, AgreesWithTheQueryThatIsCutOff) {
 
 TEST_P(ExplainQueryTest, OfAValueThatIsNotThere) {
   const auto index = indexOfPhrases({"Delta Wing"}, GetParam());
-  const auto explained = index.explainQuery("delta wing", "Wing");
+  const auto explained = index.explainQuery("delta wing", "Delta Winx");
   EXPECT_FALSE(explained.isStored);
   EXPECT_FALSE(explained.isFound);
-  EXPECT_NE(explained.toText().find("holds no such data string"), std::string::npos);
+  ASSERT_EQ(explained.steps.size(), 1U);
+  EXPECT_EQ(explained.steps[0].sentence,
+            "The index holds no such data string; give one just as find prints it, such as \"Delta "
+            "Wing\".");
+  EXPECT_NE(explained.toText().find("1. The index holds no such data string; "), std::string::npos);
 }
 
 INSTANTIATE_TEST_SUITE_P(Modes, ExplainQueryTest,
@@ -389,6 +555,41 @@ TEST(ExplainQueryTextTest, InWords) {
       std::string::npos)
       << explained.toText();
   EXPECT_NE(explained.toText().find("so this one is."), std::string::npos);
+}
+
+TEST(ExplainQueryTextTest, OfWholeTexts) {
+  const auto index = indexOfPhrases({"Baker Street"}, MatchingMode::wholeText);
+  const auto sentence = [&index](const std::string& text) {
+    return index.explainQuery(text, "Baker Street").steps.at(0).sentence;
+  };
+  EXPECT_EQ(sentence("baker streat"),
+            "The stored text \"baker street\" carries the value and is 1 edit from this one.");
+  EXPECT_EQ(sentence("bakor streat"),
+            "The stored text \"baker street\" carries the value and is 2 edits from this one.");
+  EXPECT_EQ(sentence("park lane"),
+            "No stored text that carries the value is within 3 edits of this one.");
+}
+
+TEST(ExplainQueryTextTest, CodesAreComparedExactly) {
+  const auto index = indexOfPhrases({"Trinidad and Tobago", "Bosnia and Herzegovina"},
+                                    MatchingMode::phoneticWords);
+  const auto explained =
+      index.explainQuery("trinitad hertsegowina tomorrow", "Trinidad and Tobago");
+  EXPECT_FALSE(explained.isFound);
+  const std::string text = explained.toText();
+  for (const std::string sentence :
+       {"\"TRNTT\" is near 1 stored code; \"trntt\", 0 edits away, carries the value.\n",
+        "1 stored code fewer than counted codes were found, which adds 1, however many there are, "
+        "as "
+        "codes are compared exactly.\n",
+        "The phrase counts 2 words, the text 2 codes, which adds 0: where codes are compared "
+        "exactly, "
+        "lengths count nothing.\n",
+        "The distance is 1; values up to 0 are listed, as codes are compared exactly, so this one "
+        "is "
+        "not.\n"}) {
+    EXPECT_NE(text.find(sentence), std::string::npos) << sentence << text;
+  }
 }
 
 }  // namespace

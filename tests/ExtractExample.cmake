@@ -1,12 +1,23 @@
-# Writes an example of a page to a source file: the first with the fence FENCE. One in C++ without a
-# main() gets one, and the output that it needs. Arguments: PAGE, FENCE, OUTPUT.
+# Writes an example to a source file: of a page the first with the fence FENCE, of a header the first
+# lines behind PREFIX, which begins each line of its examples ("_" standing for a space). One in C++
+# without a main() gets one, and the output that it needs. Arguments: PAGE, FENCE or PREFIX, OUTPUT.
 file(READ "${PAGE}" page)
-string(REPLACE "+" "[+]" fence "${FENCE}")
-string(REGEX MATCH "```${fence}\n([^`]*)```" found "${page}")
-if(NOT found)
-  message(FATAL_ERROR "${PAGE} has no example with the fence ${FENCE}")
+if(PREFIX)
+  string(REPLACE "_" " " PREFIX "${PREFIX}")
+  string(REGEX REPLACE " +$" "" empty "${PREFIX}")
+  string(REGEX MATCH "\n(${PREFIX}[^\n]*\n(${empty}\n|${PREFIX}[^\n]*\n)*)" found "${page}")
+  string(REGEX REPLACE "\n${PREFIX}" "\n" source "\n${CMAKE_MATCH_1}")
+  string(REGEX REPLACE "\n${empty}\n" "\n\n" source "${source}")
+  string(STRIP "${source}" source)
+  string(APPEND source "\n")
+else()
+  string(REPLACE "+" "[+]" fence "${FENCE}")
+  string(REGEX MATCH "```${fence}\n([^`]*)```" found "${page}")
+  set(source "${CMAKE_MATCH_1}")
 endif()
-set(source "${CMAKE_MATCH_1}")
+if(NOT found)
+  message(FATAL_ERROR "${PAGE} has no example with ${FENCE}${PREFIX}")
+endif()
 if(NOT source MATCHES "int main")
   string(REGEX MATCH "^(#include [^\n]*\n)+" includes "${source}")
   string(LENGTH "${includes}" length)

@@ -159,8 +159,9 @@ TEST(FindBudgetTest, NoMatchesAtAll) {
 
 TEST(FindBudgetTest, EditLimitsThatAreTooLarge) {
   const auto index = indexOfPhrases({"Thames", "Severn"});
-  for (const auto limit : {&EditLimits::shortEdits, &EditLimits::mediumEdits,
-                           &EditLimits::longEdits, &EditLimits::wholeTextEdits}) {
+  for (const auto limit :
+       {&EditLimits::shortEdits, &EditLimits::mediumEdits, &EditLimits::longEdits,
+        &EditLimits::wholeTextEdits, &EditLimits::numberEdits}) {
     FindOptions options;
     options.edits.*limit = EditLimits::kMaxEdits;
     EXPECT_NO_THROW(index.find("thames", options));
@@ -199,7 +200,7 @@ TEST(FindBudgetTest, ManyEqualWordsInManyPhrases) {
 }
 
 TEST(FindBudgetTest, WordsInEachOthersWay) {
-  // Every word of the phrases wants the same words of the text, with as many breaks in any order.
+  // Every word of the phrases wants the same words of the text, with as much disorder in any order.
   Entries entries;
   for (int i = 0; i < 50; ++i) {
     entries.emplace_back(rowOf("buffalo", 150 + i), std::to_string(i));

@@ -88,6 +88,18 @@ TEST(FindRangesTest, TextsWithoutSpaces) {
   }
 }
 
+TEST(FindRangesTest, PhrasesWithinSentencesWithoutSpaces) {
+  // Where words end is in ICU's dictionaries alone.
+  const auto index = indexOfPhrases({"沖縄県", "ภาษาไทย", "旅行"});
+  const auto okinawa = firstIn(index, "私は来年沖縄県に行きます");
+  EXPECT_EQ(okinawa.value, "沖縄県");
+  EXPECT_EQ(okinawa.range, "沖縄県");
+  const auto journey = firstIn(index, "我们明天去旅行了");
+  EXPECT_EQ(journey, (Found{"旅行", {"旅行"}, "旅行"}));
+  const auto thai = firstIn(index, "ฉันรักภาษาไทยมาก");
+  EXPECT_EQ(thai, (Found{"ภาษาไทย", {"ภาษา", "ไทย"}, "ภาษาไทย"}));
+}
+
 TEST(FindRangesTest, IllFormedBytesSeparateWords) {
   const auto index = indexOfPhrases({"Trinidad and Tobago"});
   EXPECT_EQ(firstIn(index, "\xFF\xE2\x82trinidad\xC3(and\xF0\x9F\x98tobago\xE2"),

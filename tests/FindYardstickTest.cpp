@@ -119,7 +119,8 @@ class Both {
     const auto& edits = options.edits;
     return " with edits " + std::to_string(edits.shortEdits) + ' ' +
            std::to_string(edits.mediumEdits) + ' ' + std::to_string(edits.longEdits) + ' ' +
-           std::to_string(edits.wholeTextEdits) + " for words up to " +
+           std::to_string(edits.wholeTextEdits) + ", of numbers " +
+           std::to_string(edits.numberEdits) + ", for words up to " +
            std::to_string(edits.shortLength) + ' ' + std::to_string(edits.mediumLength) +
            (options.transpositions ? ", swaps" : "") + ", at least " +
            std::to_string(options.minWords) + " words, at most " +
@@ -144,7 +145,7 @@ std::vector<FindOptions> manyOptions() {
   for (const bool transpositions : {true, false}) {
     for (const EditLimits& edits :
          {EditLimits(), EditLimits{2, 5, 0, 0, 0, 0}, EditLimits{1, 2, 0, 1, 1},
-          EditLimits{2, 5, 1, 1, 2}, EditLimits{1, 2, 1, 2, 3}, EditLimits{2, 5, 3, 3, 3}}) {
+          EditLimits{2, 5, 1, 1, 2}, EditLimits{1, 2, 1, 2, 3}, EditLimits{2, 5, 3, 3, 3, 3, 2}}) {
       FindOptions options = unlimited();
       options.transpositions = transpositions;
       options.edits = edits;
@@ -270,7 +271,7 @@ rc::Gen<FindOptions> anyOptions() {
     }
     const auto edits = rc::gen::inRange<std::uint32_t>(0, EditLimits::kMaxEdits + 1);
     const auto length = rc::gen::inRange<std::size_t>(0, 6);
-    options.edits = {*length, *length, *edits, *edits, *edits, *edits};
+    options.edits = {*length, *length, *edits, *edits, *edits, *edits, *edits};
     return options;
   });
 }
@@ -293,6 +294,82 @@ TEST(FindYardstickTest, ValuesOfSeveralPhrases) {
     RC_ASSERT(!::testing::Test::HasFailure());
   });
   EXPECT_TRUE(holds);
+}
+
+TEST(FindYardstickTest, WordsWithDigits) {
+  const Both all(asEntries(allRows({"a", "a1", "1a", "12", "a12"}, 2)));
+  std::size_t matches = 0;
+  for (const auto& text : allRows({"a", "1", "12", "a2", "a12", "ab1"}, 2)) {
+    for (std::uint32_t numberEdits = 0; numberEdits <= EditLimits::kMaxEdits; ++numberEdits) {
+      for (const EditLimits& edits : {EditLimits(), EditLimits{1, 2, 1, 2, 3}}) {
+        FindOptions options = unlimited();
+        options.edits = edits;
+        options.edits.numberEdits = numberEdits;
+        const auto found = all.expectSame(text, options);
+        all.expectExplained(text, options, found);
+        matches += found.size();
+      }
+    }
+    if (HasFailure()) {
+      return;
+    }
+  }
+  EXPECT_GT(matches, 1000U) << "the comparison was not of empty lists";
+}
+
+/// A row of words that sound alike in groups, or have no sound, or more codes than one.
+rc::Gen<std::string> anySounds(std::size_t most) {
+  const auto word =
+      rc::gen::element<std::string>("Catherine", "Kathryn", "thorn", "tarn", "knee", "nie",
+                                    "Xavier", "the", "U.S", "d’Ivoire", "h", "a1", "É", "沖");
+  return rc::gen::map(
+      rc::gen::resize(static_cast<int>(most), rc::gen::container<std::vector<std::string>>(word)),
+      [](const std::vector<std::string>& words) {
+        std::string row;
+        for (const auto& each : words) {
+          row += (row.empty() ? "" : " ") + each;
+        }
+        return row;
+      });
+}
+
+TEST(FindYardstickTest, Codes) {
+  std::size_t matches = 0;
+  const bool holds = rc::check([&matches] {
+    Entries entries;
+    const auto count = *rc::gen::inRange(0, 12);
+    for (int i = 0; i < count; ++i) {
+      entries.emplace_back(*anySounds(4), std::string(1, "VWXYZ"[*rc::gen::inRange(0, 5)]));
+    }
+    const Both both(entries, MatchingMode::phoneticWords);
+    for (int i = 0; i < 6; ++i) {
+      const auto text = *anySounds(5);
+      const auto options = *anyOptions();
+      const auto all = both.expectSame(text, options);
+      both.expectBeginnings(text, options, all);
+      both.expectExplained(text, options, all);
+      matches += all.size();
+    }
+    RC_ASSERT(!::testing::Test::HasFailure());
+  });
+  EXPECT_TRUE(holds);
+  EXPECT_GT(matches, 20U) << "the comparison was not of empty lists";
+}
+
+TEST(FindYardstickTest, EveryTextOverAFewSounds) {
+  // Two words of one sound, others of one code that begins as theirs, and one without any.
+  const Both all(asEntries(allRows({"Kathryn", "car", "carts", "h"}, 3)),
+                 MatchingMode::phoneticWords);
+  std::size_t matches = 0;
+  for (const auto& text : allRows({"Catherine", "core", "Kathryn", "h", "carts"}, 3)) {
+    const auto found = all.expectSame(text, unlimited());
+    all.expectBeginnings(text, unlimited(), found);
+    matches += found.size();
+    if (HasFailure()) {
+      return;
+    }
+  }
+  EXPECT_GT(matches, 1000U) << "the comparison was not of empty lists";
 }
 
 TEST(FindYardstickTest, WholeTexts) {

@@ -7,6 +7,7 @@
 #include <functional>
 #include <tuple>
 
+#include "wordcatcher/phonetic/KXMetaphone.h"
 #include "wordcatcher/text/Unicode.h"
 #include "wordcatcher/text/WordSegmenter.h"
 
@@ -25,10 +26,7 @@ bool namesNumber(std::u16string_view word) {
   return false;
 }
 
-std::uint32_t limitOf(std::u16string_view word, const EditLimits& limits) {
-  if (namesNumber(word)) {
-    return 0;
-  }
+std::uint32_t limitByLength(std::u16string_view word, const EditLimits& limits) {
   if (word.size() <= limits.shortLength) {
     return limits.shortEdits;
   }
@@ -36,6 +34,16 @@ std::uint32_t limitOf(std::u16string_view word, const EditLimits& limits) {
 }
 
 std::size_t bytesOf(std::u16string_view text) { return toUtf8(text).value().size(); }
+
+std::vector<std::u16string_view> tokensOf(std::u16string_view text) {
+  std::vector<std::u16string_view> tokens;
+  WordSegmenter segmenter;
+  segmenter.start(text);
+  while (const auto token = segmenter.next()) {
+    tokens.push_back(*token);
+  }
+  return tokens;
+}
 
 }  // namespace
 
@@ -69,12 +77,24 @@ LiteralFind::Phrase LiteralFind::wordsOf(std::string_view phrase) const {
     return text.empty() ? Phrase() : Phrase{toLower(text)};
   }
   Phrase words;
-  WordSegmenter segmenter;
-  segmenter.start(text);
-  while (const auto word = segmenter.next()) {
-    words.push_back(toLower(*word));
+  for (const auto& token : tokensOf(text)) {
+    const auto some = lookedUp(token);
+    words.insert(words.end(), some.begin(), some.end());
   }
   return words;
+}
+
+/// What a word of a phrase or of a text counts as: itself, or the codes of its sound.
+std::vector<std::u16string> LiteralFind::lookedUp(std::u16string_view word) const {
+  if (_mode == MatchingMode::words) {
+    return {toLower(word)};
+  }
+  const std::u16string codes = KXMetaphone().translate(word);
+  std::vector<std::u16string> lowered;
+  for (const auto& code : tokensOf(codes)) {
+    lowered.push_back(toLower(code));
+  }
+  return lowered;
 }
 
 void LiteralFind::add(std::string_view phrase, std::string_view value) {
@@ -99,25 +119,36 @@ std::uint64_t LiteralFind::valuesUnder(const std::u16string& word) const {
   return known->second;
 }
 
-std::vector<LiteralFind::Token> LiteralFind::cut(std::string_view text,
-                                                 const EditLimits& limits) const {
+std::vector<LiteralFind::Token> LiteralFind::cut(std::string_view text) const {
   const std::u16string units = fromUtf8(text).value();
   std::vector<Token> tokens;
   if (_mode == MatchingMode::wholeText) {
     if (!units.empty()) {
-      tokens.push_back({toLower(units), 0, text.size(), limits.wholeTextEdits});
+      tokens.push_back({toLower(units), 0, text.size()});
     }
     return tokens;
   }
-  WordSegmenter segmenter;
-  segmenter.start(units);
-  while (const auto word = segmenter.next()) {
-    const auto first = static_cast<std::size_t>(word->data() - units.data());
+  for (const auto& word : tokensOf(units)) {
+    const auto first = static_cast<std::size_t>(word.data() - units.data());
     const std::size_t begin = bytesOf(std::u16string_view(units).substr(0, first));
-    const std::u16string lowered = toLower(*word);
-    tokens.push_back({lowered, begin, begin + bytesOf(*word), limitOf(lowered, limits)});
+    for (const auto& each : lookedUp(word)) {
+      tokens.push_back({each, begin, begin + bytesOf(word)});
+    }
   }
   return tokens;
+}
+
+bool LiteralFind::mayPair(std::u16string_view inPhrase, std::u16string_view inText,
+                          std::uint64_t edits, const EditLimits& limits) const {
+  switch (_mode) {
+    case MatchingMode::phoneticWords:
+      return edits == 0;
+    case MatchingMode::wholeText:
+      return edits <= limits.wholeTextEdits;
+    default:
+      const bool isNumber = namesNumber(inPhrase) || namesNumber(inText);
+      return edits <= limitByLength(inText, limits) && (!isNumber || edits <= limits.numberEdits);
+  }
 }
 
 std::vector<LiteralFind::Pair> LiteralFind::waysToPair(const Phrase& phrase,
@@ -130,8 +161,7 @@ std::vector<LiteralFind::Pair> LiteralFind::waysToPair(const Phrase& phrase,
   for (std::size_t i = 0; i < phrase.size(); ++i) {
     for (std::size_t j = 0; j < text.size(); ++j) {
       const std::uint64_t edits = literalEdits(phrase[i], text[j].word, options.transpositions);
-      const bool isNumber = namesNumber(phrase[i]) || namesNumber(text[j].word);
-      if (edits <= text[j].limit && (edits == 0 || !isNumber || _mode != MatchingMode::words)) {
+      if (mayPair(phrase[i], text[j].word, edits, limits)) {
         ways.push_back({i, 1, j, 1, edits});
       }
       if (joins && i + 1 < phrase.size() && phrase[i] + phrase[i + 1] == text[j].word) {
@@ -161,10 +191,10 @@ LiteralFind::Judged LiteralFind::judge(const Phrase& phrase, const std::vector<T
       judged.exact += pair.edits == 0 ? pair.phraseWords : 0;
       if (i > 0) {
         const Pair& last = pairs[i - 1];
-        judged.breaks += last.phrasePosition + last.phraseWords == pair.phrasePosition &&
-                                 last.textPosition + last.textWords == pair.textPosition
-                             ? 0
-                             : 1;
+        const bool isDirectly = last.phrasePosition + last.phraseWords == pair.phrasePosition &&
+                                last.textPosition + last.textWords == pair.textPosition;
+        const bool isLater = last.textPosition < pair.textPosition;
+        judged.disorder += isDirectly ? 0 : (isLater ? 1 : 2);
       }
       for (std::size_t word = 0; word < pair.phraseWords; ++word) {
         judged.rarity += valuesUnder(phrase[pair.phrasePosition + word]);
@@ -184,7 +214,7 @@ LiteralFind::Judged LiteralFind::judge(const Phrase& phrase, const std::vector<T
   };
   const auto isBetter = [&](const Judged& a, const Judged& b) {
     const auto key = [](const Judged& judged) {
-      return std::make_tuple(judged.cost, ~judged.words, ~judged.exact, judged.breaks);
+      return std::make_tuple(judged.cost, ~judged.words, ~judged.exact, judged.disorder);
     };
     return key(a) != key(b) ? key(a) < key(b) : places(a.pairs) < places(b.pairs);
   };
@@ -220,14 +250,14 @@ LiteralFind::Judged LiteralFind::judge(const Phrase& phrase, const std::vector<T
 
 std::vector<FoundPhrase> LiteralFind::findAll(std::string_view text,
                                               const FindOptions& options) const {
-  const auto tokens = cut(text, options.edits);
+  const auto tokens = cut(text);
   const auto keyOf = [](const Judged& judged) {  // but for the value, and which of its phrases
     std::size_t units = 0;
     for (const auto& word : judged.phrase) {
       units += word.size();
     }
-    return std::make_tuple(judged.cost, ~judged.words, ~judged.exact, judged.breaks, judged.rarity,
-                           judged.phrase.size(), units);
+    return std::make_tuple(judged.cost, ~judged.words, ~judged.exact, judged.disorder,
+                           judged.rarity, judged.phrase.size(), units);
   };
   std::vector<std::pair<Judged, std::u16string>> found;
   for (const auto& [value, phrases] : _values) {

@@ -20,8 +20,7 @@ std::uint64_t literalEdits(std::u16string_view a, std::u16string_view b, bool tr
 
 /// The yardstick of Index::find: judges every phrase of every value by trying all pairings of its
 /// words with those of the text. Knows the phrases as they were given to the builder, and nothing
-/// of images. For small phrases and texts that are well-formed UTF-8, in indexes of words or of
-/// whole texts.
+/// of images. For small phrases and texts that are well-formed UTF-8.
 class LiteralFind {
  public:
   explicit LiteralFind(MatchingMode mode = MatchingMode::words) : _mode(mode) {}
@@ -38,7 +37,6 @@ class LiteralFind {
     std::u16string word;
     std::size_t begin;
     std::size_t end;
-    std::uint32_t limit;
   };
   /// Words of the phrase paired with words of the text: one of each, or two of one side.
   struct Pair {
@@ -54,14 +52,17 @@ class LiteralFind {
     std::uint64_t cost = 0;
     std::uint64_t words = 0;
     std::uint64_t exact = 0;
-    std::uint64_t breaks = 0;
+    std::uint64_t disorder = 0;
     std::uint64_t rarity = 0;
     Phrase phrase;
     Pairs pairs;
   };
 
   Phrase wordsOf(std::string_view phrase) const;
-  std::vector<Token> cut(std::string_view text, const EditLimits& limits) const;
+  std::vector<std::u16string> lookedUp(std::u16string_view word) const;
+  std::vector<Token> cut(std::string_view text) const;
+  bool mayPair(std::u16string_view inPhrase, std::u16string_view inText, std::uint64_t edits,
+               const EditLimits& limits) const;
   Judged judge(const Phrase& phrase, const std::vector<Token>& text,
                const FindOptions& options) const;
   std::vector<Pair> waysToPair(const Phrase& phrase, const std::vector<Token>& text,

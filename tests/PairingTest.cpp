@@ -44,12 +44,13 @@ Solution scored(const std::vector<Pair>& pairs) {
     score.gain += 2U * (option.textWords + option.phraseWords) - option.edits;
     score.words += option.phraseWords;
     score.exact += option.edits == 0 ? option.phraseWords : 0U;
-    score.breaks +=
-        i > 0 && (pairs[i - 1].phrasePosition + pairs[i - 1].option.phraseWords !=
-                      pairs[i].phrasePosition ||
-                  pairs[i - 1].option.position + pairs[i - 1].option.textWords != option.position)
-            ? 1
-            : 0;
+    if (i > 0) {
+      const Pair& last = pairs[i - 1];
+      const bool isDirectly =
+          last.phrasePosition + last.option.phraseWords == pairs[i].phrasePosition &&
+          last.option.position + last.option.textWords == option.position;
+      score.disorder += isDirectly ? 0 : (last.option.position < option.position ? 1 : 2);
+    }
   }
   return solution;
 }
@@ -63,7 +64,7 @@ auto keyOf(const Solution& solution) {
     inText.push_back(pair.option.position);
     inPhrase.push_back(pair.phrasePosition);
   }
-  return std::make_tuple(~score.gain, ~score.words, ~score.exact, score.breaks, inText, inPhrase);
+  return std::make_tuple(~score.gain, ~score.words, ~score.exact, score.disorder, inText, inPhrase);
 }
 
 /// Calls `visit` with every one-to-one pairing.
@@ -135,8 +136,8 @@ void expectBest(Pairing& pairing, const Options& options, std::size_t textWords)
   ASSERT_TRUE(keyOf(found) == keyOf(best))
       << "gain " << found.score.gain << " for " << best.score.gain << ", words "
       << found.score.words << " for " << best.score.words << ", exact " << found.score.exact
-      << " for " << best.score.exact << ", breaks " << found.score.breaks << " for "
-      << best.score.breaks;
+      << " for " << best.score.exact << ", disorder " << found.score.disorder << " for "
+      << best.score.disorder;
   ASSERT_TRUE(pairing.isExact());
 }
 
@@ -176,7 +177,7 @@ TEST(PairingTest, LessEditsComeBeforeEverythingElse) {
   ASSERT_EQ(found.pairs.size(), 2U);
   EXPECT_EQ(found.pairs[0].option.position, 3U);
   EXPECT_EQ(found.score.gain, 6U);
-  EXPECT_EQ(found.score.breaks, 1U);
+  EXPECT_EQ(found.score.disorder, 1U);
 }
 
 TEST(PairingTest, MoreWordsComeBeforeExactOnes) {
@@ -202,7 +203,7 @@ TEST(PairingTest, FewerBreaksComeBeforeEarlierWords) {
   const Solution found = solve(pairing, {{{0, 1, 1, 0}, {3, 1, 1, 0}}, {{4, 1, 1, 0}}});
   ASSERT_EQ(found.pairs.size(), 2U);
   EXPECT_EQ(found.pairs[0].option.position, 3U);
-  EXPECT_EQ(found.score.breaks, 0U);
+  EXPECT_EQ(found.score.disorder, 0U);
 }
 
 TEST(PairingTest, NothingToPair) {
@@ -282,7 +283,7 @@ TEST(PairingTest, LongPhrasesWhoseWordsDoNotMeetAreExact) {
   Pairing pairing(kWords);
   const Solution found = solve(pairing, options);
   EXPECT_EQ(found.score.words, kWords);
-  EXPECT_EQ(found.score.breaks, 0U);
+  EXPECT_EQ(found.score.disorder, 0U);
   EXPECT_TRUE(pairing.isExact());
 }
 

@@ -158,19 +158,12 @@ class ScoringPageTest : public ::testing::Test {
  protected:
   void SetUp() override {
     _page = testing::readFile(kDocs + "scoring.md");
-    IndexBuilder builder(_directory.file("scoring.wci"));
-    replaceBlocks(_page, "phrases", [&builder](const std::string& block) {
-      std::istringstream lines(block);
-      for (std::string phrase; std::getline(lines, phrase);) {
-        builder.add(phrase, phrase);
-      }
-      return block;
-    });
-    builder.commit();
-    _index = std::make_unique<Index>(Index::open(_directory.file("scoring.wci")));
+    _index = build("words.wci", MatchingMode::words);
+    _codes = build("codes.wci", MatchingMode::phoneticWords);
   }
 
   const Index& index() const { return *_index; }
+  const Index& codes() const { return *_codes; }
   const std::string& page() const { return _page; }
 
   static void expectFile(const std::string& name, const std::string& content) {
@@ -194,18 +187,41 @@ class ScoringPageTest : public ::testing::Test {
   }
 
  private:
+  /// An index of the page's phrases.
+  std::unique_ptr<Index> build(const std::string& name, MatchingMode mode) const {
+    IndexBuilder builder(_directory.file(name), {.mode = mode, .tables = {}});
+    replaceBlocks(_page, "phrases", [&builder](const std::string& block) {
+      std::istringstream lines(block);
+      for (std::string phrase; std::getline(lines, phrase);) {
+        builder.add(phrase, phrase);
+      }
+      return block;
+    });
+    builder.commit();
+    return std::make_unique<Index>(Index::open(_directory.file(name)));
+  }
+
   testing::TemporaryDirectory _directory;
   std::string _page;
   std::unique_ptr<Index> _index;
+  std::unique_ptr<Index> _codes;
 };
 
 TEST_F(ScoringPageTest, TheExamplesAreWhatTheLibraryAnswers) {
-  std::string expected = replaceBlocks(page(), "explain", [this](const std::string& block) {
-    return index().explain(field(block, "Text:"), field(block, "Value:")).toText();
-  });
-  expected = replaceBlocks(expected, "explain-query", [this](const std::string& block) {
-    return index().explainQuery(field(block, "Text:"), field(block, "Value:")).toText();
-  });
+  const auto explain = [](const Index& asked) {
+    return [&asked](const std::string& block) {
+      return asked.explain(field(block, "Text:"), field(block, "Value:")).toText();
+    };
+  };
+  const auto explainQuery = [](const Index& asked) {
+    return [&asked](const std::string& block) {
+      return asked.explainQuery(field(block, "Text:"), field(block, "Value:")).toText();
+    };
+  };
+  std::string expected = replaceBlocks(page(), "explain", explain(index()));
+  expected = replaceBlocks(expected, "explain-codes", explain(codes()));
+  expected = replaceBlocks(expected, "explain-query", explainQuery(index()));
+  expected = replaceBlocks(expected, "explain-query-codes", explainQuery(codes()));
   expected = replaceBlocks(expected, "find", [this](const std::string& block) {
     std::string lines = firstLine(block) + '\n';
     for (const auto& match : index().find(firstLine(block)).matches) {
@@ -244,6 +260,10 @@ TEST_F(ScoringPageTest, WhatItSaysInPassingHolds) {
   EXPECT_EQ(index().find("zealand new").matches.at(0).cost, 0);
   EXPECT_EQ(index().explain("trinidat and tobbago", "Trinidad and Tobago").cost, 2);
   EXPECT_EQ(index().explain("newyork yrok", "York").cost, 3);
+  EXPECT_EQ(EditLimits().numberEdits, 0U);
+  EXPECT_EQ(codes().query("trinitad").matches.at(0).distance, 0);
+  EXPECT_TRUE(codes().query("trinitad hertsegowina").matches.empty());
+  EXPECT_TRUE(codes().query("trinitad jorja").matches.empty()) << "they share no phrase";
 }
 
 TEST_F(ScoringPageTest, TheDrawingsAreOfTheExamples) {

@@ -125,6 +125,21 @@ class FindTest(TerminalTest):
                          [["The Great Gatsby"]])
         self.assertEqual(self.found("--edits", "3,3,3,0", self.dogs, "the grate gatsby"), [[]])
 
+    def test_words_with_a_digit_are_found_exactly_unless_they_may_have_edits(self):
+        self.index("room b117\n")
+        self.assertEqual(self.found(self.dogs, "b118", "b117"), [[], ["room b117"]])
+        self.assertEqual(self.found("--number-edits", "1", self.dogs, "b118", "b129"),
+                         [["room b117"], []])
+        self.assertEqual(self.found("--number-edits=3", "--edits", "0,0,0", self.dogs, "b118"),
+                         [[]])
+
+    def test_lengths_say_which_words_are_short_and_medium(self):
+        self.assertEqual(self.found("--lengths", "4,5", self.dogs, "gatt"), [[]])
+        self.assertEqual(self.found("--lengths", "1,3", self.dogs, "gutt"), [[BRIDGE]])
+        self.assertEqual(self.found("--lengths", "0,4", self.dogs, "gutt"), [[]])
+        self.assertEqual(self.found("--lengths=0,0", "--edits", "0,0,2", self.dogs, "gutt"),
+                         [[BRIDGE]])
+
     def test_transpositions_are_one_edit_unless_they_are_not_wanted(self):
         def cost(*options):
             return json.loads(self.succeed("find", "--json", *options, self.dogs,
@@ -157,6 +172,11 @@ class FindTest(TerminalTest):
             self.fail_with(f"{option}: give a whole number from", of=[*find, option, value])
         for edits in ("1", "0,1", "0,1,4", "0,1,x", "0,1,2,3,1", "0,,1", "-1,0,0"):
             self.fail_with("such as 0,1,2", of=[*find, f"--edits={edits}"])
+        for edits in ("4", "-1", "x", "1,1"):
+            self.fail_with("--number-edits: give a number from 0 to 3",
+                           of=[*find, f"--number-edits={edits}"])
+        for lengths in ("2", "2,5,7", "5,2", "-1,2", "2,x", ",5", "2,99999999999999999999"):
+            self.fail_with("such as 2,5", of=[*find, f"--lengths={lengths}"])
         self.fail_with("--threads", "1 to 64", of=[*find, "--threads", "0"])
         self.fail_with("no-sub", of=[*find, "--overlaps", "some"])
         self.fail_with("--highlight", of=[*find, "--highlight", "--json"])
@@ -376,6 +396,8 @@ class ExplainTest(cli_test.CommandTest):
     def test_a_value_that_is_not_found_ends_with_1_and_a_reason(self):
         self.assertEqual(self.run_it("explain", self.dogs, "golden", "poodle"), 1)
         self.assertIn("no such", self.out)
+        self.assertEqual(self.run_it("explain", self.dogs, "golden", "golden gate"), 1)
+        self.assertIn(f'such as "{BRIDGE}"', self.out)
         self.assertEqual(self.run_it("explain", "--json", "--max-cost", "1", self.dogs, "a golden",
                                      BRIDGE), 1)
         told = json.loads(self.out)
@@ -403,6 +425,9 @@ class ExplainTest(cli_test.CommandTest):
                        of=["explain", "--query", "--max-cost", "1", self.dogs, "golden", BRIDGE])
         self.fail_with("--query", "--limit",
                        of=["explain", "--query", "--limit", "1", self.dogs, "golden", BRIDGE])
+        for option, value in (("--number-edits", "1"), ("--lengths", "2,5")):
+            self.fail_with("--query", option,
+                           of=["explain", "--query", option, value, self.dogs, "golden", BRIDGE])
 
 
 class TablesExplainTest(ExplainTest):

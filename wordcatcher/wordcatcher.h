@@ -6,13 +6,25 @@
    Wordcatcher for C, and for every language that can call C: finds, inside free text, phrases that
    were stored earlier, tolerating spelling mistakes.
 
-       wordcatcher_index* index;
-       wordcatcher_findings* findings;
-       wordcatcher_error error;
-       if (wordcatcher_index_open("names.wci", NULL, &index, &error) != WORDCATCHER_OK ||
-           wordcatcher_index_find(index, text, WORDCATCHER_NUL, NULL, &findings, &error) !=
-               WORDCATCHER_OK) {
-         fprintf(stderr, "%s\n", error.message);
+       #include <stdio.h>
+       #include "wordcatcher/wordcatcher.h"
+
+       int main(void) {
+         wordcatcher_index* index = NULL;
+         wordcatcher_findings* findings = NULL;
+         wordcatcher_error error;
+         if (wordcatcher_index_open("names.wci", NULL, &index, &error) != WORDCATCHER_OK ||
+             wordcatcher_index_find(index, "holidays in tobbago", WORDCATCHER_NUL, NULL, &findings,
+                                    &error) != WORDCATCHER_OK) {
+           fprintf(stderr, "%s\n", error.message);
+         }
+         for (size_t i = 0; i < wordcatcher_findings_count(findings); ++i) {
+           puts(wordcatcher_findings_at(findings, i)->value);
+         }
+         wordcatcher_findings_free(findings);
+         wordcatcher_index_close(index);
+         return error.code == WORDCATCHER_OK ? 0 : 1;
+       }
 
    1. Handles. Types without a body are opaque. Whatever a function hands out through a `**`
       argument is the caller's, who gives it back to the one function that takes it back
@@ -189,7 +201,8 @@ enum {
 
 /** What wordcatcher_index_find() looks for and how much of it. The lengths that make a word short,
    medium or long are UTF-16 code units of its lower-case form; an edit is one code unit replaced,
-   inserted or left out. Edits are at most 3 each. */
+   inserted or left out. Edits are at most 3 each. Words that hold a digit are only found exactly,
+   which `number_edits` alone relaxes. */
 typedef struct wordcatcher_find_options {
   size_t size;               /**< set by wordcatcher_find_options_init() */
   size_t limit;              /**< matches at the most: the first ones of all; 10 */
@@ -204,6 +217,8 @@ typedef struct wordcatcher_find_options {
   int32_t transpositions;    /**< not 0: two neighbours swapped are one edit, not two; 1 */
   int32_t overlaps;          /**< WORDCATCHER_OVERLAPS_...; all */
   uint64_t max_postings;     /**< postings (phrases under a word) that are looked at; 2,000,000 */
+  uint64_t number_edits;     /**< edits of a word when it or the stored word holds a digit: at most
+                                those that its length allows; 0 */
 } wordcatcher_find_options;
 
 /** Fills the options with the defaults named above. `size`: sizeof *options. NULL does nothing. */
@@ -253,7 +268,8 @@ WORDCATCHER_EXPORT const wordcatcher_finding* wordcatcher_findings_at(
 WORDCATCHER_EXPORT const wordcatcher_hit* wordcatcher_findings_hit(
     const wordcatcher_findings* findings, size_t finding, size_t hit);
 
-/** Whether a budget cut something off. */
+/** Whether a budget cut something off. Then there may be better phrases than these, and another
+   limit may list others. */
 WORDCATCHER_EXPORT bool wordcatcher_findings_truncated(const wordcatcher_findings* findings);
 
 /** Gives the result back. */

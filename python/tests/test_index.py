@@ -77,12 +77,14 @@ def test_edit_limits() -> None:
     limits = EditLimits(long_edits=3)
     assert repr(limits) == (
         "EditLimits(short_length=2, medium_length=5, short_edits=0, medium_edits=1, "
-        "long_edits=3, whole_text_edits=3)"
+        "long_edits=3, whole_text_edits=3, number_edits=0)"
     )
     assert limits == EditLimits(long_edits=3) != EditLimits()
     assert len({limits, EditLimits(long_edits=3), EditLimits()}) == 2
     with pytest.raises(ValueError, match="medium_edits is at most 3"):
         EditLimits(medium_edits=4)
+    with pytest.raises(ValueError, match="number_edits is at most 3"):
+        EditLimits(number_edits=4)
     with pytest.raises(AttributeError):
         limits.long_edits = 1  # type: ignore[misc]
 
@@ -140,6 +142,24 @@ def test_explain(index: Index) -> None:
     with pytest.raises(Error) as failure:
         index.explain("trinidat", "Tobago\udcff")
     assert failure.value.code == "bad_input"
+
+
+def test_explain_numbers_and_codes(tmp_path: Path) -> None:
+    for mode in ("words", "phonetic"):
+        with IndexBuilder(tmp_path / mode, mode) as builder:
+            builder.add("Catherine b117")
+    numbers = Index.open(tmp_path / "words")
+    assert values(numbers.find("b118")) == []
+    assert values(numbers.find("b118", edits=EditLimits(number_edits=1))) == ["Catherine b117"]
+    (word,) = numbers.explain("b118", "Catherine b117").words
+    assert (word.written, word.length_limit, word.limit, word.is_looked_up) == ("", 1, 0, True)
+    assert word.comparisons[1].limit == 0
+    codes = Index.open(tmp_path / "phonetic").explain("déar "
+                                                      "Kathryn", "Catherine b117")
+    assert [each.written for each in codes.words] == ["déar",
+                                                      "Kathryn"]
+    assert codes.words[1].word == "k0rn"
+    assert codes.surplus == (f"{codes.words[0].written} ({codes.words[0].word})",)
 
 
 def test_explain_query(index: Index) -> None:

@@ -144,6 +144,35 @@ static void whole_texts_have_edits_of_their_own(void) {
   wordcatcher_index_close(index);
 }
 
+/* A word that holds a digit is found exactly, unless it may have edits of its own. */
+static void numbers_have_edits_of_their_own(void) {
+  wordcatcher_builder* builder = NULL;
+  CHECK(wordcatcher_builder_create(file("rooms.wci"), NULL, &builder, NULL) == WORDCATCHER_OK);
+  CHECK(wordcatcher_builder_add(builder, "Room b117", WORDCATCHER_NUL, "Room", WORDCATCHER_NUL,
+                                NULL) == WORDCATCHER_OK);
+  CHECK(wordcatcher_builder_commit(builder, NULL, NULL) == WORDCATCHER_OK);
+  wordcatcher_builder_free(builder);
+  wordcatcher_index* index = NULL;
+  CHECK(wordcatcher_index_open(file("rooms.wci"), NULL, &index, NULL) == WORDCATCHER_OK);
+  wordcatcher_find_options options;
+  wordcatcher_find_options_init(&options, sizeof options);
+  CHECK(count(index, "b118", &options) == 0);
+  options.number_edits = 1;
+  CHECK(count(index, "b118", &options) == 1);
+  wordcatcher_index_close(index);
+
+  index = places();
+  static const uint64_t kTooMany[] = {4, UINT32_MAX, (uint64_t)1 << 32, UINT64_MAX};
+  for (size_t i = 0; i < sizeof kTooMany / sizeof *kTooMany; ++i) {
+    wordcatcher_findings* findings = NULL;
+    wordcatcher_error error;
+    options.number_edits = kTooMany[i];
+    CHECK_FAILS(wordcatcher_index_find(index, "new", 3, &options, &findings, &error),
+                WORDCATCHER_BAD_INPUT);
+  }
+  wordcatcher_index_close(index);
+}
+
 static void refuses_options_that_cannot_be(const wordcatcher_index* index) {
   wordcatcher_find_options options;
   wordcatcher_findings* findings = NULL;
@@ -174,4 +203,5 @@ void test_finding(void) {
   refuses_options_that_cannot_be(index);
   wordcatcher_index_close(index);
   whole_texts_have_edits_of_their_own();
+  numbers_have_edits_of_their_own();
 }

@@ -26,6 +26,7 @@ static void defaults_are_those_of_the_manual(void) {
   CHECK(find_options.transpositions == 1);
   CHECK(find_options.overlaps == WORDCATCHER_OVERLAPS_ALL);
   CHECK(find_options.max_postings == 2000000);
+  CHECK(find_options.number_edits == 0);
 
   wordcatcher_builder_options builder_options;
   memset(&builder_options, 0xAA, sizeof builder_options);
@@ -53,6 +54,16 @@ static void an_older_program_has_defaults_for_what_it_does_not_know(
   CHECK(options.overlaps == (int32_t)0xAAAAAAAA);
   wordcatcher_findings* findings = NULL;
   wordcatcher_error error;
+  CHECK(wordcatcher_index_find(index, "new zealand", WORDCATCHER_NUL, &options, &findings,
+                               &error) == WORDCATCHER_OK);
+  wordcatcher_findings_free(findings);
+
+  /* The first header had no option of numbers. */
+  const size_t first = offsetof(wordcatcher_find_options, number_edits);
+  memset(&options, 0xAA, sizeof options);
+  wordcatcher_find_options_init(&options, first);
+  CHECK(options.max_postings == 2000000);
+  CHECK(options.number_edits == 0xAAAAAAAAAAAAAAAA);
   CHECK(wordcatcher_index_find(index, "new zealand", WORDCATCHER_NUL, &options, &findings,
                                &error) == WORDCATCHER_OK);
   wordcatcher_findings_free(findings);

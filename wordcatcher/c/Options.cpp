@@ -18,7 +18,7 @@ constexpr std::size_t kMaxSize = 4096;
 static_assert(sizeof(wordcatcher_open_options) ==
               offsetof(wordcatcher_open_options, max_word_units) + sizeof(std::size_t));
 static_assert(sizeof(wordcatcher_find_options) ==
-              offsetof(wordcatcher_find_options, max_postings) + sizeof(std::uint64_t));
+              offsetof(wordcatcher_find_options, number_edits) + sizeof(std::uint64_t));
 static_assert(sizeof(wordcatcher_builder_options) ==
               offsetof(wordcatcher_builder_options, tables) + sizeof(const char*));
 
@@ -54,6 +54,7 @@ wordcatcher_find_options defaultsOf(const wordcatcher_find_options* /*type*/) {
   options.transpositions = defaults.transpositions ? 1 : 0;
   options.overlaps = static_cast<std::int32_t>(defaults.overlaps);
   options.max_postings = defaults.maxPostings;
+  options.number_edits = defaults.edits.numberEdits;
   return options;
 }
 
@@ -144,6 +145,9 @@ FindOptions findOptionsOf(const wordcatcher_find_options* options) {
   result.transpositions = given.transpositions != 0;
   result.overlaps = static_cast<Overlaps>(given.overlaps);
   result.maxPostings = given.max_postings;
+  // What 32 bits do not hold is too much as well, and must not become less.
+  result.edits.numberEdits =
+      static_cast<std::uint32_t>(std::min<std::uint64_t>(given.number_edits, UINT32_MAX));
   return result;
 }
 

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "wordcatcher/matcher/Find.h"
+#include "wordcatcher/matcher/Sentences.h"
 
 namespace wordcatcher {
 
@@ -54,15 +55,20 @@ std::string array(const std::vector<std::string>& texts) {
 }
 
 std::string comparison(const FindExplanation::Comparison& each) {
-  return object(
-      {{"word", json(each.word)}, {"edits", json(each.edits)}, {"within", json(each.within)}});
+  return object({{"word", json(each.word)},
+                 {"edits", json(each.edits)},
+                 {"limit", json(each.limit)},
+                 {"within", json(each.within)}});
 }
 
 std::string textWord(const FindExplanation::TextWord& word) {
   return object({{"begin", json(word.begin)},
                  {"end", json(word.end)},
                  {"word", json(word.word)},
+                 {"written", json(word.written)},
+                 {"lengthLimit", json(word.lengthLimit)},
                  {"limit", json(word.limit)},
+                 {"isLookedUp", json(word.isLookedUp)},
                  {"comparisons", array(word.comparisons, &comparison)}});
 }
 
@@ -85,11 +91,30 @@ std::string listed(const std::vector<std::string>& words) {
   return list.empty() ? "none" : list;
 }
 
-std::string counted(std::uint64_t count, const std::string& thing) {
-  return std::to_string(count) + ' ' + thing + (count == 1 ? "" : "s");
-}
-
 constexpr const char* kCutOff = "Some words of the text were left out: it is beyond the budget.\n";
+constexpr const char* kNotCompared = " ... (beyond the budget)";
+
+/// One word of the text beside those of the phrase, of which there are so many.
+std::string lineOf(const FindExplanation::TextWord& word, std::size_t phraseWords) {
+  std::string line = "  " + shown(word);
+  if (!word.isLookedUp) {
+    return line + ", not looked up\n";
+  }
+  line += ", up to " + counted(word.limit, "edit") +
+          (word.limit < word.lengthLimit ? " as it holds a digit:" : ":");
+  for (const auto& each : word.comparisons) {
+    line += (&each == &word.comparisons.front() ? " " : ", ") + each.word + ' ' +
+            std::to_string(each.edits);
+    if (each.within) {
+      line += " (near)";
+    } else if (each.edits <= word.lengthLimit) {
+      // Only a digit has the limit of the two fall below that of the length.
+      line += each.limit == 0 ? " (words with a digit must be the same)"
+                              : " (words with a digit: up to " + counted(each.limit, "edit") + ')';
+    }
+  }
+  return line + (word.comparisons.size() < phraseWords ? kNotCompared : "") + '\n';
+}
 
 }  // namespace
 
@@ -114,14 +139,7 @@ std::string FindExplanation::toText() const {
   if (isStored) {
     lines += "Phrase: " + listed(phrase) + '\n';
     for (const auto& word : words) {
-      const bool isLookedUp = phrase.empty() || !word.comparisons.empty();
-      lines += "  " + word.word +
-               (isLookedUp ? ", up to " + counted(word.limit, "edit") + ':' : ", not looked up");
-      for (const auto& each : word.comparisons) {
-        lines += ' ' + each.word + ' ' + std::to_string(each.edits) +
-                 (each.within ? " (near)" : "") + (&each == &word.comparisons.back() ? "" : ",");
-      }
-      lines += '\n';
+      lines += lineOf(word, phrase.size());
     }
     for (const auto& pair : pairs) {
       lines += "Paired: " + text.substr(pair.begin, pair.end - pair.begin) + " with " + pair.word +
@@ -151,9 +169,6 @@ std::string QueryExplanation::toJson() const {
 
 std::string QueryExplanation::toText() const {
   std::string lines = "Text:  " + text + "\nValue: " + value + '\n';
-  if (!isStored) {
-    lines += "The index holds no such data string.\n";
-  }
   std::size_t number = 0;
   for (const auto& step : steps) {
     lines += std::to_string(++number) + ". " + step.sentence + '\n';

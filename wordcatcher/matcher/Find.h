@@ -13,8 +13,14 @@ namespace wordcatcher {
 
 /// How many edits a word of the text may be away from a stored word, by its length in UTF-16 code
 /// units when lower-cased. An edit is one code unit replaced, inserted or left out, the first one
-/// as any other. Words that hold a digit are only found exactly, as stored words that do; whole
-/// texts are no words. A limit above kMaxEdits is an error (badInput).
+/// as any other. A limit above kMaxEdits is an error (badInput).
+///
+/// Words that hold a digit name something that one edit turns into another thing, so those of the
+/// text and those stored are only found exactly, and the limits by length do not relax this:
+/// `numberEdits` alone does. Joined and split words are found all the same, since the letters and
+/// digits of both sides agree then, and no number is taken for another: "a 12" finds the stored
+/// word "a12", and "a12" the stored words "a 12", for the one edit that joining costs. Whole texts
+/// and codes are no such words.
 struct EditLimits {
   /// The greatest limit that there may be, in edits.
   static constexpr std::uint32_t kMaxEdits = 3;
@@ -25,6 +31,10 @@ struct EditLimits {
   std::uint32_t mediumEdits = 1;  ///< of a medium one
   std::uint32_t longEdits = 2;    ///< of a long one
   std::uint32_t wholeTextEdits = 3;  ///< of a whole text, in an index of whole texts
+
+  /// Of a word when it or the stored word holds a decimal digit of any script; at most those that
+  /// its length allows.
+  std::uint32_t numberEdits = 0;
 
   /// Whether all members are equal.
   friend bool operator==(const EditLimits&, const EditLimits&) = default;
@@ -39,7 +49,7 @@ enum class Overlaps : std::uint32_t {
 
 /// What Index::find looks for and how much of it.
 struct FindOptions {
-  std::size_t limit = 10;                ///< matches at the most: the first ones of all
+  std::size_t limit = 10;  ///< matches at the most: the first ones of all, if not truncated
   std::optional<std::uint64_t> maxCost;  ///< the greatest cost of a match; none: any cost
   std::size_t minWords = 1;              ///< words of a phrase that the text must hold; at least 1
   EditLimits edits;                      ///< how far a word may be from a stored one
@@ -77,7 +87,10 @@ struct FoundPhrase {
 /// What Index::find found.
 struct FindResult {
   std::vector<FoundPhrase> matches;  ///< the best one first
-  bool truncated = false;            ///< whether a budget cut something off
+
+  /// Whether a budget cut something off. Then there may be better matches than these, and another
+  /// limit may list others: how far the budget reaches depends on it.
+  bool truncated = false;
 
   /// Whether all members are equal.
   friend bool operator==(const FindResult&, const FindResult&) = default;
@@ -85,21 +98,34 @@ struct FindResult {
 
 /// Why a phrase has its cost for a text, or why it is not found; see Index::explain.
 struct WORDCATCHER_EXPORT FindExplanation {
+  /// What comparing words may take. A comparison takes a step for each pair of code units of the
+  /// two words, and at least kComparisonSteps; the first that would take more than is left, and all
+  /// behind it, are left out.
+  static constexpr std::uint64_t kMaxSteps = 16'777'216;
+  static constexpr std::uint64_t kComparisonSteps = 256;  ///< see kMaxSteps
+
   /// A word of the phrase beside a word of the text.
   struct Comparison {
     std::string word;     ///< of the phrase
     std::uint64_t edits;  ///< between the two
+    std::uint32_t limit;  ///< edits that the two may have: less than the text's word may have by
+                          ///< its length if one of them holds a digit
     bool within;          ///< whether the two may be paired
   };
 
   /// A word of the text.
   struct TextWord {
-    std::size_t begin;                    ///< in the text, in bytes
-    std::size_t end;                      ///< the byte behind its last one
-    std::string word;                     ///< as it is looked up, or as it is if it is too long
-    std::uint32_t limit;                  ///< edits that it may have
-    std::vector<Comparison> comparisons;  ///< with each word of the phrase, in its order; none
-                                          ///< if the word is too long
+    std::size_t begin;          ///< in the text, in bytes
+    std::size_t end;            ///< the byte behind its last one
+    std::string word;           ///< as it is looked up, or as it is if it is too long
+    std::string written;        ///< if `word` is a code: as it is in the text; else empty
+    std::uint32_t lengthLimit;  ///< edits that it may have by its length
+    std::uint32_t limit;        ///< edits that it may have: less if it holds a digit
+    bool isLookedUp;            ///< false if it is too long
+
+    /// With the words of the phrase, in its order: with all, or fewer if `truncated`; with none if
+    /// it is too long.
+    std::vector<Comparison> comparisons;
   };
 
   std::string text;   ///< the host's
@@ -107,12 +133,13 @@ struct WORDCATCHER_EXPORT FindExplanation {
 
   bool isStored = false;                ///< whether the index holds the value
   bool isFound = false;                 ///< whether find() lists it
-  bool truncated = false;               ///< whether a budget cut words of the text off
+  bool truncated = false;               ///< whether a budget cut words or comparisons off
   std::vector<TextWord> words;          ///< of the text, in its order
   std::vector<std::string> phrase;      ///< the words of the phrase that fits best
   std::vector<FoundWord> pairs;         ///< what was paired, in the order of the text
   std::vector<std::string> missing;     ///< words of the phrase that the text lacks
-  std::vector<std::string> surplus;     ///< words of the text that are left over
+  std::vector<std::string> surplus;     ///< words of the text that are left over; of an index of
+                                        ///< codes each with its code behind it: "dear (tr)"
   std::uint64_t edits = 0;              ///< of the pairs
   std::uint64_t cost = 0;               ///< edits, and 2 for each missing and surplus word
   std::vector<std::string> objections;  ///< sentences: which limit keeps it out; empty when found
@@ -140,7 +167,8 @@ struct WORDCATCHER_EXPORT QueryExplanation {
   bool truncated = false;     ///< whether a budget cut words of the text off
   std::int64_t distance = 0;  ///< at the end; 0 for a value that was no candidate
   std::int64_t bound = 0;     ///< the greatest distance that is listed
-  std::vector<Step> steps;    ///< in the order in which they are taken
+  std::vector<Step> steps;    ///< in the order in which they are taken; of a value that is not
+                              ///< stored one, which says so
 
   /// One JSON object on one line, with the names above.
   std::string toJson() const;

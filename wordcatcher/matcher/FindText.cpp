@@ -3,6 +3,7 @@
 #include <unicode/uchar.h>
 #include <unicode/utf16.h>
 
+#include <algorithm>
 #include <optional>
 #include <utility>
 
@@ -34,27 +35,30 @@ class CodeWords {
   WordSegmenter _segmenter;
 };
 
-std::uint32_t limitOf(std::u16string_view word, const EditLimits& limits) {
-  if (word.size() > limits.mediumLength && word.size() > limits.shortLength) {
-    return holdsDigit(word) ? 0 : limits.longEdits;
+std::uint32_t limitByLength(std::u16string_view word, const EditLimits& limits) {
+  if (word.size() <= limits.shortLength) {
+    return limits.shortEdits;
   }
-  const bool isShort = word.size() <= limits.shortLength;
-  return holdsDigit(word) ? 0 : (isShort ? limits.shortEdits : limits.mediumEdits);
+  return word.size() <= limits.mediumLength ? limits.mediumEdits : limits.longEdits;
 }
 
 }  // namespace
 
 FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& limits,
-                   WordSegmenter& segmenter, std::size_t maxWords, std::size_t maxWordUnits) {
+                   WordSegmenter& segmenter, std::size_t maxWords, std::size_t maxWordUnits)
+    : source(text),
+      hasNumbers(mode == MatchingMode::words),
+      hasCodes(mode == MatchingMode::phoneticWords) {
   const std::u16string units = decodeUtf8(text);
   const auto add = [&](std::u16string word, std::size_t begin, std::size_t end,
                        std::uint32_t limit) {
     const bool isLookedUp = word.size() <= maxWordUnits;
     truncated = truncated || !isLookedUp;
-    words.push_back({std::move(word), begin, end, limit, isLookedUp});
+    const bool isNumber = hasNumbers && holdsDigit(word);
+    words.push_back({std::move(word), begin, end, limit,
+                     isNumber ? std::min(limit, limits.numberEdits) : limit, isLookedUp});
   };
   if (mode == MatchingMode::wholeText) {
-    hasNumbers = false;
     if (!units.empty()) {
       add(units.size() <= maxWordUnits ? toLower(units) : units, 0, text.size(),
           limits.wholeTextEdits);
@@ -63,7 +67,7 @@ FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& l
   }
   const ByteOffsets offsets(text);
   std::optional<CodeWords> codes;
-  if (mode == MatchingMode::phoneticWords) {
+  if (hasCodes) {
     codes.emplace(segmenter);
   }
   segmenter.start(units);
@@ -75,12 +79,12 @@ FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& l
     const auto first = static_cast<std::size_t>(token->data() - units.data());
     const std::size_t begin = offsets.of(first);
     const std::size_t end = offsets.of(first + token->size());
-    if (mode == MatchingMode::words || token->size() > maxWordUnits) {
+    if (!hasCodes || token->size() > maxWordUnits) {
       std::u16string word(*token);
       if (token->size() <= maxWordUnits) {
         word = toLower(*token);
       }
-      const std::uint32_t limit = limitOf(word, limits);
+      const std::uint32_t limit = hasCodes ? 0 : limitByLength(word, limits);
       add(std::move(word), begin, end, limit);
       continue;
     }

@@ -18,17 +18,23 @@ struct FindWord {
   std::u16string word;  // as it is looked up: lower-cased, or a code, lower-cased; else as it is
   std::size_t begin;    // in the text, in bytes
   std::size_t end;
-  std::uint32_t limit;  // edits
-  bool isLookedUp;      // false for a word beyond the budget
+  std::uint32_t lengthLimit;  // edits that its length allows
+  std::uint32_t limit;        // edits that it may have, which is less if it holds a digit
+  bool isLookedUp;            // false for a word beyond the budget
 };
 
 /// A text cut into the words that an index of some mode is asked for.
 struct FindText {
   std::vector<FindWord> words;
-  bool truncated = false;  // whether a budget cut words off, or left one out
+  std::string_view source;  // the host's text, which must live as long as this is used
+  bool truncated = false;   // whether a budget cut words off, or left one out
 
-  // Whether words that hold a digit are only found exactly. A whole text is more than a number.
-  bool hasNumbers = true;
+  // Whether words that hold a digit have a limit of their own. A whole text is more than a number,
+  // and the digits of codes are sounds.
+  bool hasNumbers;
+
+  // Whether the words are codes.
+  bool hasCodes;
 
   /// Budgets as in Index::Options. Linear in the text.
   FindText(std::string_view text, MatchingMode mode, const EditLimits& limits, WordSegmenter& words,

@@ -11,6 +11,7 @@
 
 #include "wordcatcher/fuzzy/EditDistance.h"
 #include "wordcatcher/matcher/PhraseFinder.h"
+#include "wordcatcher/matcher/Sentences.h"
 #include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher {
@@ -120,54 +121,100 @@ void leaveOutOverlaps(std::vector<FoundPhrase>& matches, Overlaps overlaps) {
   }
 }
 
-std::vector<FindExplanation::TextWord> comparedWords(const SearchImage& image, const FindText& text,
-                                                     const RankedPhrase& phrase,
-                                                     bool transpositions) {
-  std::vector<FindExplanation::TextWord> words;
+FindExplanation::Comparison comparisonOf(const FindText& text, const FindWord& word,
+                                         const std::u16string& other, const FindOptions& options) {
+  const std::uint64_t edits = editDistance(word.word, other, options.transpositions);
+  const std::uint32_t limit = text.hasNumbers && holdsDigit(other)
+                                  ? std::min(word.limit, options.edits.numberEdits)
+                                  : word.limit;
+  return {displayUtf8(other), edits, limit, edits <= limit};
+}
+
+/// The words of the text beside those of the phrase, as far as the steps suffice.
+void compareWords(const SearchImage& image, const FindText& text, const RankedPhrase& phrase,
+                  const FindOptions& options, FindExplanation& explanation) {
+  std::uint64_t steps = FindExplanation::kMaxSteps;
   for (const FindWord& word : text.words) {
-    auto& compared = words.emplace_back();
+    auto& compared = explanation.words.emplace_back();
     compared.begin = word.begin;
     compared.end = word.end;
     compared.word = displayUtf8(word.word);
+    if (text.hasCodes && word.isLookedUp) {
+      compared.written = text.source.substr(word.begin, word.end - word.begin);
+    }
+    compared.lengthLimit = word.lengthLimit;
     compared.limit = word.limit;
+    compared.isLookedUp = word.isLookedUp;
     if (!word.isLookedUp) {
       continue;
     }
     for (const std::uint32_t flagged : phrase.phrase) {
-      const std::u16string other = image.textOf(flagged & ~image::kPhraseEnd);
-      const std::uint64_t edits = editDistance(word.word, other, transpositions);
-      const bool isNumber = text.hasNumbers && (holdsDigit(word.word) || holdsDigit(other));
-      const bool within = edits <= word.limit && (edits == 0 || !isNumber);
-      compared.comparisons.push_back({displayUtf8(other), edits, within});
+      const std::uint32_t other = flagged & ~image::kPhraseEnd;
+      const std::uint64_t taken = std::max<std::uint64_t>(
+          FindExplanation::kComparisonSteps, word.word.size() * image.labelsOf(other).size());
+      if (taken > steps) {
+        steps = 0;
+        explanation.truncated = true;
+        break;
+      }
+      steps -= taken;
+      compared.comparisons.push_back(comparisonOf(text, word, image.textOf(other), options));
     }
   }
-  return words;
 }
 
-void listUnpaired(const SearchImage& image, const FindText& text, const RankedPhrase& phrase,
-                  const std::vector<Pair>& pairs, FindExplanation& explanation) {
-  std::vector<bool> inText(text.words.size());
-  std::vector<bool> inPhrase(phrase.phrase.size());
-  for (const Pair& pair : pairs) {
-    for (std::uint32_t i = 0; i < pair.option.textWords; ++i) {
-      inText[pair.option.position + i] = true;
+/// Which words of a text and of a phrase are in some pair.
+struct Paired {
+  std::vector<bool> inText;
+  std::vector<bool> inPhrase;
+
+  Paired(const FindText& text, const RankedPhrase& phrase, const std::vector<Pair>& pairs)
+      : inText(text.words.size()), inPhrase(phrase.phrase.size()) {
+    for (const Pair& pair : pairs) {
+      for (std::uint32_t i = 0; i < pair.option.textWords; ++i) {
+        inText[pair.option.position + i] = true;
+      }
+      for (std::uint32_t i = 0; i < pair.option.phraseWords; ++i) {
+        inPhrase[pair.phrasePosition + i] = true;
+      }
     }
-    for (std::uint32_t i = 0; i < pair.option.phraseWords; ++i) {
-      inPhrase[pair.phrasePosition + i] = true;
-    }
-    explanation.edits += pair.option.edits;
   }
-  for (std::size_t i = 0; i < inPhrase.size(); ++i) {
+};
+
+void listWords(const SearchImage& image, const RankedPhrase& phrase, const Paired& paired,
+               FindExplanation& explanation) {
+  for (std::size_t i = 0; i < paired.inPhrase.size(); ++i) {
     explanation.phrase.push_back(wordText(image, phrase.phrase[i]));
-    if (!inPhrase[i]) {
+    if (!paired.inPhrase[i]) {
       explanation.missing.push_back(explanation.phrase.back());
     }
   }
-  for (std::size_t i = 0; i < inText.size(); ++i) {
-    if (!inText[i]) {
-      explanation.surplus.push_back(explanation.words[i].word);
+  for (std::size_t i = 0; i < paired.inText.size(); ++i) {
+    if (!paired.inText[i]) {
+      explanation.surplus.push_back(shown(explanation.words[i]));
     }
   }
+}
+
+/// Two words that stayed alone and could be paired but for a digit; nothing if there are none.
+std::optional<std::string> digitObjection(const Paired& paired,
+                                          const FindExplanation& explanation) {
+  for (std::size_t i = 0; i < explanation.words.size(); ++i) {
+    const auto& word = explanation.words[i];
+    for (std::size_t j = 0; j < word.comparisons.size(); ++j) {
+      const auto& other = word.comparisons[j];
+      if (paired.inText[i] || paired.inPhrase[j] || other.within ||
+          other.edits > word.lengthLimit) {
+        continue;
+      }
+      return "A word that holds a digit " +
+             (other.limit == 0 ? "must be the same"
+                               : "may have up to " + counted(other.limit, "edit")) +
+             ", and " + quoted(word.word) + " is " + counted(other.edits, "edit") + " from " +
+             quoted(other.word) + '.';
+    }
+  }
+  return std::nullopt;
 }
 
 void object(const RankedPhrase& phrase, const FindOptions& options, FindExplanation& explanation) {
@@ -193,23 +240,48 @@ bool lists(const FindResult& result, std::string_view value) {
                      [value](const FoundPhrase& match) { return match.value == value; });
 }
 
-/// Why a value that matches is not listed all the same; nothing if it is.
-std::optional<std::string> omissionOf(const SearchImage& image, const FindText& text,
-                                      std::string_view value, FindOptions options, bool joins) {
-  const Overlaps overlaps = options.overlaps;
-  const std::size_t limit = options.limit;
-  const FindResult result = findPhrases(image, text, options, joins);
-  if (lists(result, value)) {
+/// The place of a value among all matches, the first being 1; nothing if the budget hides it.
+std::optional<std::size_t> placeOf(const SearchImage& image, const FindText& text,
+                                   std::uint32_t number, FindOptions options, bool joins) {
+  options.limit = std::numeric_limits<std::size_t>::max();
+  std::size_t place = 0;
+  if (options.overlaps == Overlaps::all) {
+    // As findPhrases() does, but for the hits, which would take memory.
+    PhraseFinder finder(image, text, options, joins);
+    for (const RankedPhrase& phrase : finder.run(options.limit)) {
+      ++place;
+      if (phrase.value == number) {
+        return place;
+      }
+    }
     return std::nullopt;
   }
-  options.limit = std::numeric_limits<std::size_t>::max();
-  const bool isCutByLimit = (overlaps == Overlaps::all && !result.truncated) ||
-                            lists(findPhrases(image, text, options, joins), value);
-  if (isCutByLimit) {
-    return "It is not among the first " + std::to_string(limit) + " in order, which is the limit.";
+  for (const FoundPhrase& match : findPhrases(image, text, options, joins).matches) {
+    ++place;
+    if (match.value == image.valueText(number)) {
+      return place;
+    }
   }
-  options.overlaps = Overlaps::all;
-  if (overlaps != Overlaps::all && lists(findPhrases(image, text, options, joins), value)) {
+  return std::nullopt;
+}
+
+/// Why a value that matches is not listed all the same; nothing if it is.
+std::optional<std::string> omissionOf(const SearchImage& image, const FindText& text,
+                                      std::uint32_t number, FindOptions options, bool joins) {
+  const FindResult result = findPhrases(image, text, options, joins);
+  if (lists(result, image.valueText(number))) {
+    return std::nullopt;
+  }
+  const std::string beyondLimit = "It is not among the first " + std::to_string(options.limit) +
+                                  " in order, which is the limit";
+  if (const auto place = placeOf(image, text, number, options, joins)) {
+    return beyondLimit + ": its place is " + std::to_string(*place) + '.';
+  }
+  if (options.overlaps == Overlaps::all && !result.truncated) {
+    return beyondLimit + "; the budget of postings does not suffice to tell its place.";
+  }
+  const Overlaps overlaps = std::exchange(options.overlaps, Overlaps::all);
+  if (overlaps != Overlaps::all && placeOf(image, text, number, options, joins)) {
     return overlaps == Overlaps::noSub
                ? "Its range in the text lies within the larger one of another match."
                : "Its range in the text overlaps that of another match, which is longer or comes "
@@ -249,25 +321,32 @@ FindResult findPhrases(const SearchImage& image, const FindText& text, const Fin
 FindExplanation explainFind(const SearchImage& image, const FindText& text, std::string_view value,
                             const FindOptions& options, bool joins) {
   FindExplanation explanation;
+  explanation.text = text.source;
   explanation.value = value;
   explanation.truncated = text.truncated;
   const auto number = valueNumber(image, value);
   explanation.isStored = number.has_value();
   if (!number) {
-    explanation.objections.emplace_back("The index holds no such data string.");
     return explanation;
   }
   PhraseFinder finder(image, text, options, joins);
   const auto admitted = finder.judge(*number);
   const RankedPhrase phrase = admitted ? *admitted : finder.judgeAnyway(*number);
   auto pairs = finder.pairsOf(phrase);
+  const Paired paired(text, phrase, pairs);
   explanation.cost = phrase.cost;
-  explanation.words = comparedWords(image, text, phrase, options.transpositions);
-  listUnpaired(image, text, phrase, pairs, explanation);
+  for (const Pair& pair : pairs) {
+    explanation.edits += pair.option.edits;
+  }
+  compareWords(image, text, phrase, options, explanation);
+  listWords(image, phrase, paired, explanation);
   explanation.pairs = hitsOf(image, text, phrase, std::move(pairs));
   if (!admitted) {
     object(phrase, options, explanation);
-  } else if (auto omission = omissionOf(image, text, value, options, joins)) {
+    if (auto objection = digitObjection(paired, explanation)) {
+      explanation.objections.push_back(*std::move(objection));
+    }
+  } else if (auto omission = omissionOf(image, text, *number, options, joins)) {
     explanation.objections.push_back(*std::move(omission));
   }
   explanation.isFound = explanation.objections.empty();

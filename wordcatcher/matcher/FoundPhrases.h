@@ -16,7 +16,7 @@ namespace wordcatcher {
 FindResult findPhrases(const SearchImage& image, const FindText& text, const FindOptions& options,
                        bool joins);
 
-/// Why a value is or is not among them; all but the text itself is filled in.
+/// Why a value is or is not among them. Of one that is not stored nothing more is told.
 FindExplanation explainFind(const SearchImage& image, const FindText& text, std::string_view value,
                             const FindOptions& options, bool joins);
 

@@ -12,6 +12,7 @@
 #include "wordcatcher/fuzzy/LXFuzzyIndex.h"
 #include "wordcatcher/matcher/FindText.h"
 #include "wordcatcher/matcher/FoundPhrases.h"
+#include "wordcatcher/matcher/Sentences.h"
 #include "wordcatcher/matcher/SpanQuery.h"
 #include "wordcatcher/matcher/SpanShortcut.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
@@ -119,6 +120,9 @@ struct Index::State {
   QueryResult queryWords(std::u16string_view text) const;
 
   SpanAnswer runSpanQuery(std::u16string_view text, SpanQueryTrace* trace) const;
+
+  /// What to do about a value that is not stored.
+  std::string absenceOf(std::string_view value) const;
 };
 
 Index::Index(std::shared_ptr<const State> state) : _state(std::move(state)) {}
@@ -240,8 +244,8 @@ Index::SearchResult Index::search(std::string_view word, std::int64_t maxDistanc
 }
 
 FindText Index::State::cut(std::string_view text, const EditLimits& limits) const {
-  for (const std::uint32_t edits :
-       {limits.shortEdits, limits.mediumEdits, limits.longEdits, limits.wholeTextEdits}) {
+  for (const std::uint32_t edits : {limits.shortEdits, limits.mediumEdits, limits.longEdits,
+                                    limits.wholeTextEdits, limits.numberEdits}) {
     if (edits > EditLimits::kMaxEdits) {
       throw Error(ErrorCode::badInput, "An edit limit of " + std::to_string(edits) +
                                            " finds almost anything; give at most " +
@@ -268,8 +272,19 @@ FindExplanation Index::explain(std::string_view text, std::string_view value,
   const FindText words = _state->cut(text, options.edits);
   auto explanation =
       explainFind(*_state->image, words, value, options, joinsWords(_state->mode, options));
-  explanation.text = text;
+  if (!explanation.isStored) {
+    explanation.objections.push_back(_state->absenceOf(value));
+  }
   return explanation;
+}
+
+std::string Index::State::absenceOf(std::string_view value) const {
+  FindOptions options;
+  options.limit = 1;
+  const FindText words = cut(phraseOf(value), options.edits);
+  const auto nearest = findPhrases(*image, words, options, joinsWords(mode, options)).matches;
+  return "The index holds no such data string; give one just as find prints it" +
+         (nearest.empty() ? "." : ", such as " + quoted(nearest.front().value) + '.');
 }
 
 QueryExplanation Index::explainQuery(std::string_view text, std::string_view value) const {
@@ -287,27 +302,30 @@ QueryExplanation Index::explainQuery(std::string_view text, std::string_view val
         explanation.distance = match.distance;
         explanation.steps.push_back({"The stored text \"" + match.value +
                                          "\" carries the value and is " +
-                                         std::to_string(match.distance) + " edits from this one.",
+                                         counted(match.distance, "edit") + " from this one.",
                                      match.distance});
         break;
       }
     }
     explanation.isStored = explanation.isFound || valueNumber(image, value).has_value();
     if (explanation.isStored && !explanation.isFound) {
-      explanation.steps.push_back(
-          {result.truncated ? "The text is not looked up: it is too long."
-                            : "No stored text that carries the value is within " +
-                                  std::to_string(kWholeTextDistance) + " edits of this one.",
-           0});
+      explanation.steps.push_back({result.truncated
+                                       ? "The text is not looked up: it is too long."
+                                       : "No stored text that carries the value is within " +
+                                             counted(kWholeTextDistance, "edit") + " of this one.",
+                                   0});
+    } else if (!explanation.isStored) {
+      explanation.steps.push_back({_state->absenceOf(value), 0});
     }
     return explanation;
   }
   const auto number = valueNumber(image, value);
   explanation.isStored = number.has_value();
   if (!number) {
+    explanation.steps.push_back({_state->absenceOf(value), 0});
     return explanation;
   }
-  SpanQueryTrace trace(image, *number);
+  SpanQueryTrace trace(image, *number, _state->mode == MatchingMode::phoneticWords);
   _state->runSpanQuery(decodeUtf8(text), &trace);
   const auto found = std::find_if(result.matches.begin(), result.matches.end(),
                                   [value](const Match& match) { return match.value == value; });

@@ -17,8 +17,15 @@ namespace wordcatcher {
 
 /// An index opened for reading: a search image, or a classic index directory.
 ///
-///     const Index index = Index::open("names.wci");
-///     for (const auto& match : index.query("trinidat and tobbago").matches) ...
+///     #include "wordcatcher/matcher/Index.h"
+///
+///     const auto index = wordcatcher::Index::open("names.wci");
+///     for (const auto& match : index.find("holidays in trinidat and tobbago").matches) {
+///       std::cout << match.value << " costs " << match.cost << '\n';
+///     }
+///
+/// find() is the call to take, unless you need the answers of an older host, which query() gives.
+/// search() finds words instead of phrases, and explain() and explainQuery() tell why.
 ///
 /// An Index is immutable and cheap to copy; any number of threads use one at once, without locks.
 /// No lock file is needed: any number of processes read one image, also from read-only media, while
@@ -77,6 +84,10 @@ class WORDCATCHER_EXPORT Index {
 
   /// The matches of a fresh classic matcher in the same mode (see KXWordcatcher::query), where its
   /// first result, nothing, is `found` being false.
+  ///
+  /// The time is at most that of search() for each word of the text within 2 edits (0 in an index
+  /// of codes, 3 for a whole text), and linear in the phrases under all words found, which no
+  /// budget bounds; then n log n in the matches.
   QueryResult query(std::string_view text) const;
 
   /// One stored word (or whole text, or code) near another.
@@ -95,6 +106,10 @@ class WORDCATCHER_EXPORT Index {
   /// As LXFuzzyIndex::search_withMaxDistance, in its order; strings with characters outside the
   /// Basic Multilingual Plane are found as well, each such character counting as two code units.
   /// Throws Error (badInput) for a word that is not UTF-8 or a distance above 16.
+  ///
+  /// The time is linear in the distinct beginnings of stored words that are within the distance of
+  /// some beginning of the word, times the distance: few of them at 1 or 2 edits, and all that the
+  /// index holds at a distance as great as its words are long.
   SearchResult search(std::string_view word, std::int64_t maxDistance) const;
 
   /// The phrases that a text holds, wholly or in part, the best one first.
@@ -107,12 +122,12 @@ class WORDCATCHER_EXPORT Index {
   /// least one of its words is paired.
   ///
   /// The order: the smaller cost; then more words of the phrase paired; then more of these without
-  /// edits; then fewer breaks (pairs that do not follow the one before them directly, in the phrase
-  /// and in the text); then the rarer paired words (fewer phrases under them in all); then the
-  /// shorter phrase (words, then code units); then the value by UTF-16 code units. Of several
-  /// best pairings the one with the fewest breaks counts, then the one that takes the text's
-  /// words earliest, then the phrase's. A value that was stored with several phrases is found once,
-  /// by the best.
+  /// edits; then less disorder (0 for a pair that follows the one before it directly, in the phrase
+  /// and in the text, 1 for one with words between, 2 for one that stands before it in the text);
+  /// then the rarer paired words (fewer phrases under them in all); then the shorter phrase (words,
+  /// then code units); then the value by UTF-16 code units. Of several best pairings the one with
+  /// the least disorder counts, then the one that takes the text's words earliest, then the
+  /// phrase's. A value that was stored with several phrases is found once, by the best.
   ///
   /// In an index of phonetic codes the codes are compared exactly; in one of whole texts the text
   /// is one word, and so is each phrase.
@@ -121,20 +136,35 @@ class WORDCATCHER_EXPORT Index {
   /// most Options::maxQueryWords are looked at, a word of more than Options::maxWordUnits is not
   /// looked up, and FindOptions::maxPostings bounds the phrases that are judged. Throws Error
   /// (badInput) for edit limits that are too large.
+  ///
+  /// `limit` k gives the first k of all matches, unless the result is `truncated`: what a budget
+  /// cut off may have come before some that are listed, and with another limit it may cut at
+  /// another place, so that the first k may then differ from those of a longer list.
+  ///
+  /// The time is that of search() for each word of the text within its edit limit; then at most
+  /// FindOptions::maxPostings phrases are judged, each in time linear in its words and in the ways
+  /// to pair them, and as many steps taken to try pairings. Phrases are met in the order of what
+  /// they may cost at best, so that a small `limit` ends this early; with `overlaps` other than
+  /// `all`, all matches are found and sorted first.
   FindResult find(std::string_view text) const;
 
   /// The same with options: how many, how far, which of those that overlap.
   FindResult find(std::string_view text, const FindOptions& options) const;
 
-  /// Why a value has its cost for a text, or why find() does not list it with these options. Linear
-  /// in the index's values, beside some calls of find(). Throws as find() does.
+  /// Why a value has its cost for a text, or why find() does not list it with these options. The
+  /// value is given as find() prints it. Throws as find() does.
+  ///
+  /// The time is linear in the index's values, beside a call of find() and, for a value that it
+  /// does not list, up to two without a limit. Comparing the words of both takes at most
+  /// FindExplanation::kMaxSteps; if they do not suffice, the explanation is `truncated`.
   FindExplanation explain(std::string_view text, std::string_view value) const;
 
   /// The same for what find() does with these options.
   FindExplanation explain(std::string_view text, std::string_view value,
                           const FindOptions& options) const;
 
-  /// The same for the distance of query(), step by step.
+  /// The same for the distance of query(), step by step. Linear in the index's values, beside two
+  /// calls of query() and, for a value that is not stored, one of find().
   QueryExplanation explainQuery(std::string_view text, std::string_view value) const;
 
   /// What an index holds.

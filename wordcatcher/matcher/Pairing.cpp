@@ -15,8 +15,13 @@ constexpr std::size_t kMaxTriedWords = 256;
 constexpr std::size_t kFewOptions = 4096;
 constexpr std::size_t kOptionsATextWord = 8;
 
+// Disorder of a pair.
+constexpr std::uint64_t kDirectly = 0;
+constexpr std::uint64_t kLater = 1;
+constexpr std::uint64_t kBefore = 2;
+
 auto quality(const PairingScore& score) {
-  return std::make_tuple(score.gain, score.words, score.exact, ~score.breaks);
+  return std::make_tuple(score.gain, score.words, score.exact, ~score.disorder);
 }
 
 std::uint64_t exactWords(const PairOption& option) {
@@ -74,6 +79,14 @@ bool Pairing::follows(const Pair& last, std::uint32_t phrasePosition,
          last.option.position + last.option.textWords == option.position;
 }
 
+std::uint64_t Pairing::disorderOf(const Pair& last, std::uint32_t phrasePosition,
+                                  const PairOption& option) const {
+  if (follows(last, phrasePosition, option)) {
+    return kDirectly;
+  }
+  return option.position > last.option.position ? kLater : kBefore;
+}
+
 PairingScore Pairing::scoreOf(std::span<const Pair> pairs) const {
   PairingScore score;
   const Pair* last = nullptr;
@@ -81,50 +94,81 @@ PairingScore Pairing::scoreOf(std::span<const Pair> pairs) const {
     score.gain += pair.option.gain();
     score.words += pair.option.phraseWords;
     score.exact += exactWords(pair.option);
-    score.breaks += last != nullptr && !follows(*last, pair.phrasePosition, pair.option) ? 1 : 0;
+    score.disorder += last != nullptr ? disorderOf(*last, pair.phrasePosition, pair.option) : 0;
     last = &pair;
   }
   return score;
 }
 
-/// Each word takes an option of its least edits; of these the ones with the fewest breaks. False
+/// For each option of a word, the best one up to it and from it on: of those with the least edits
+/// the one with the least disorder behind it, then the earliest.
+void Pairing::rankOnward(const Word& word) {
+  std::uint32_t best = kNone;
+  for (std::uint32_t i = word.firstOption; i < word.endOption; ++i) {
+    if (_options[i].gain() == word.bestGain &&
+        (best == kNone || _onward[i].disorder < _onward[best].disorder)) {
+      best = i;
+    }
+    _bestUpTo[i] = best;
+  }
+  best = kNone;
+  for (std::uint32_t i = word.endOption; i-- > word.firstOption;) {
+    if (_options[i].gain() == word.bestGain &&
+        (best == kNone || _onward[i].disorder <= _onward[best].disorder)) {
+      best = i;
+    }
+    _bestBehind[i] = best;
+  }
+}
+
+/// What comes best behind an option of the word before.
+Pairing::Onward Pairing::bestOnward(const Word& word, std::uint32_t option) const {
+  const Word& before = *(&word - 1);
+  const std::uint32_t position = _options[option].position;
+  const auto begin = _options.begin() + word.firstOption;
+  const auto end = _options.begin() + word.endOption;
+  const auto later =
+      static_cast<std::uint32_t>(std::upper_bound(begin, end, position,
+                                                  [](std::uint32_t at, const PairOption& each) {
+                                                    return at < each.position;
+                                                  }) -
+                                 _options.begin());
+  Onward best = {UINT64_MAX, kNone};
+  const auto offer = [&](std::uint32_t next, std::uint64_t disorder) {
+    disorder += _onward[next].disorder;
+    if (disorder < best.disorder || (disorder == best.disorder && next < best.next)) {
+      best = {disorder, next};
+    }
+  };
+  if (later > word.firstOption && _bestUpTo[later - 1] != kNone) {
+    offer(_bestUpTo[later - 1], kBefore);
+  }
+  if (later < word.endOption && _bestBehind[later] != kNone) {
+    offer(_bestBehind[later], kLater);
+    if (_options[later].position == position + 1 && word.position == before.position + 1 &&
+        _options[later].gain() == word.bestGain) {
+      offer(later, kDirectly);
+    }
+  }
+  return best;
+}
+
+/// Each word takes an option of its least edits; of these the ones with the least disorder. False
 /// when two words come to want the same word of the text.
 bool Pairing::pairEachByItself() {
   _onward.assign(_options.size(), {0, kNone});
-  std::uint32_t bestOfNext = kNone;
+  _bestUpTo.resize(_options.size());
+  _bestBehind.resize(_options.size());
   for (std::size_t w = _words.size(); w-- > 0;) {
-    const Word& word = _words[w];
-    std::uint32_t best = kNone;
-    for (std::uint32_t i = word.firstOption; i < word.endOption; ++i) {
-      if (_options[i].gain() != word.bestGain) {
-        continue;
-      }
-      if (bestOfNext != kNone) {
-        const Word& next = _words[w + 1];
-        _onward[i] = {_onward[bestOfNext].breaks + 1, bestOfNext};
-        const auto begin = _options.begin() + next.firstOption;
-        const auto end = _options.begin() + next.endOption;
-        const auto adjacent = std::lower_bound(
-            begin, end, _options[i].position + 1,
-            [](const PairOption& option, std::uint32_t at) { return option.position < at; });
-        if (next.position == word.position + 1 && adjacent != end &&
-            adjacent->position == _options[i].position + 1 && adjacent->gain() == next.bestGain) {
-          const auto number = static_cast<std::uint32_t>(adjacent - _options.begin());
-          const std::uint64_t breaks = _onward[number].breaks;
-          if (breaks < _onward[i].breaks ||
-              (breaks == _onward[i].breaks && adjacent->position < _options[bestOfNext].position)) {
-            _onward[i] = {breaks, number};
-          }
-        }
-      }
-      if (best == kNone || _onward[i].breaks < _onward[best].breaks) {
-        best = i;
+    if (w + 1 < _words.size()) {
+      for (std::uint32_t i = _words[w].firstOption; i < _words[w].endOption; ++i) {
+        _onward[i] = bestOnward(_words[w + 1], i);
       }
     }
-    bestOfNext = best;
+    rankOnward(_words[w]);
   }
   bool isFree = true;
-  std::uint32_t option = bestOfNext;
+  std::uint32_t option = _bestBehind[_words.front().firstOption];
   for (const Word& word : _words) {
     _best.push_back({word.position, _options[option]});
     isFree = isFree && _used[_options[option].position] == 0;
@@ -234,7 +278,7 @@ void Pairing::tryFrom(std::size_t word, std::uint64_t& steps) {
   }
   const PairingScore& rest = _reachableFrom[word];
   const PairingScore reachable = {_currentScore.gain + rest.gain, _currentScore.words + rest.words,
-                                  _currentScore.exact + rest.exact, _currentScore.breaks};
+                                  _currentScore.exact + rest.exact, _currentScore.disorder};
   if (quality(reachable) < quality(_bestScore) ||
       (quality(reachable) == quality(_bestScore) && isLater())) {
     return;
@@ -273,7 +317,7 @@ void Pairing::tryOption(std::size_t word, const PairOption& option, std::uint64_
   _currentScore.gain += option.gain();
   _currentScore.words += option.phraseWords;
   _currentScore.exact += exactWords(option);
-  _currentScore.breaks += !_current.empty() && !follows(_current.back(), position, option) ? 1 : 0;
+  _currentScore.disorder += _current.empty() ? 0 : disorderOf(_current.back(), position, option);
   use(option, true);
   _current.push_back({position, option});
   tryFrom(word + 1, steps);

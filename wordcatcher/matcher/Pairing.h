@@ -7,11 +7,11 @@
 // phrase is paired with both, and a word of the phrase that joins two of the text as well. A pair
 // takes its words out of those that cost 2 each, and costs its edits: so its gain is 2 a word less
 // its edits. The best pairing has the greatest gain, then the most words of the phrase, then the
-// most of these without edits, then the fewest breaks, then the earliest words of the text, then of
-// the phrase.
+// most of these without edits, then the least disorder, then the earliest words of the text, then
+// of the phrase.
 //
 // Mostly every word of the phrase can take what is best for it without being in another's way;
-// fewest breaks are then found word by word from the end (dynamic programming). Where two words
+// the least disorder is then found word by word from the end (dynamic programming). Where two words
 // want one word of the text, or words are joined, all pairings are tried, the most promising first,
 // and given up as soon as they cannot become better than the best so far (branch and bound).
 
@@ -42,9 +42,11 @@ struct Pair {
 /// How good a pairing is.
 struct PairingScore {
   std::uint64_t gain = 0;
-  std::uint64_t words = 0;   // of the phrase, paired
-  std::uint64_t exact = 0;   // of those, without edits
-  std::uint64_t breaks = 0;  // pairs that do not follow the one before directly on both sides
+  std::uint64_t words = 0;  // of the phrase, paired
+  std::uint64_t exact = 0;  // of those, without edits
+  // For each pair but the first: 0 when it follows the one before directly on both sides, 1 when
+  // words are between, 2 when it stands before it in the text.
+  std::uint64_t disorder = 0;
 };
 
 /// Finds best pairings, one after the other, of one text. Used by one thread.
@@ -80,7 +82,7 @@ class Pairing {
   };
   /// What comes behind an option in the best way.
   struct Onward {
-    std::uint64_t breaks;
+    std::uint64_t disorder;
     std::uint32_t next;  // an option, or kNone
   };
   static constexpr std::uint32_t kNone = UINT32_MAX;
@@ -94,12 +96,18 @@ class Pairing {
   bool isFree(const PairOption& option) const;
   void use(const PairOption& option, bool isUsed);
   bool follows(const Pair& last, std::uint32_t phrasePosition, const PairOption& option) const;
+  std::uint64_t disorderOf(const Pair& last, std::uint32_t phrasePosition,
+                           const PairOption& option) const;
+  void rankOnward(const Word& word);
+  Onward bestOnward(const Word& word, std::uint32_t option) const;
   PairingScore scoreOf(std::span<const Pair> pairs) const;
 
   std::vector<std::uint8_t> _used;  // a text's words that the pairing in hand takes
   std::vector<PairOption> _options;
   std::vector<Word> _words;  // those with options only
   std::vector<Onward> _onward;
+  std::vector<std::uint32_t> _bestUpTo;      // of a word's options, the best up to each one
+  std::vector<std::uint32_t> _bestBehind;    // and from it on
   std::vector<PairingScore> _reachableFrom;  // the most that words from one on can add
   std::uint32_t _phraseWords = 0;
   std::uint64_t _mostGain = 0;

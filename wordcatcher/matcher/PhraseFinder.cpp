@@ -21,8 +21,8 @@ constexpr char16_t kFirstBeyondAscii = 0x80;
 // Trying all pairings of a phrase takes steps, which cost about as much as a posting.
 constexpr std::uint64_t kStepsAPosting = 1;
 
-// So many postings before a phrase is looked at, memory is asked for it, and twice as many before for
-// where it is.
+// So many postings before a phrase is looked at, memory is asked for it, and twice as many before
+// for where it is.
 constexpr std::size_t kValuesAhead = 4;
 
 // Costs above are rare.
@@ -30,8 +30,8 @@ constexpr std::size_t kCountedBounds = 64;
 
 std::uint64_t apart(std::uint64_t a, std::uint64_t b) { return a < b ? b - a : a - b; }
 
-/// The items by their buckets, in each in their order. Linear in both: for what differs little, this
-/// is faster than to compare.
+/// The items by their buckets, in each in their order. Linear in both: for what differs little,
+/// this is faster than to compare.
 template <typename Item, typename BucketOf>
 std::vector<Item> sortedByCounting(const std::vector<Item>& items, std::size_t buckets,
                                    BucketOf bucketOf) {
@@ -49,7 +49,7 @@ std::vector<Item> sortedByCounting(const std::vector<Item>& items, std::size_t b
 
 /// All of the order but the code units and the value.
 auto keyOf(const RankedPhrase& phrase) {
-  return std::make_tuple(phrase.cost, ~phrase.words, ~phrase.exact, phrase.breaks, phrase.rarity,
+  return std::make_tuple(phrase.cost, ~phrase.words, ~phrase.exact, phrase.disorder, phrase.rarity,
                          phrase.length);
 }
 
@@ -91,7 +91,7 @@ void PhraseFinder::lookUpWords() {
       }
       if (_text.hasNumbers && !holdsDigit(word.word)) {
         std::erase_if(place->second, [&](const NearWord& near) {
-          return near.edits > 0 && isNumber(near, word.word.size());
+          return near.edits > _options.edits.numberEdits && isNumber(near, word.word.size());
         });
       }
     }
@@ -508,7 +508,9 @@ void PhraseFinder::namePairs(std::span<const std::uint32_t> phrase) {
 
 std::uint64_t PhraseFinder::costOf(std::span<const std::uint32_t> phrase,
                                    std::uint64_t gain) const noexcept {
-  return 2 * (_text.words.size() + phrase.size()) - gain;
+  // Words that want the same word of the text can promise more than all words cost.
+  const std::uint64_t alone = 2 * (_text.words.size() + phrase.size());
+  return alone - std::min(alone, gain);
 }
 
 /// The best pairing of what namePairs() named.
@@ -519,7 +521,7 @@ RankedPhrase PhraseFinder::solve(std::uint32_t value, std::span<const std::uint3
   ranked.cost = costOf(phrase, score.gain);
   ranked.words = score.words;
   ranked.exact = score.exact;
-  ranked.breaks = score.breaks;
+  ranked.disorder = score.disorder;
   ranked.length = phrase.size();
   ranked.value = value;
   ranked.phrase = phrase;

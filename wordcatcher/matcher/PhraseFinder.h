@@ -39,7 +39,7 @@ struct RankedPhrase {
   std::uint64_t cost = 0;
   std::uint64_t words = 0;  // of the phrase, paired
   std::uint64_t exact = 0;
-  std::uint64_t breaks = 0;
+  std::uint64_t disorder = 0;
   std::uint64_t rarity = 0;  // phrases under the paired words
   std::uint64_t length = 0;  // words of the phrase
   std::uint32_t value = 0;

@@ -3,26 +3,18 @@
 #include <algorithm>
 #include <utility>
 
+#include "wordcatcher/matcher/Sentences.h"
 #include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher {
-
-namespace {
-
-std::string quoted(std::string_view word) { return '"' + std::string(word) + '"'; }
-
-std::string counted(std::int64_t count, const std::string& thing) {
-  return std::to_string(count) + ' ' + thing + (count == 1 ? "" : "s");
-}
-
-}  // namespace
 
 void SpanQueryTrace::leaveOut(std::u16string_view word, const char* reason) {
   tell(quoted(displayUtf8(word)) + " is not looked up: it is " + reason + ".");
 }
 
 void SpanQueryTrace::lookUpAll() {
-  tell("No word of the text is long enough, so every word is looked up, and counts.");
+  tell("No " + _noun + " of the text is long enough, so every " + _noun +
+       " is looked up, and counts.");
 }
 
 void SpanQueryTrace::lookUp(std::u16string_view word, const std::vector<WordHit>& hits,
@@ -31,8 +23,7 @@ void SpanQueryTrace::lookUp(std::u16string_view word, const std::vector<WordHit>
   if (std::any_of(hits.begin(), hits.end(), [](const WordHit& hit) { return hit.values > 0; })) {
     _sets.push_back({text, distance});
   }
-  std::string sentence =
-      text + " is near " + counted(static_cast<std::int64_t>(hits.size()), "stored word");
+  std::string sentence = text + " is near " + counted(hits.size(), "stored " + _noun);
   if (!distance) {
     tell(sentence + (hits.empty() ? "." : ", none of which carries the value."));
     return;
@@ -46,10 +37,10 @@ void SpanQueryTrace::lookUp(std::u16string_view word, const std::vector<WordHit>
 }
 
 void SpanQueryTrace::count(std::int64_t countedWords, std::int64_t uncountedLength, bool found) {
-  tell("The text counts " + counted(countedWords, "word") + " (longer than " +
-       counted(uncountedLength, "letter") + ", or all when every word is looked up).");
+  tell("The text counts " + counted(countedWords, _noun) + " (longer than " +
+       counted(uncountedLength, "letter") + ", or all when every " + _noun + " is looked up).");
   if (!found) {
-    tell("No word brings any value, so nothing is found.");
+    tell("No " + _noun + " brings any value, so nothing is found.");
   }
 }
 
@@ -57,8 +48,8 @@ void SpanQueryTrace::begin() {
   const auto& first = _sets.front();
   _isIn = first.distance.has_value();
   if (!_isIn) {
-    tell("The candidates are the values that " + first.word +
-         " brings, the first word that brings any; this one is not among them.");
+    tell("The candidates are the values that " + first.word + " brings, the first " + _noun +
+         " that brings any; this one is not among them.");
     return;
   }
   _distance = *first.distance;
@@ -71,8 +62,9 @@ void SpanQueryTrace::add(std::int64_t penalty) { _distance += _isIn ? penalty : 
 void SpanQueryTrace::penaliseMissing(std::int64_t missing, std::int64_t penalty) {
   if (_isIn) {
     add(penalty);
-    tell(counted(missing, "stored word") + " fewer than counted words were found, which adds " +
-         std::to_string(penalty) + '.');
+    tell(counted(missing, "stored " + _noun) + " fewer than counted " + _noun +
+         "s were found, which adds " + std::to_string(penalty) +
+         (_hasCodes ? ", however many there are, as codes are compared exactly." : "."));
   }
 }
 
@@ -83,11 +75,11 @@ void SpanQueryTrace::compare(std::size_t candidateSet, Compared outcome, std::in
   }
   switch (outcome) {
     case Compared::same:
-      tell(set.word + " brings the same values as the first word, and adds nothing.");
+      tell(set.word + " brings the same values as the first " + _noun + ", and adds nothing.");
       return;
     case Compared::disjoint:
       add(penalty);
-      tell(set.word + " shares no value with the words before it, which adds " +
+      tell(set.word + " shares no value with the " + _noun + "s before it, which adds " +
            std::to_string(penalty) + '.');
       return;
     case Compared::common:
@@ -109,15 +101,19 @@ void SpanQueryTrace::penaliseLength(std::int64_t phraseWords, std::int64_t count
     return;
   }
   add(penalty);
+  // Of a phrase words are counted, whatever the index holds.
   tell("The phrase counts " + counted(phraseWords, "word") + ", the text " +
-       std::to_string(countedWords) + ", which adds " + std::to_string(penalty) + '.');
+       (_hasCodes ? counted(countedWords, _noun) : std::to_string(countedWords)) + ", which adds " +
+       std::to_string(penalty) +
+       (_hasCodes ? ": where codes are compared exactly, lengths count nothing." : "."));
 }
 
 void SpanQueryTrace::compareWithBound(std::int64_t bound) {
   _bound = bound;
   if (_isIn) {
     tell("The distance is " + std::to_string(_distance) + "; values up to " +
-         std::to_string(bound) + " are listed, so this one is" +
+         std::to_string(bound) + " are listed" +
+         (_hasCodes ? ", as codes are compared exactly" : "") + ", so this one is" +
          (_distance <= bound ? "" : " not") + '.');
   }
 }

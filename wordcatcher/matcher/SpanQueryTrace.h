@@ -16,7 +16,9 @@ namespace wordcatcher {
 /// What becomes of one value in a span query, told in words while the query runs.
 class SpanQueryTrace {
  public:
-  SpanQueryTrace(const SearchImage& image, std::uint32_t value) : _image(image), _value(value) {}
+  /// `hasCodes`: whether the words are codes, which are compared exactly.
+  SpanQueryTrace(const SearchImage& image, std::uint32_t value, bool hasCodes)
+      : _image(image), _value(value), _hasCodes(hasCodes), _noun(hasCodes ? "code" : "word") {}
 
   std::uint32_t value() const noexcept { return _value; }
   const std::vector<QueryExplanation::Step>& steps() const noexcept { return _steps; }
@@ -55,6 +57,8 @@ class SpanQueryTrace {
 
   const SearchImage& _image;
   std::uint32_t _value;
+  bool _hasCodes;
+  std::string _noun;  // what a word of the index is
   std::vector<CandidateSet> _sets;
   std::vector<QueryExplanation::Step> _steps;
   std::int64_t _distance = 0;

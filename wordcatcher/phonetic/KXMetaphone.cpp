@@ -86,7 +86,8 @@ std::u16string KXMetaphone::translate(std::u16string_view text) {
 
 std::u16string KXMetaphone::_translateWord(std::u16string_view word) {
   if (word.size() > kMaxLength) {
-    throw std::length_error("A word must not be longer than 2,147,483,647 code units.");
+    throw std::length_error(
+        "A word must not be longer than 2,147,483,647 code units; leave it out or cut it.");
   }
   if (!encode(word)) {
     return {};

@@ -47,7 +47,9 @@ void verify(KXMetaphone& encoder, const Expectation& expectation) {
 void verifyLine(KXMetaphone& encoder, std::FILE* expectations) {
   const std::u16string line = readLineAsKXString(expectations);
   if (std::ferror(expectations) != 0) {
-    throw std::runtime_error("the file cannot be read any further.");
+    throw std::runtime_error(
+        "the file cannot be read any further; check that it is a file, not a directory, and that "
+        "its disk is sound, and try again.");
   }
   verify(encoder, expectationOf(line));
 }

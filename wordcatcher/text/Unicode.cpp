@@ -17,7 +17,8 @@ constexpr const char* kRootLocale = "";
 constexpr std::size_t kMaxLength = std::numeric_limits<std::int32_t>::max();
 
 [[noreturn]] void throwTooLong() {
-  throw std::length_error("A text must not be longer than 2,147,483,647 code units.");
+  throw std::length_error(
+      "A text must not be longer than 2,147,483,647 code units; give it in shorter pieces.");
 }
 
 std::int32_t icuLength(std::size_t length) {

@@ -34,7 +34,8 @@ void WordSegmenter::CloseIterator::operator()(UBreakIterator* iterator) const no
 
 void WordSegmenter::start(std::u16string_view text) {
   if (text.size() > static_cast<std::size_t>(std::numeric_limits<std::int32_t>::max())) {
-    throw std::length_error("A text must not be longer than 2,147,483,647 code units.");
+    throw std::length_error(
+        "A text must not be longer than 2,147,483,647 code units; give it in shorter pieces.");
   }
   _text = text.empty() ? std::u16string_view(u"") : text;  // ICU takes no null pointer
   UErrorCode status = U_ZERO_ERROR;
