@@ -279,7 +279,7 @@ def introduction(others):
     """`others`: the part of the processors' time that other processes took."""
     text = (
         f"# Comparison, {date.today()}\n\n{machine.model()}, {os.cpu_count()} cores, of whose time other "
-        f"processes took {others:.0%} meanwhile. One thread, warm, {in_words(ROUNDS)} in which the "
+        f"processes took {100 * others:.0f} % meanwhile. One thread, warm, {in_words(ROUNDS)} in which the "
         "engines take turns"
     )
     text += "" if ROUNDS == 1 else "; ratios are medians of the rounds' ratios"

@@ -72,7 +72,9 @@ def report(taken: dict[int, list[float]]) -> str:
         for name, each in lines.items()
     )
     judged = "within" if ratio <= BOUND else "beyond"
-    return text + f"two threads take {ratio:.0%} of the time of one: {judged} {BOUND:.0%}\n"
+    return text + (
+        f"two threads take {100 * ratio:.0f} % of the time of one: {judged} {100 * BOUND:.0f} %\n"
+    )
 
 
 def main(count: int, rounds: int) -> None:

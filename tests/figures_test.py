@@ -217,7 +217,7 @@ class CompareTest(unittest.TestCase):
 
     def test_others_work_meanwhile_is_told(self):
         with unittest.mock.patch.object(compare.machine.Watch, "others", lambda _: 0.123):
-            self.assertIn("of whose time other processes took 12% meanwhile", self.page())
+            self.assertIn("of whose time other processes took 12 % meanwhile", self.page())
 
     def test_the_chart_is_that_of_the_page(self):
         page = self.page()

@@ -32,11 +32,11 @@ def test_threads_take_turns(bench: ModuleType) -> None:
 def test_the_ratio_is_the_median_of_the_rounds_ratios(bench: ModuleType) -> None:
     # The best times of all rounds would give 0.4 / 1.0, and their medians 0.9 / 1.5.
     taken = {1: [1.0, 2.0, 1.5], 2: [0.58, 0.4, 0.9]}
-    assert "two threads take 58% of the time of one: within 60%\n" in bench.report(taken)
+    assert "two threads take 58 % of the time of one: within 60 %\n" in bench.report(taken)
     taken[2][0] = 0.61
-    assert "two threads take 60% of the time of one: within 60%\n" in bench.report(taken)
+    assert "two threads take 60 % of the time of one: within 60 %\n" in bench.report(taken)
     taken[2][2] = 1.2
-    assert "two threads take 61% of the time of one: beyond 60%\n" in bench.report(taken)
+    assert "two threads take 61 % of the time of one: beyond 60 %\n" in bench.report(taken)
 
 
 def test_a_whole_run_prints_its_results(
