@@ -275,16 +275,18 @@ rc::Gen<FindOptions> anyOptions() {
   });
 }
 
-TEST(FindYardstickTest, ValuesOfSeveralPhrases) {
-  const bool holds = rc::check([] {
+/// Values of several phrases of up to so many words, asked with texts of up to so many.
+bool holdsForAny(MatchingMode mode, int wordsOfAPhrase, int wordsOfAText) {
+  return rc::check([mode, wordsOfAPhrase, wordsOfAText] {
     Entries entries;
     const auto count = *rc::gen::inRange(0, 12);
     for (int i = 0; i < count; ++i) {
-      entries.emplace_back(*anyRow(4), std::string(1, "VWXYZ"[*rc::gen::inRange(0, 5)]));
+      entries.emplace_back(*anyRow(wordsOfAPhrase),
+                           std::string(1, "VWXYZ"[*rc::gen::inRange(0, 5)]));
     }
-    const Both both(entries);
+    const Both both(entries, mode);
     for (int i = 0; i < 6; ++i) {
-      const auto text = *anyRow(5);
+      const auto text = *anyRow(wordsOfAText);
       const auto options = *anyOptions();
       const auto all = both.expectSame(text, options);
       both.expectBeginnings(text, options, all);
@@ -292,28 +294,13 @@ TEST(FindYardstickTest, ValuesOfSeveralPhrases) {
     }
     RC_ASSERT(!::testing::Test::HasFailure());
   });
-  EXPECT_TRUE(holds);
 }
 
-TEST(FindYardstickTest, WholeTexts) {
-  const bool holds = rc::check([] {
-    Entries entries;
-    const auto count = *rc::gen::inRange(0, 12);
-    for (int i = 0; i < count; ++i) {
-      entries.emplace_back(*anyRow(3), std::string(1, "VWXYZ"[*rc::gen::inRange(0, 5)]));
-    }
-    const Both both(entries, MatchingMode::wholeText);
-    for (int i = 0; i < 6; ++i) {
-      const auto text = *anyRow(3);
-      const auto options = *anyOptions();
-      const auto all = both.expectSame(text, options);
-      both.expectBeginnings(text, options, all);
-      both.expectExplained(text, options, all);
-    }
-    RC_ASSERT(!::testing::Test::HasFailure());
-  });
-  EXPECT_TRUE(holds);
+TEST(FindYardstickTest, ValuesOfSeveralPhrases) {
+  EXPECT_TRUE(holdsForAny(MatchingMode::words, 4, 5));
 }
+
+TEST(FindYardstickTest, WholeTexts) { EXPECT_TRUE(holdsForAny(MatchingMode::wholeText, 3, 3)); }
 
 std::string asUtf8(const std::u16string& text) { return toUtf8(text).value(); }
 
