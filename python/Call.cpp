@@ -66,7 +66,7 @@ py::str Call::text(const std::string& name) const {
   if (!py::isinstance<py::str>(value)) {
     throw py::type_error(name + " is a str, not " + typeName(value));
   }
-  return value;
+  return py::reinterpret_borrow<py::str>(value);
 }
 
 py::kwargs Call::options() const { return _options; }

@@ -76,11 +76,11 @@ static void nothing_found_is_a_result(const wordcatcher_index* index) {
 }
 
 /* How many phrases `index` finds when one option is not its default. */
-#define CHECK_COUNT(text, option, value, expected)   \
-  do {                                               \
-    options = defaults;                              \
-    options.option = (value);                        \
-    CHECK(count(index, text, &options) == expected); \
+#define CHECK_COUNT(text, option, value, expected)     \
+  do {                                                 \
+    options = defaults;                                \
+    options.option = (value);                          \
+    CHECK(count(index, text, &options) == (expected)); \
   } while (0)
 
 /* Each option is taken: changed alone, it changes what is found. */
