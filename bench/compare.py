@@ -1,7 +1,9 @@
 #!/usr/bin/env python3
-"""Runs the drivers in turn, several rounds, and writes bench/results/DATE-compare.md and .svg.
+"""Runs the drivers in turn, several rounds, and writes DATE-compare.md and .svg: to bench/results,
+or to build/compare when it runs some of the works only.
 
-Run by scripts/compare, which builds what this runs and says which works there are.
+Run by scripts/compare, which builds what this runs and says which works there are. What people wrote
+about the figures is in what_limits_it.md.
 """
 
 import json
@@ -14,8 +16,12 @@ from pathlib import Path
 
 import agreement
 import chart
+import machine
+from comparison import Figures
+from limits import what_limits_it
 
-ROUNDS = 3
+WORKS = ("w1", "w2", "w3", "w3-large")
+ROUNDS = int(os.environ.get("ROUNDS", "3"))
 OURS = "wordcatcher"
 FIND = "wordcatcher find"
 ASK = "wordcatcher query"
@@ -29,6 +35,7 @@ ROOT = Path(__file__).resolve().parent.parent
 DRIVERS = ROOT / "build/release/bench"
 COMPARE = ROOT / "build/compare"
 DATA = COMPARE / "data"
+RESULTS = ROOT / "bench/results"
 
 LATENCIES = ("mean", "p50", "p99")
 
@@ -110,7 +117,6 @@ def words_work():
     agreeing, only_plain = agreement.check(files["scan"], files["ours"], {LUCENE: files["lucene"]})
 
     lines = []
-    groups = []
     for k in (1, 2, 3):
         name = f"k{k}"
         others = {SCAN: (scan, name)}
@@ -126,8 +132,6 @@ def words_work():
             row.append(f"{times(outputs, key)} ({number(faster)}×)")
         row.append(times(whole, name))
         lines.append(row)
-        bars = {engine: median(outputs, key, "mean") for engine, (outputs, key) in others.items()}
-        groups.append((f"W1 k={k}", {OURS: median(ours, name, "mean"), **bars}))
 
     text = "## W1: all words within k of a misspelling\n\n"
     text += (
@@ -152,7 +156,7 @@ def words_work():
         f"k={k}: {agreeing[k]:,} found by all, {only_plain[k]:,} by plain engines only"
         for k in (1, 2, 3)
     )
-    return text + ".\n\n", groups
+    return text + ".\n\n"
 
 
 def lines_of(path):
@@ -229,18 +233,19 @@ def phrases_work():
         ["source first", *found(other, "foundFirst")],
         ["source within ten", *found(other, "foundWithinTen")],
     ])
-    bars = {engine: median(outputs, "query", "p50") for engine, outputs in out.items()}
-    return text, [("W2 p50", bars)]
+    return text
 
 
 def made_work(counts):
     """W3: how a query grows with the number of phrases."""
     lines = []
+    turns = {count: min(ROUNDS, max(5_000_000 // count, 1)) for count in counts}
     for count in counts:
         phrases = DATA / f"w3-{count}.txt"
-        turns = range(min(ROUNDS, 5_000_000 // count))
-        runs = [phrase_driver("query_work", "w3", phrases, "numbered") for _ in turns]
-        finds = [phrase_driver("find_work", "w3", phrases, "numbered") for _ in turns]
+        runs, finds = (
+            [phrase_driver(driver, "w3", phrases, "numbered") for _ in range(turns[count])]
+            for driver in ("query_work", "find_work")
+        )
         lines.append([
             f"{count:,}",
             times(runs, "query"),
@@ -255,45 +260,60 @@ def made_work(counts):
     text = "## W3: many phrases\n\n"
     text += (
         "Phrases made of WordNet's words with their frequencies, numbered; the same questions of "
-        "the first million for each.\n\n"
+        "the first million for each. "
+        + "; ".join(f"{count:,} phrases: {in_words(turns[count])}" for count in counts)
+        + ".\n\n"
     )
     text += table(
         ["phrases", "query, µs: mean / p50 / p99", "source found", "find, µs", "phrase within ten", "index", "build, s", "peak memory", "open, ms"],
         lines,
     )
-    return text, []
+    return text
 
 
-def machine():
-    with open("/proc/cpuinfo", encoding="utf-8") as lines:
-        model = next(line.split(":", 1)[1].strip() for line in lines if line.startswith("model name"))
-    return f"{model}, {os.cpu_count()} cores, load {os.getloadavg()[0]:.1f} at the start"
+def in_words(turns):
+    return "one round" if turns == 1 else f"medians of {turns} rounds"
+
+
+def introduction(others):
+    """`others`: the part of the processors' time that other processes took."""
+    text = (
+        f"# Comparison, {date.today()}\n\n{machine.model()}, {os.cpu_count()} cores, of whose time other "
+        f"processes took {100 * others:.0f} % meanwhile. One thread, warm, {in_words(ROUNDS)} in which the "
+        "engines take turns"
+    )
+    text += "" if ROUNDS == 1 else "; ratios are medians of the rounds' ratios"
+    return text + ". Written by scripts/compare.\n\n"
+
+
+def measured(works, name):
+    """The page without its introduction, and its chart, if any."""
+    text = words_work() if "w1" in works else ""
+    text += phrases_work() if "w2" in works else ""
+    drawn = chart.of_page(text) if text else None
+    text += f"![Times of queries]({name}.svg)\n\n" if text else ""
+    counts = [count for work, count in (("w3", 1_000_000), ("w3-large", 5_000_000)) if work in works]
+    text += made_work(counts) if counts else ""
+    if set(works) == set(WORKS):
+        text += what_limits_it(Figures(text))
+    return text, drawn
 
 
 def main(works):
-    counts = [count for work, count in (("w3", 1_000_000), ("w3-large", 5_000_000)) if work in works]
+    unknown = sorted(set(works) - set(WORKS))
+    if unknown:
+        sys.exit(f"There is no work {', '.join(unknown)}; there are {', '.join(WORKS)}.")
     name = f"{date.today()}-compare"
-    text = (
-        f"# Comparison, {date.today()}\n\n{machine()}. One thread, warm, medians of {ROUNDS} rounds in "
-        "which the engines take turns; ratios are medians of the rounds' ratios. Written by "
-        "scripts/compare.\n\n"
-    )
-    groups = []
-    for wanted, work in (("w1" in works, words_work), ("w2" in works, phrases_work)):
-        if wanted:
-            part, bars = work()
-            text += part
-            groups += bars
-    if groups:
-        engines = list(dict.fromkeys(engine for _, bars in groups for engine in bars))
-        drawn = chart.svg("Time of a query, logarithmic (W1: mean, W2: median)", groups, engines)
-        (ROOT / f"bench/results/{name}.svg").write_text(drawn, encoding="utf-8")
-        text += f"![Times of queries]({name}.svg)\n\n"
-    if counts:
-        text += made_work(counts)[0]
-    (ROOT / f"bench/results/{name}.md").write_text(text.rstrip() + "\n", encoding="utf-8")
+    # The results are whole pages.
+    directory = RESULTS if set(works) == set(WORKS) else COMPARE
+    watch = machine.Watch()
+    text, drawn = measured(works, name)
+    text = introduction(watch.others()) + text
+    (directory / f"{name}.md").write_text(text.rstrip() + "\n", encoding="utf-8")
+    if drawn:
+        (directory / f"{name}.svg").write_text(drawn, encoding="utf-8")
     print(text)
 
 
 if __name__ == "__main__":
-    main(sys.argv[1:] or ["w1", "w2", "w3", "w3-large"])
+    main(sys.argv[1:] or WORKS)

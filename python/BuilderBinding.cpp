@@ -2,6 +2,7 @@
 #include <utility>
 
 #include "python/Bindings.h"
+#include "python/Call.h"
 #include "python/Names.h"
 #include "python/Text.h"
 #include "wordcatcher/matcher/IndexBuilder.h"
@@ -105,8 +106,9 @@ Builder makeBuilder(const py::object& path, const std::string& mode, const py::o
   return {pathBytes(path), options};
 }
 
-void add(Builder& builder, const py::str& phrase, const py::object& data) {
-  const std::string bytes = storedUtf8(phrase);
+void add(Builder& builder, const Call& call) {
+  const std::string bytes = storedUtf8(call.text("phrase"));
+  const py::object data = call.get("data", py::ellipsis());
   if (data.is(py::ellipsis())) {
     builder.add(bytes, bytes);
   } else if (data.is_none()) {
@@ -114,7 +116,7 @@ void add(Builder& builder, const py::str& phrase, const py::object& data) {
   } else if (py::isinstance<py::str>(data)) {
     builder.add(bytes, storedUtf8(data));
   } else {
-    throw py::type_error("data is a str or None");
+    throw py::type_error("data is a str or None, not " + typeName(data));
   }
 }
 
@@ -144,7 +146,7 @@ void bindBuilder(py::module_& module) {
            documented("__init__(self, path, mode='words', tables=None)",
                       "Makes a builder; nothing is touched yet.")
                .c_str())
-      .def("add", &add, py::arg("phrase"), py::arg("data") = py::ellipsis(),
+      .def("add", method({"add", {"phrase", "data"}, 1}, &add),
            documented("add($self, phrase, data=...)", kAddDoc).c_str())
       .def("commit", &Builder::commit, documented("commit($self)", kCommitDoc).c_str())
       .def_property_readonly("phrase_count", &Builder::phraseCount,

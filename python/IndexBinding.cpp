@@ -5,8 +5,10 @@
 #include <utility>
 
 #include "python/Bindings.h"
+#include "python/Call.h"
 #include "python/FindMany.h"
 #include "python/Names.h"
+#include "python/Record.h"
 #include "python/Results.h"
 #include "python/Text.h"
 #include "wordcatcher/Error.h"
@@ -91,6 +93,9 @@ constexpr const char* kExplainQueryDoc =
 constexpr const char* kVerifyDoc =
     R"(Checks the whole file. Raises Error (damaged) that names what is wrong.)";
 
+/// The edits that search() allows when it is not told; the command's search verb has the same.
+constexpr std::uint64_t kMaxDistance = 2;
+
 /// Texts of which find_many() holds UTF-8 copies at a time.
 constexpr std::size_t kTextsAtOnce = 16384;
 
@@ -142,10 +147,15 @@ py::tuple pickled(const OpenIndex& self) {
 }
 
 OpenIndex unpickled(const py::tuple& state) {
-  if (state.size() != 5) {
-    throw py::value_error("The pickle is of another version of wordcatcher.");
-  }
+  checkPickle(state, 5);
   return open(state[0], state[1].cast<bool>(), state[2].cast<std::string>(), state[3], state[4]);
+}
+
+/// What pybind11 says of a class without constructor does not tell where its objects come from.
+OpenIndex refuseToMake(const py::args& /*byPlace*/, const py::kwargs& /*byName*/) {
+  throw py::type_error(
+      "An index is opened with wordcatcher.Index.open(path), and built with "
+      "wordcatcher.IndexBuilder(path).");
 }
 
 std::string shown(const OpenIndex& self) {
@@ -166,9 +176,9 @@ std::string valueUtf8(const py::str& value) {
   return utf8;
 }
 
-FindResult find(const OpenIndex& self, const py::str& text, const py::kwargs& arguments) {
-  const FindOptions options = findOptions(arguments, "find");
-  const std::string utf8 = searchedUtf8(text);
+FindResult find(const OpenIndex& self, const Call& call) {
+  const FindOptions options = findOptions(call.options(), "find");
+  const std::string utf8 = searchedUtf8(call.text("text"));
   const py::gil_scoped_release unlocked;
   FindResult result = self.index().find(utf8, options);
   CodePoints(utf8).convert(result);
@@ -180,8 +190,7 @@ std::vector<std::string> nextTexts(py::iterator& texts) {
   std::vector<std::string> utf8;
   for (; utf8.size() < kTextsAtOnce && texts != py::iterator::sentinel(); ++texts) {
     if (!py::isinstance<py::str>(*texts)) {
-      throw py::type_error("texts is an iterable of str, not of " +
-                           std::string(py::str(py::type::of(*texts).attr("__name__"))));
+      throw py::type_error("texts is an iterable of str, not of " + typeName(*texts));
     }
     utf8.push_back(searchedUtf8(py::reinterpret_borrow<py::str>(*texts)));
   }
@@ -201,17 +210,24 @@ std::vector<FindResult> findWithoutLock(const Index& index, const std::vector<st
   return findMany(index, texts, options, threads, &checkSignals);
 }
 
-py::list findAll(const OpenIndex& self, const py::iterable& texts, const py::object& threads,
-                 const py::kwargs& arguments) {
+py::iterator iteratorOf(const py::object& texts) {
   if (py::isinstance<py::str>(texts)) {
     throw py::type_error("texts is one str; use find(), or give a list");
   }
-  const FindOptions options = findOptions(arguments, "find_many");
+  if (!py::isinstance<py::iterable>(texts)) {
+    throw py::type_error("texts is an iterable of str, not " + typeName(texts));
+  }
+  return py::iter(texts);
+}
+
+py::list findAll(const OpenIndex& self, const Call& call) {
+  py::iterator rest = iteratorOf(call.get("texts", py::none()));
+  const py::object threads = call.get("threads", py::none());
+  const FindOptions options = findOptions(call.options(), "find_many");
   const std::size_t threadCount = threads.is_none()
                                       ? std::max(std::thread::hardware_concurrency(), 1U)
                                       : count(threads, "threads", 1);
   py::list results;
-  py::iterator rest = py::iter(texts);
   for (auto some = nextTexts(rest); !some.empty(); some = nextTexts(rest)) {
     for (auto& result : findWithoutLock(self.index(), some, options, threadCount)) {
       results.append(py::cast(std::move(result)));
@@ -220,35 +236,34 @@ py::list findAll(const OpenIndex& self, const py::iterable& texts, const py::obj
   return results;
 }
 
-Index::QueryResult query(const OpenIndex& self, const py::str& text) {
-  const std::string utf8 = searchedUtf8(text);
+Index::QueryResult query(const OpenIndex& self, const Call& call) {
+  const std::string utf8 = searchedUtf8(call.text("text"));
   const py::gil_scoped_release unlocked;
   return self.index().query(utf8);
 }
 
-Index::SearchResult search(const OpenIndex& self, const py::str& word,
-                           const py::object& maxDistance) {
+Index::SearchResult search(const OpenIndex& self, const Call& call) {
   constexpr std::uint64_t kTooMuch = 1000;
+  const py::object maxDistance = call.get("max_distance", py::int_(kMaxDistance));
   const auto distance = std::min(count(maxDistance, "max_distance"), kTooMuch);
-  const std::string utf8 = storedUtf8(word);
+  const std::string utf8 = storedUtf8(call.text("word"));
   const py::gil_scoped_release unlocked;
   return self.index().search(utf8, static_cast<std::int64_t>(distance));
 }
 
-FindExplanation explain(const OpenIndex& self, const py::str& text, const py::str& value,
-                        const py::kwargs& arguments) {
-  const FindOptions options = findOptions(arguments, "explain");
-  const std::string textBytes = searchedUtf8(text);
-  const std::string valueBytes = valueUtf8(value);
+FindExplanation explain(const OpenIndex& self, const Call& call) {
+  const FindOptions options = findOptions(call.options(), "explain");
+  const std::string textBytes = searchedUtf8(call.text("text"));
+  const std::string valueBytes = valueUtf8(call.text("value"));
   const py::gil_scoped_release unlocked;
   FindExplanation explanation = self.index().explain(textBytes, valueBytes, options);
   CodePoints(textBytes).convert(explanation);
   return explanation;
 }
 
-QueryExplanation explainQuery(const OpenIndex& self, const py::str& text, const py::str& value) {
-  const std::string textBytes = searchedUtf8(text);
-  const std::string valueBytes = valueUtf8(value);
+QueryExplanation explainQuery(const OpenIndex& self, const Call& call) {
+  const std::string textBytes = searchedUtf8(call.text("text"));
+  const std::string valueBytes = valueUtf8(call.text("value"));
   const py::gil_scoped_release unlocked;
   return self.index().explainQuery(textBytes, valueBytes);
 }
@@ -271,20 +286,23 @@ void defineOpen(py::class_<OpenIndex>& type) {
 
 void defineFind(py::class_<OpenIndex>& type) {
   const std::string options = findSignature();
-  type.def("find", &find, py::arg("text"),
+  type.def("find", method({"find", {"text"}, 1, true}, &find),
            documented("find($self, text, *, " + options + ")", kFindDoc).c_str());
-  type.def("find_many", &findAll, py::arg("texts"), py::arg("threads") = py::none(),
+  type.def("find_many", method({"find_many", {"texts", "threads"}, 1, true}, &findAll),
            documented("find_many($self, texts, threads=None, *, " + options + ")", kFindManyDoc)
                .c_str());
-  type.def("explain", &explain, py::arg("text"), py::arg("value"),
+  type.def("explain", method({"explain", {"text", "value"}, 2, true}, &explain),
            documented("explain($self, text, value, *, " + options + ")", kExplainDoc).c_str());
 }
 
 void defineQuery(py::class_<OpenIndex>& type) {
-  type.def("query", &query, py::arg("text"), documented("query($self, text)", kQueryDoc).c_str());
-  type.def("search", &search, py::arg("word"), py::arg("max_distance"),
-           documented("search($self, word, max_distance)", kSearchDoc).c_str());
-  type.def("explain_query", &explainQuery, py::arg("text"), py::arg("value"),
+  type.def("query", method({"query", {"text"}, 1}, &query),
+           documented("query($self, text)", kQueryDoc).c_str());
+  const std::string searchSignature =
+      "search($self, word, max_distance=" + std::to_string(kMaxDistance) + ")";
+  type.def("search", method({"search", {"word", "max_distance"}, 1}, &search),
+           documented(searchSignature, kSearchDoc).c_str());
+  type.def("explain_query", method({"explain_query", {"text", "value"}, 2}, &explainQuery),
            documented("explain_query($self, text, value)", kExplainQueryDoc).c_str());
 }
 
@@ -292,6 +310,8 @@ void defineQuery(py::class_<OpenIndex>& type) {
 
 void bindIndex(py::module_& module) {
   py::class_<OpenIndex> type(module, "Index", py::is_final(), kIndexDoc);
+  // Without a signature, which help() would show as if an index could be made so.
+  type.def(py::init(&refuseToMake), "Raises TypeError: use Index.open(path).");
   defineOpen(type);
   defineFind(type);
   defineQuery(type);

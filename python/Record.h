@@ -60,6 +60,9 @@ void fromPython(py::handle object, std::vector<Item>& items) {
   }
 }
 
+/// Throws ValueError when the state of a pickle is not of so many parts.
+void checkPickle(const py::tuple& state, std::size_t parts);
+
 template <typename Struct, typename Value>
 struct Field {
   const char* name;
@@ -101,9 +104,7 @@ py::class_<Struct> bindRecord(py::module_& module, const char* name, const char*
   });
   type.def("__hash__", [values](const Struct& self) { return py::hash(values(self)); });
   type.def(py::pickle(values, [fields...](const py::tuple& state) {
-    if (state.size() != sizeof...(Values)) {
-      throw py::value_error("The pickle is of another version of wordcatcher.");
-    }
+    checkPickle(state, sizeof...(Values));
     Struct value{};
     std::size_t at = 0;
     (fromPython(state[at++], value.*fields.member), ...);

@@ -3,6 +3,7 @@
 #include "python/Bindings.h"
 #include "python/Record.h"
 #include "python/Text.h"
+#include "wordcatcher/Version.h"
 #include "wordcatcher/matcher/Find.h"
 
 namespace wordcatcher::python {
@@ -220,6 +221,14 @@ void bindInfo(py::module_& module) {
 }
 
 }  // namespace
+
+void checkPickle(const py::tuple& state, std::size_t parts) {
+  if (state.size() != parts) {
+    throw py::value_error("The pickle was written by another version of wordcatcher than " +
+                          std::string(versionString) +
+                          ", which runs here; load it with that one, or make it anew with this.");
+  }
+}
 
 void bindResults(py::module_& module) {
   bindLimits(module);

@@ -23,7 +23,8 @@ struct Solution {
   std::vector<Pair> pairs;
 };
 
-Solution solve(Pairing& pairing, const Options& options, std::uint64_t steps = kManySteps) {
+/// Takes the steps that it needs off `steps`.
+Solution solveWithin(std::uint64_t& steps, Pairing& pairing, const Options& options) {
   pairing.start();
   for (const auto& ofWord : options) {
     pairing.nextWord();
@@ -33,6 +34,11 @@ Solution solve(Pairing& pairing, const Options& options, std::uint64_t steps = k
   }
   const PairingScore score = pairing.solve(steps);
   return {score, {pairing.pairs().begin(), pairing.pairs().end()}};
+}
+
+Solution solve(Pairing& pairing, const Options& options) {
+  std::uint64_t steps = kManySteps;
+  return solveWithin(steps, pairing, options);
 }
 
 /// What the header says of a pairing.
@@ -245,20 +251,13 @@ TEST(PairingTest, ABudgetBoundsTheWork) {
   for (const std::uint64_t budget : {0U, 1U, 10U, 600U, 1000U, 100000U}) {
     Pairing pairing(kTextWords);
     std::uint64_t steps = budget;
-    pairing.start();
-    for (const auto& ofWord : options) {
-      pairing.nextWord();
-      for (const auto& option : ofWord) {
-        pairing.add(option);
-      }
-    }
-    const PairingScore score = pairing.solve(steps);
+    const Solution found = solveWithin(steps, pairing, options);
     EXPECT_LE(steps, budget);
-    expectOneToOne({score, {pairing.pairs().begin(), pairing.pairs().end()}}, kTextWords);
+    expectOneToOne(found, kTextWords);
     EXPECT_FALSE(pairing.isExact());
     EXPECT_EQ(steps, 0U);
     if (budget >= 600) {
-      EXPECT_EQ(score.words, 12U) << "the best so far";
+      EXPECT_EQ(found.score.words, 12U) << "the best so far";
     }
   }
 }

@@ -81,25 +81,6 @@ def test_exceptions_of_a_worker(image: Path, tmp_path: Path, threads: int) -> No
     assert damages > 0
 
 
-def test_other_threads_run_meanwhile(index: Index) -> None:
-    turns = 0
-    done = threading.Event()
-
-    def count() -> None:
-        nonlocal turns
-        while not done.wait(0.001):
-            turns += 1
-
-    thread = threading.Thread(target=count)
-    thread.start()
-    try:
-        while turns < 3:
-            index.find_many(TEXTS * 1000, threads=2)
-    finally:
-        done.set()
-        thread.join()
-
-
 def test_several_python_threads_share_an_index(index: Index) -> None:
     expected = [index.find(text) for text in TEXTS]
     wrong = []

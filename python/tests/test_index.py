@@ -109,7 +109,9 @@ def test_whole_texts(tmp_path: Path) -> None:
 
 
 def test_search(index: Index) -> None:
-    (match,) = index.search("guinnea", 1)
+    assert values(index.search("guinnnea")) == values(index.search("guinnnea", 2)) == ["guinea"]
+    assert values(index.search("guinnnnea")) == []
+    (match,) = index.search(word="guinnea", max_distance=1)
     assert (match.value, match.distance) == ("guinea", 1)
     assert match.data == ("Guinea-Bissau", "Papua New Guinea")
     for distance in (17, 10**15):
@@ -218,6 +220,19 @@ def test_results_can_be_pickled_copied_and_matched(index: Index) -> None:
             pytest.fail(f"no words are matched by {other}")
 
 
+def test_names_are_those_of_the_package(index: Index) -> None:
+    """Not of the compiled module, which nobody imports."""
+    shown = [repr(index), repr(Index), repr(EditLimits), repr(index.find("tobbago"))]
+    for wrong in (lambda: IndexBuilder(), lambda: Index.open(), lambda: index.info(3)):
+        with pytest.raises(TypeError) as failure:
+            wrong()
+        shown.append(str(failure.value))
+        assert "wordcatcher.Index" in shown[-1]
+    for pickled in (index, index.find("tobbago"), index.info(), EditLimits()):
+        shown.append(repr(pickle.dumps(pickled)))
+    assert [text for text in shown if "_wordcatcher" in text] == []
+
+
 def test_info(index: Index, image: Path) -> None:
     info = index.info()
     assert (info.mode, info.phrases, info.words, info.values) == ("words", 5, 10, 5)
@@ -282,15 +297,46 @@ def test_an_error_of_a_path_that_is_not_utf8_has_its_sentence(tmp_path: Path) ->
 
 
 def test_wrong_arguments(index: Index, image: Path) -> None:
-    with pytest.raises(TypeError):
-        index.find(b"tobago")  # type: ignore[arg-type]
-    with pytest.raises(TypeError):
-        index.find("tobago", 3)  # type: ignore[misc]
     with pytest.raises(ValueError, match="mode is one of"):
         Index.open(image, mode="letters")  # type: ignore[arg-type]
     with pytest.raises(ValueError, match="max_query_words"):
         Index.open(image, max_query_words=-1)
     with pytest.raises(TypeError):
-        Index()
-    with pytest.raises(TypeError):
         type("Mine", (Index,), {})
+
+
+@pytest.mark.parametrize(
+    ("call", "sentence"),
+    [
+        ('Index("names.wci")', "opened with wordcatcher.Index.open(path)"),
+        ("Index()", "opened with wordcatcher.Index.open(path)"),
+        ("index.find(3)", "text is a str, not int"),
+        ('index.find(b"tobago")', "text is a str, not bytes"),
+        ("index.find()", "find(text, *, ...) lacks its argument text"),
+        ("index.find(limit=3)", "find(text, *, ...) lacks its argument text"),
+        ('index.find("tobago", 3)', "takes 1 argument by place, not 2; give options by name"),
+        ('index.find("tobago", text="trinidad")', "find(text, *, ...) is given text twice"),
+        ("index.find_many(3)", "texts is an iterable of str, not int"),
+        ('index.find_many(["tobago"], 2, 3)', "takes 2 arguments by place, not 3"),
+        ('index.explain("tobago")', "explain(text, value, *, ...) lacks its argument value"),
+        ("index.query(None)", "text is a str, not NoneType"),
+        ('index.query("tobago", limit=3)', "unexpected keyword argument 'limit'"),
+        ('index.search("tobago", "2")', "max_distance is an int"),
+        ("index.search(3)", "word is a str, not int"),
+        ('index.explain_query("tobago", 3)', "value is a str, not int"),
+        ('IndexBuilder("new.wci").add(3)', "phrase is a str, not int"),
+        ('IndexBuilder("new.wci").add("tobago", 3)', "data is a str or None, not int"),
+    ],
+)
+def test_a_wrong_call_is_told_in_one_sentence(index: Index, call: str, sentence: str) -> None:
+    with pytest.raises(TypeError) as failure:
+        eval(call, {"index": index, "Index": Index, "IndexBuilder": IndexBuilder})
+    assert sentence in str(failure.value)
+    assert "\n" not in str(failure.value)
+
+
+def test_a_pickle_of_another_version_says_what_to_do(index: Index) -> None:
+    for kept in (index, index.find("tobbago"), EditLimits()):
+        other = type(kept).__new__(type(kept))
+        with pytest.raises(ValueError, match=rf"than {wordcatcher.__version__}.*make it anew"):
+            other.__setstate__(("one", "of", "another", "version"))

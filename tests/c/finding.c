@@ -75,55 +75,42 @@ static void nothing_found_is_a_result(const wordcatcher_index* index) {
   wordcatcher_findings_free(findings);
 }
 
+/* How many phrases `index` finds when one option is not its default. */
+#define CHECK_COUNT(text, option, value, expected)     \
+  do {                                                 \
+    options = defaults;                                \
+    options.option = (value);                          \
+    CHECK(count(index, text, &options) == (expected)); \
+  } while (0)
+
 /* Each option is taken: changed alone, it changes what is found. */
 static void every_option_counts(const wordcatcher_index* index) {
   wordcatcher_find_options defaults;
   wordcatcher_find_options_init(&defaults, sizeof defaults);
-  wordcatcher_find_options options = defaults;
+  wordcatcher_find_options options;
   const char* const two = "new zealand and papua new guinea";
   const size_t all = count(index, two, &defaults);
   CHECK(all >= 2);
   CHECK(count(index, two, NULL) == all);
+  CHECK_COUNT(two, limit, 1, 1);
+  CHECK_COUNT(two, max_cost, 0, 0);
+  CHECK_COUNT("New Zealand", max_cost, 0, 1);
+  CHECK_COUNT(two, min_words, 3, 1);
 
-  options.limit = 1;
-  CHECK(count(index, two, &options) == 1);
-
-  options = defaults;
-  options.max_cost = 0;
-  CHECK(count(index, two, &options) == 0);
-  CHECK(count(index, "New Zealand", &options) == 1);
-
-  options = defaults;
-  options.min_words = 3;
-  CHECK(count(index, two, &options) == 1);
-
-  options = defaults;
   CHECK(count(index, "nex", &defaults) == 2);
-  options.medium_edits = 0;
-  CHECK(count(index, "nex", &options) == 0);
-  options = defaults;
-  options.short_length = 3;
-  CHECK(count(index, "nex", &options) == 0);
+  CHECK_COUNT("nex", medium_edits, 0, 0);
+  CHECK_COUNT("nex", short_length, 3, 0);
   options.short_edits = 1;
   CHECK(count(index, "nex", &options) == 2);
 
-  options = defaults;
   CHECK(count(index, "zaelend", &defaults) == 1);
-  options.transpositions = 0;
-  CHECK(count(index, "zaelend", &options) == 0);
-  options = defaults;
-  options.long_edits = 1;
-  CHECK(count(index, "zaelend", &options) == 0);
-  options = defaults;
-  options.medium_length = 7;
-  CHECK(count(index, "zaelend", &options) == 0);
+  CHECK_COUNT("zaelend", transpositions, 0, 0);
+  CHECK_COUNT("zaelend", long_edits, 1, 0);
+  CHECK_COUNT("zaelend", medium_length, 7, 0);
 
-  options = defaults;
-  options.overlaps = WORDCATCHER_OVERLAPS_NO_SUB;
   CHECK(count(index, "papua new guinea", &defaults) == 2);
-  CHECK(count(index, "papua new guinea", &options) == 1);
-  options.overlaps = WORDCATCHER_OVERLAPS_LONGEST;
-  CHECK(count(index, "papua new guinea", &options) == 1);
+  CHECK_COUNT("papua new guinea", overlaps, WORDCATCHER_OVERLAPS_NO_SUB, 1);
+  CHECK_COUNT("papua new guinea", overlaps, WORDCATCHER_OVERLAPS_LONGEST, 1);
 
   options = defaults;
   options.max_postings = 1;

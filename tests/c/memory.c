@@ -12,12 +12,17 @@ struct scene {
 
 typedef wordcatcher_code (*attempt)(struct scene* scene, wordcatcher_error* error);
 
-static wordcatcher_code attempt_open(struct scene* scene, wordcatcher_error* error) {
-  (void)scene;
+static wordcatcher_code open_places(const wordcatcher_open_options* options,
+                                    wordcatcher_error* error) {
   wordcatcher_index* index = NULL;
-  const wordcatcher_code code = wordcatcher_index_open(file("places.wci"), NULL, &index, error);
+  const wordcatcher_code code = wordcatcher_index_open(file("places.wci"), options, &index, error);
   wordcatcher_index_close(index);
   return code;
+}
+
+static wordcatcher_code attempt_open(struct scene* scene, wordcatcher_error* error) {
+  (void)scene;
+  return open_places(NULL, error);
 }
 
 static wordcatcher_code attempt_copy(struct scene* scene, wordcatcher_error* error) {
@@ -25,10 +30,7 @@ static wordcatcher_code attempt_copy(struct scene* scene, wordcatcher_error* err
   wordcatcher_open_options options;
   wordcatcher_open_options_init(&options, sizeof options);
   options.load = WORDCATCHER_LOAD_COPY;
-  wordcatcher_index* index = NULL;
-  const wordcatcher_code code = wordcatcher_index_open(file("places.wci"), &options, &index, error);
-  wordcatcher_index_close(index);
-  return code;
+  return open_places(&options, error);
 }
 
 static wordcatcher_code attempt_info(struct scene* scene, wordcatcher_error* error) {

@@ -1,0 +1,96 @@
+#ifndef WORDCATCHER_BENCH_PHRASEWORK_H
+#define WORDCATCHER_BENCH_PHRASEWORK_H
+
+#include <algorithm>
+#include <cstddef>
+#include <nlohmann/json.hpp>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+#include "WorkFiles.h"
+#include "wordcatcher/matcher/Index.h"
+
+namespace wordcatcher::bench {
+
+/// What the drivers do that ask misspelled phrases of an index of phrases. Their arguments are
+///
+///     PHRASES QUERIES INDEX plain|numbered
+///
+/// The data string of a phrase is itself; "numbered" adds its number, so that phrases that repeat
+/// are records of their own.
+class PhraseWork {
+ public:
+  explicit PhraseWork(const std::vector<std::string>& arguments);
+
+  /// Writes the index: its size, the seconds that it took, and the peak memory before and after.
+  void build();
+
+  /// Opens it, and tells the seconds.
+  Index open();
+
+  /// Asks every question once to see what is found: first, within ten, or at all, where
+  /// `isSource(question, value)` tells whether a value is what the question was made of; and how
+  /// many answers were cut short. Then asks it all again, warm, and tells the latency of an answer
+  /// with its release, in microseconds. `ask(text)` gives an answer with `matches` and `truncated`.
+  template <typename Ask, typename IsSource>
+  void ask(Ask ask, IsSource isSource);
+
+  const std::string& phrase(std::size_t number) const { return _phrases[number]; }
+
+  std::string dataOf(std::size_t number) const {
+    return _numbered ? _phrases[number] + "{ " + std::to_string(number) + " }" : _phrases[number];
+  }
+
+  /// What was told so far.
+  nlohmann::json result;
+
+ private:
+  std::vector<std::string> _phrases;
+  std::vector<Question> _questions;
+  std::string _path;
+  bool _numbered;
+};
+
+template <typename Ask, typename IsSource>
+void PhraseWork::ask(Ask ask, IsSource isSource) {
+  constexpr std::size_t kShown = 10;
+  std::size_t found = 0;
+  std::size_t first = 0;
+  std::size_t withinTen = 0;
+  std::size_t matchCount = 0;
+  std::size_t truncated = 0;
+  for (const auto& question : _questions) {
+    const auto answer = ask(question.text);
+    const auto& matches = answer.matches;
+    const auto source = std::find_if(matches.begin(), matches.end(), [&](const auto& match) {
+      return isSource(question, std::string_view(match.value));
+    });
+    const auto place = static_cast<std::size_t>(source - matches.begin());
+    const bool isThere = source != matches.end();
+    found += isThere ? 1 : 0;
+    first += isThere && place == 0 ? 1 : 0;
+    withinTen += isThere && place < kShown ? 1 : 0;
+    matchCount += matches.size();
+    truncated += answer.truncated ? 1 : 0;
+  }
+  std::vector<double> seconds;
+  for (const auto& question : _questions) {
+    const Stopwatch watch;
+    ask(question.text);
+    seconds.push_back(watch.seconds());
+  }
+  result["query"] = latency(std::move(seconds));
+  result["questions"] = _questions.size();
+  result["found"] = found;
+  result["foundFirst"] = first;
+  result["foundWithinTen"] = withinTen;
+  result["matches"] = matchCount;
+  result["truncated"] = truncated;
+  result["peakBytes"] = peakMemory();
+}
+
+}  // namespace wordcatcher::bench
+
+#endif
