@@ -215,6 +215,17 @@ TEST(FindOrderTest, ThePhraseThatTheEditsMakeComesFirst) {
   }
 }
 
+TEST(FindOrderTest, WordsInOrderComeBeforeWordsOutOfOrder) {
+  const auto index = indexOfPhrases({"Keuka Lake", "Lake Keuka", "Lake of Keuka"});
+  // By value, and by length, the others would come first.
+  EXPECT_EQ(valuesOf(index.find("keuka our lake")),
+            (Values{"Keuka Lake", "Lake Keuka", "Lake of Keuka"}));
+  EXPECT_EQ(valuesOf(index.find("lake our keuka")),
+            (Values{"Lake Keuka", "Keuka Lake", "Lake of Keuka"}));
+  EXPECT_EQ(valuesOf(index.find("lake keuka")),
+            (Values{"Lake Keuka", "Keuka Lake", "Lake of Keuka"}));
+}
+
 TEST(FindOrderTest, TheFirstLetterIsAsAnyOther) {
   const auto index = indexOfPhrases({"Liechtenstein", "Switzerland"});
   for (const std::string text :

@@ -319,7 +319,7 @@ void PhraseFinder::addSegments(std::uint32_t number, std::vector<Segment>& segme
 /// By their bounds; of those with the same bound, the ones of rarer words first.
 std::vector<PhraseFinder::Segment> PhraseFinder::segments() const {
   std::vector<Segment> segments;
-  segments.reserve(2 * _sources.size());
+  segments.reserve(_sources.size());
   for (std::uint32_t source = 0; source < _sources.size(); ++source) {
     addSegments(source, segments);
   }
