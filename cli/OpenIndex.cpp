@@ -7,6 +7,7 @@
 #include "cli/Failure.h"
 #include "cli/IndexDirectory.h"
 #include "cli/Modes.h"
+#include "cli/ProgressBar.h"
 #include "cli/TableLog.h"
 #include "cli/WaitingNote.h"
 
@@ -50,11 +51,13 @@ Index openIndex(const std::string& name, std::optional<MatchingMode> mode, bool 
 
 void noteTruncated() {
   const Index::Options limits;
-  std::cerr << "wordcatcher: a text was not looked at in full, being beyond the limits of " +
-                   std::to_string(limits.maxQueryWords) + " words and " +
-                   std::to_string(limits.maxWordUnits) +
-                   " letters a word: give it in shorter pieces.\n"
-            << std::flush;
+  std::cerr
+      << ProgressBar::lineStart() +
+             std::string(
+                 "wordcatcher: a text was not looked at in full, being beyond the limits of ") +
+             std::to_string(limits.maxQueryWords) + " words and " +
+             std::to_string(limits.maxWordUnits) + " letters a word: give it in shorter pieces.\n"
+      << std::flush;
 }
 
 }  // namespace wordcatcher::cli
