@@ -55,6 +55,7 @@ auto waitedFor(const Explain& explain) {
 }
 
 ExitCode runExplain(const Arguments& arguments) {
+  checkIndexComesFirst(arguments.index, {arguments.text, arguments.value});
   const Index index = openIndex(arguments.index, arguments.mode, arguments.verbose);
   return arguments.query
              ? print(waitedFor([&] { return index.explainQuery(arguments.text, arguments.value); }),

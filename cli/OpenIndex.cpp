@@ -1,7 +1,10 @@
 #include "cli/OpenIndex.h"
 
 #include <sys/stat.h>
+#include <unistd.h>
 
+#include <algorithm>
+#include <exception>
 #include <iostream>
 
 #include "cli/Failure.h"
@@ -22,6 +25,23 @@ Index openTables(const std::string& name, MatchingMode mode, bool verbose) {
   std::optional<Index> index;
   directory.openForReading(log, [&] { index = Index::open(directory.path(), {}, mode); });
   return *index;
+}
+
+bool isIndex(const std::string& name) {
+  struct stat status {};
+  if (stat(name.c_str(), &status) != 0) {
+    return false;
+  }
+  try {
+    if (S_ISDIR(status.st_mode)) {
+      IndexDirectory(name).tableBytes();
+    } else {
+      Index::open(name);
+    }
+    return true;
+  } catch (const std::exception&) {
+    return false;
+  }
 }
 
 Index openImage(const std::string& name, std::optional<MatchingMode> mode) {
@@ -47,6 +67,17 @@ Index openIndex(const std::string& name, std::optional<MatchingMode> mode, bool 
   }
   return namesDirectory(name) ? openTables(name, mode.value_or(kDefaultMode), verbose)
                               : openImage(name, mode);
+}
+
+void checkIndexComesFirst(const std::string& name, const std::vector<std::string>& others) {
+  if (access(name.c_str(), F_OK) == 0) {
+    return;
+  }
+  const auto index = std::find_if(others.begin(), others.end(), isIndex);
+  if (index != others.end()) {
+    throw Failure("There is no index at " + inQuotes(name) + ", but " + inQuotes(*index) +
+                  " is one: give the INDEX first.");
+  }
 }
 
 void noteTruncated() {

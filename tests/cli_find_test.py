@@ -186,6 +186,9 @@ class FindTest(TerminalTest):
         self.fail_with("--threads", "1 to 64", of=[*find, "--threads", "0"])
         self.fail_with("no-sub", of=[*find, "--overlaps", "some"])
         self.fail_with("--highlight", of=[*find, "--highlight", "--json"])
+        self.fail_with("--json excludes --color always",
+                       of=[*find, "--json", "--color", "always"])
+        self.succeed(*find, "--json", "--color", "never")
         self.fail_with("wordcatcher find --help", of=["find"])
 
     def test_mode_of_an_image_is_remembered(self):
