@@ -29,11 +29,11 @@ constexpr unsigned kThreads = 8;
 class Redirected {
  public:
   Redirected(int stream, int file) : _stream(stream), _kept(dup(stream)) {
-    fflush(nullptr);
+    static_cast<void>(fflush(nullptr));
     dup2(file, stream);
   }
   ~Redirected() {
-    fflush(nullptr);
+    static_cast<void>(fflush(nullptr));
     dup2(_kept, _stream);
     close(_kept);
   }
@@ -104,9 +104,10 @@ std::string printedBy(const Work& work) {
   return testing::readFile(path);
 }
 
-std::vector<std::string> numbered(int count) {
+std::vector<std::string> numbered(std::size_t count) {
   std::vector<std::string> texts;
-  for (int i = 0; i < count; ++i) {
+  texts.reserve(count);
+  for (std::size_t i = 0; i < count; ++i) {
     texts.push_back("text " + std::to_string(i));
   }
   return texts;
