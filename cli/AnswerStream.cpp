@@ -19,10 +19,10 @@
 #include <thread>
 #include <utility>
 
+#include "cli/AnswerProgress.h"
 #include "cli/InputLines.h"
 #include "cli/Output.h"
 #include "cli/ProgressBar.h"
-#include "cli/ReadingBar.h"
 
 namespace wordcatcher::cli {
 
@@ -62,7 +62,6 @@ class Texts {
   Texts(const std::vector<std::string>& texts, int stop) : _texts(texts) {
     if (texts.empty()) {
       _lines.emplace("-", stop);
-      _progress.emplace(*_lines);
     }
   }
 
@@ -70,15 +69,15 @@ class Texts {
     if (!_lines) {
       return _taken < _texts.size() ? std::optional(_texts[_taken++]) : std::nullopt;
     }
-    _progress->show();
     return _lines->nextBytes();
   }
+
+  const InputLines* lines() const { return _lines ? &*_lines : nullptr; }
 
  private:
   const std::vector<std::string>& _texts;
   std::size_t _taken = 0;
   std::optional<InputLines> _lines;
-  std::optional<ReadingBar> _progress;
 };
 
 class AnswerStream {
@@ -136,6 +135,7 @@ class AnswerStream {
     }
     Taken taken{_taken, {}, nullptr};
     try {
+      _progress.took();
       auto text = _texts.next();
       if (!text) {
         _ended = true;
@@ -148,6 +148,8 @@ class AnswerStream {
     }
     const std::lock_guard lock(_state);
     ++_taken;
+    ++_inWork;
+    _progress.begin();
     _bytes += taken.text.size();
     return taken;
   }
@@ -170,6 +172,7 @@ class AnswerStream {
 
   void handIn(std::uint64_t number, Answered answered) {
     const std::lock_guard lock(_state);
+    --_inWork;
     _bytes += answered.answer.output.size();
     _waiting.emplace(number, std::move(answered));
     while (!_stopped && !_waiting.empty() && _waiting.begin()->first == _written) {
@@ -180,6 +183,11 @@ class AnswerStream {
       _bytes -= _waiting.begin()->second.bytes();
       _waiting.erase(_waiting.begin());
       ++_written;
+    }
+    if (_inWork > 0) {
+      _progress.begin();
+    } else {
+      _progress.pause();
     }
     _room.notify_all();
   }
@@ -211,6 +219,7 @@ class AnswerStream {
   // Held while a text is being waited for and read.
   std::mutex _reading;
   Texts _texts;
+  AnswerProgress _progress{_texts.lines()};
   bool _ended = false;
 
   const AnswerText& _answer;
@@ -221,9 +230,10 @@ class AnswerStream {
   std::condition_variable _room;
   std::uint64_t _taken = 0;    // texts; changes only while _reading is held as well
   std::uint64_t _written = 0;  // answers
+  std::uint64_t _inWork = 0;   // texts that are being answered
   std::size_t _bytes = 0;      // of the texts between the two and of their answers
   std::map<std::uint64_t, Answered> _waiting;
-  Output _output;
+  Output _output{[this] { _progress.pause(); }};
   bool _matched = false;
   bool _stopped = false;
   std::exception_ptr _failure;

@@ -17,21 +17,28 @@ std::string unshielded(const std::string& argument) {
   return argument.starts_with(kShield) ? argument.substr(1) : argument;
 }
 
+void addRepeated(CLI::App& verb, const std::string& name, const CLI::callback_t& take,
+                 const std::string& description) {
+  verb.add_option(name, take, description)
+      ->expected(0, CLI::detail::expected_max_vector_size)
+      ->allow_extra_args()
+      ->type_name("");
+}
+
 }  // namespace
 
-std::vector<std::string> shieldedArguments(int argc, char** argv) {
-  std::vector<std::string> arguments;
+std::vector<std::string> shieldedArguments(const std::vector<std::string>& arguments) {
+  std::vector<std::string> shielded;
   bool optionsEnded = false;
-  for (int i = 1; i < argc; ++i) {
-    const std::string argument = argv[i];
+  for (const auto& argument : arguments) {
     if (argument == "--" && !optionsEnded) {
       optionsEnded = true;
     } else {
-      arguments.push_back(optionsEnded || needsShield(argument) ? kShield + argument : argument);
+      shielded.push_back(optionsEnded || needsShield(argument) ? kShield + argument : argument);
     }
   }
-  std::reverse(arguments.begin(), arguments.end());
-  return arguments;
+  std::reverse(shielded.begin(), shielded.end());
+  return shielded;
 }
 
 void addArgument(CLI::App& verb, const std::string& name, std::string& value,
@@ -71,10 +78,22 @@ void addArguments(CLI::App& verb, const std::string& name, std::vector<std::stri
     }
     return true;
   };
-  verb.add_option(name, take, description)
-      ->expected(0, CLI::detail::expected_max_vector_size)
-      ->allow_extra_args()
-      ->type_name("");
+  addRepeated(verb, name, take, description);
+}
+
+void addTexts(CLI::App& verb, const std::string& name, std::vector<std::string>& values,
+              const std::string& what) {
+  const auto take = [&values](const CLI::results_t& results) {
+    // Behind "--" it has a shield, and is a text like any other.
+    if (results != CLI::results_t{"-"}) {
+      for (const auto& result : results) {
+        values.push_back(unshielded(result));
+      }
+    }
+    return true;
+  };
+  addRepeated(verb, name, take,
+              what + "; without any, or with \"-\" alone, the lines of standard input");
 }
 
 }  // namespace wordcatcher::cli

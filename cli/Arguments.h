@@ -15,7 +15,7 @@ namespace wordcatcher::cli {
 /// takes "[a, b]" for a list of arguments, and "--" for the end of the verb's own arguments.
 /// Neither suits texts, so that texts in brackets and everything after "--" go in with a mark in
 /// front.
-std::vector<std::string> shieldedArguments(int argc, char** argv);
+std::vector<std::string> shieldedArguments(const std::vector<std::string>& arguments);
 
 /// Adds a required positional argument whose value arrives as the user wrote it.
 void addArgument(CLI::App& verb, const std::string& name, std::string& value,
@@ -32,6 +32,11 @@ void addNumber(CLI::App& verb, const std::string& name, std::int64_t& value, std
 /// Adds a positional argument that may be repeated or left out.
 void addArguments(CLI::App& verb, const std::string& name, std::vector<std::string>& values,
                   const std::string& description);
+
+/// Adds the texts that a verb answers: none, or "-" alone, are the lines of standard input, and
+/// leave `values` empty. `what` names them: Texts
+void addTexts(CLI::App& verb, const std::string& name, std::vector<std::string>& values,
+              const std::string& what);
 
 }  // namespace wordcatcher::cli
 

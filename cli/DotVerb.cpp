@@ -10,6 +10,7 @@
 #include "cli/Counted.h"
 #include "cli/Failure.h"
 #include "cli/Graph.h"
+#include "cli/OpenIndex.h"
 #include "cli/Output.h"
 #include "cli/Verbs.h"
 #include "cli/WordTree.h"
@@ -162,6 +163,7 @@ void drawBelow(Graph& graph, std::size_t node, const WordTree& tree) {
 }
 
 ExitCode runTree(const Arguments& arguments) {
+  checkIndexComesFirst(arguments.index, {arguments.prefix});
   const auto prefix = decoded(arguments.prefix, "PREFIX");
   const WordTree tree =
       wordTreeOf(*openWords(arguments.index, arguments.verbose), prefix, kMostWords);

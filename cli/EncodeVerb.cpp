@@ -66,7 +66,7 @@ void addEncodeVerb(CLI::App& program, ChosenVerb& chosen) {
   auto* const verb = program.add_subcommand("encode", "Print the codes of how words sound");
   const auto arguments = std::make_shared<Arguments>();
   verb->add_flag("--json", arguments->json, "Print a JSON object a text");
-  addArguments(*verb, "TEXT", arguments->texts, "Texts; without any, the lines of standard input");
+  addTexts(*verb, "TEXT", arguments->texts, "Texts");
   verb->footer(kFooter);
   verb->callback([arguments, &chosen] { chosen = [arguments] { return runEncode(*arguments); }; });
 }

@@ -9,6 +9,7 @@
 #include "cli/OpenIndex.h"
 #include "cli/Output.h"
 #include "cli/Verbs.h"
+#include "cli/WaitingNote.h"
 
 namespace wordcatcher::cli {
 
@@ -46,11 +47,22 @@ ExitCode print(const Explanation& explanation, bool json) {
   return explanation.isFound ? kMatched : kNoMatch;
 }
 
+/// An explanation, for which all values of the index may be looked at.
+template <typename Explain>
+auto waitedFor(const Explain& explain) {
+  const WaitingNote note("Explaining");
+  return explain();
+}
+
 ExitCode runExplain(const Arguments& arguments) {
+  checkIndexComesFirst(arguments.index, {arguments.text, arguments.value});
   const Index index = openIndex(arguments.index, arguments.mode, arguments.verbose);
   return arguments.query
-             ? print(index.explainQuery(arguments.text, arguments.value), arguments.json)
-             : print(index.explain(arguments.text, arguments.value, arguments.options),
+             ? print(waitedFor([&] { return index.explainQuery(arguments.text, arguments.value); }),
+                     arguments.json)
+             : print(waitedFor([&] {
+                       return index.explain(arguments.text, arguments.value, arguments.options);
+                     }),
                      arguments.json);
 }
 

@@ -126,6 +126,7 @@ TextAnswer answerTo(const std::string& text, const FindResult& result, const Arg
 }
 
 ExitCode runFind(const Arguments& arguments) {
+  checkIndexComesFirst(arguments.index, arguments.texts);
   const Index index = openIndex(arguments.index, arguments.mode, arguments.verbose);
   return answerInOrder(
       arguments.texts,
@@ -166,9 +167,14 @@ void addFindVerb(CLI::App& program, ChosenVerb& chosen) {
   verb->add_flag("--verbose", arguments->verbose, "Show the tables' storage log on standard error");
   addArgument(*verb, "INDEX", arguments->index,
               "A search image, or the directory of a classic index");
-  addArguments(*verb, "TEXT", arguments->texts, "Texts; without any, the lines of standard input");
+  addTexts(*verb, "TEXT", arguments->texts, "Texts");
   verb->footer(kFooter);
-  verb->callback([arguments, &chosen] { chosen = [arguments] { return runFind(*arguments); }; });
+  verb->callback([arguments, &chosen] {
+    if (arguments->json && arguments->color == "always") {
+      throw CLI::ExcludesError("--json", "--color always");
+    }
+    chosen = [arguments] { return runFind(*arguments); };
+  });
 }
 
 }  // namespace wordcatcher::cli

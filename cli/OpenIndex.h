@@ -3,6 +3,7 @@
 
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "wordcatcher/matcher/Index.h"
 
@@ -18,6 +19,10 @@ bool namesDirectory(const std::string& name);
 /// `mode` is how a classic index is queried, words when it is empty. A search image remembers its
 /// mode, and another one is a Failure. Failure or Error when the index cannot be read.
 Index openIndex(const std::string& name, std::optional<MatchingMode> mode, bool verbose);
+
+/// Failure if there is no file `name`, but one of the `others` is an index: then they stand in the
+/// wrong order.
+void checkIndexComesFirst(const std::string& name, const std::vector<std::string>& others);
 
 /// Says on standard error that the limits of a query cut the answer to a text or word.
 void noteTruncated();

@@ -25,6 +25,9 @@ void Output::write(std::string_view text) {
 void Output::flush() {
   const std::string buffer = std::exchange(_buffer, std::string());
   std::string_view left = buffer;
+  if (_beforeWriting && !left.empty()) {
+    _beforeWriting();
+  }
   while (!left.empty()) {
     const ssize_t count = ::write(STDOUT_FILENO, left.data(), left.size());
     if (count >= 0) {

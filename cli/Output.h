@@ -1,8 +1,10 @@
 #ifndef WORDCATCHER_CLI_OUTPUT_H
 #define WORDCATCHER_CLI_OUTPUT_H
 
+#include <functional>
 #include <string>
 #include <string_view>
+#include <utility>
 
 namespace wordcatcher::cli {
 
@@ -14,12 +16,18 @@ struct OutputClosed {};
 /// destroyed is dropped.
 class Output {
  public:
+  Output() = default;
+
+  /// Calls something each time before it writes what it has buffered.
+  explicit Output(std::function<void()> beforeWriting) : _beforeWriting(std::move(beforeWriting)) {}
+
   void write(std::string_view text);
 
   /// Throws OutputClosed when the pipe was closed, Failure when writing failed otherwise.
   void flush();
 
  private:
+  std::function<void()> _beforeWriting;
   std::string _buffer;
 };
 

@@ -25,7 +25,15 @@ Examples:
   wordcatcher info dogs.wci
   wordcatcher encode 'Catherine Schmidt'
   wordcatcher dot tree dogs.wci | dot -Tsvg > dogs.svg
-"wordcatcher VERB --help" tells more about a verb.)";
+"wordcatcher help VERB" tells more about a verb, as "wordcatcher VERB --help" does.)";
+
+/// The heading above them in the help.
+void callThemVerbs(CLI::App& program) {
+  for (auto* const verb : program.get_subcommands([](const CLI::App*) { return true; })) {
+    verb->group("Verbs");
+    callThemVerbs(*verb);
+  }
+}
 
 }  // namespace
 
@@ -45,6 +53,8 @@ void defineProgram(CLI::App& program, ChosenVerb& chosen) {
   program.set_version_flag("--version", std::string("wordcatcher ") + versionString,
                            "Print the version and exit");
   program.require_subcommand(1);
+  // What CLI11 calls a subcommand is a verb here; its own verbs inherit the formatter.
+  program.get_formatter()->label("SUBCOMMAND", "VERB");
   program.footer(kFooter);
   addIndexVerb(program, chosen);
   addFindVerb(program, chosen);
@@ -55,6 +65,7 @@ void defineProgram(CLI::App& program, ChosenVerb& chosen) {
   addVerifyVerb(program, chosen);
   addEncodeVerb(program, chosen);
   addDotVerb(program, chosen);
+  callThemVerbs(program);
 }
 
 }  // namespace wordcatcher::cli

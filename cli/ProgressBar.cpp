@@ -20,13 +20,9 @@ constexpr const char* kWipe = "\r\x1b[K";
 ProgressBar::ProgressBar(const Options& options)
     : _options(options),
       _terminal(isatty(STDERR_FILENO) == 1),
-      _next(std::chrono::steady_clock::now() + options.delay) {}
+      _next(std::chrono::steady_clock::now()) {}
 
-ProgressBar::~ProgressBar() {
-  if (_drawn) {
-    std::cerr << kWipe << std::flush;
-  }
-}
+ProgressBar::~ProgressBar() { wipe(); }
 
 void ProgressBar::show(std::uint64_t done) {
   if (!_terminal) {
@@ -37,22 +33,32 @@ void ProgressBar::show(std::uint64_t done) {
     return;
   }
   _next = now + kRedrawEvery;
-  if (!_options.total) {
-    draw(std::to_string(done) + ' ' + _options.unit + " read");
-    return;
+  draw(line(done, _options.total, _options.unit));
+}
+
+std::string ProgressBar::line(std::uint64_t done, std::optional<std::uint64_t> total,
+                              const char* unit) {
+  if (!total) {
+    return std::to_string(done) + ' ' + unit + " read";
   }
-  const std::uint64_t total = std::max<std::uint64_t>(*_options.total, 1);
+  const std::uint64_t all = std::max<std::uint64_t>(*total, 1);
   // A file may grow while it is read.
-  const std::uint64_t shown = std::min(done, total);
-  const std::uint64_t filled = shown * kWidth / total;
-  draw('[' + std::string(filled, '#') + std::string(kWidth - filled, ' ') + "] " +
-       std::to_string(shown * kPercent / total) + " % of " + std::to_string(total) + ' ' +
-       _options.unit);
+  const std::uint64_t shown = std::min(done, all);
+  const std::uint64_t filled = shown * kWidth / all;
+  return '[' + std::string(filled, '#') + std::string(kWidth - filled, ' ') + "] " +
+         std::to_string(shown * kPercent / all) + " % of " + std::to_string(all) + ' ' + unit;
 }
 
 void ProgressBar::say(const std::string& text) {
   if (_terminal) {
     draw(text);
+  }
+}
+
+void ProgressBar::wipe() {
+  if (_drawn) {
+    std::cerr << kWipe << std::flush;
+    _drawn = false;
   }
 }
 

@@ -9,14 +9,13 @@
 namespace wordcatcher::cli {
 
 /// A line on standard error that shows how far a piece of work has come. It redraws itself a few
-/// times a second and wipes itself away when it is destroyed. Nothing at all is shown when standard
-/// error is no terminal.
+/// times a second at most, when show() is called, and wipes itself away when it is destroyed.
+/// Nothing at all is shown when standard error is no terminal.
 class ProgressBar {
  public:
   struct Options {
     std::optional<std::uint64_t> total;  ///< what show() will come to; none: only a count is shown
     const char* unit = "phrases";
-    std::chrono::milliseconds delay{0};  ///< work that is done sooner shows nothing
   };
 
   ProgressBar() : ProgressBar(Options{}) {}
@@ -30,6 +29,12 @@ class ProgressBar {
 
   /// Replaces the bar by a word on what is going on, at once.
   void say(const std::string& text);
+
+  /// Takes away what is shown.
+  void wipe();
+
+  /// What show() draws: a bar, or the count of what was read when nobody knows the total.
+  static std::string line(std::uint64_t done, std::optional<std::uint64_t> total, const char* unit);
 
   /// What begins a line on standard error that may meet a bar there: it wipes the bar away.
   static const char* lineStart();

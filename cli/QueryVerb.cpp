@@ -83,6 +83,7 @@ std::string plainLines(const Index::QueryResult& result) {
 
 ExitCode runQuery(const Arguments& arguments) {
   const Questions questions(arguments.texts, !arguments.json);
+  checkIndexComesFirst(arguments.index, arguments.texts);
   const Index index = openIndex(arguments.index, arguments.mode, arguments.verbose);
   const MatchingMode mode = index.info().mode;
   return questions.answerEach([&](const InputLine& question, Output& output) {
@@ -104,7 +105,7 @@ void addQueryVerb(CLI::App& program, ChosenVerb& chosen) {
   verb->add_flag("--verbose", arguments->verbose, "Show the tables' storage log on standard error");
   addArgument(*verb, "INDEX", arguments->index,
               "A search image, or the directory of a classic index");
-  addArguments(*verb, "TEXT", arguments->texts, "Texts; without any, the lines of standard input");
+  addTexts(*verb, "TEXT", arguments->texts, "Texts");
   verb->footer(kFooter);
   verb->callback([arguments, &chosen] { chosen = [arguments] { return runQuery(*arguments); }; });
 }

@@ -1,9 +1,10 @@
 #include "cli/Questions.h"
 
+#include <optional>
 #include <utility>
 
+#include "cli/AnswerProgress.h"
 #include "cli/Output.h"
-#include "cli/ReadingBar.h"
 #include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher::cli {
@@ -21,28 +22,34 @@ Questions::Questions(const std::vector<std::string>& texts, bool headings)
 }
 
 ExitCode Questions::answerEach(const Answer& answer) const {
-  Output output;
+  std::optional<InputLines> lines;
+  if (_questions.empty()) {
+    lines.emplace("-");
+  }
+  AnswerProgress progress(lines ? &*lines : nullptr);
+  Output output([&progress] { progress.pause(); });
   bool matched = false;
   const auto ask = [&](const InputLine& question) {
     if (_headings) {
       output.write(question.utf8 + '\n');
     }
+    progress.begin();
     matched |= answer(question, output);
+    progress.pause();
+    output.flush();
   };
   try {
     for (const auto& question : _questions) {
       ask(question);
     }
-    if (_questions.empty()) {
-      InputLines lines("-");
-      ReadingBar progress(lines);
-      while (const auto question = lines.next()) {
-        progress.show();
-        ask(*question);
-        output.flush();
+    while (lines) {
+      progress.took();
+      const auto question = lines->next();
+      if (!question) {
+        break;
       }
+      ask(*question);
     }
-    output.flush();
   } catch (const OutputClosed&) {
     // Whoever reads the answers has seen enough.
   }

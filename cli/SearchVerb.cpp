@@ -75,6 +75,7 @@ std::string plainLines(const Index::SearchResult& result) {
 
 ExitCode runSearch(const Arguments& arguments) {
   const Questions questions(arguments.words, !arguments.json);
+  checkIndexComesFirst(arguments.index, arguments.words);
   const Index index = openIndex(arguments.index, std::nullopt, arguments.verbose);
   return questions.answerEach([&](const InputLine& question, Output& output) {
     const auto result = index.search(question.utf8, arguments.maxDistance);
@@ -96,7 +97,7 @@ void addSearchVerb(CLI::App& program, ChosenVerb& chosen) {
   verb->add_flag("--verbose", arguments->verbose, "Show the tables' storage log on standard error");
   addArgument(*verb, "INDEX", arguments->index,
               "A search image, or the directory of a classic index");
-  addArguments(*verb, "WORD", arguments->words, "Words; without any, the lines of standard input");
+  addTexts(*verb, "WORD", arguments->words, "Words");
   verb->footer(kFooter);
   verb->callback([arguments, &chosen] { chosen = [arguments] { return runSearch(*arguments); }; });
 }

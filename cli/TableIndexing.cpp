@@ -58,18 +58,24 @@ void writeTables(const IndexingTask& task, const IndexDirectory& directory, cons
   delete std::exchange(unfinished, nullptr);
 }
 
+Phrases readPhrases(const IndexingTask& task, IndexingReport& report) {
+  WordCounter counter;
+  Phrases phrases;
+  ProgressBar progress;
+  forEachPhrase(task.files, [&](Phrase&& phrase) {
+    progress.show(report.phrases++);
+    report.words += counter.count(phrase.utf16.text());
+    phrases.push_back(std::move(phrase.utf16));
+  });
+  return phrases;
+}
+
 }  // namespace
 
 IndexingReport indexIntoTables(const IndexingTask& task) {
   const IndexDirectory directory(task.target);
   IndexingReport report;
-  WordCounter counter;
-  Phrases phrases;
-  forEachPhrase(task.files, [&](Phrase&& phrase) {
-    report.words += counter.count(phrase.utf16.text());
-    phrases.push_back(std::move(phrase.utf16));
-  });
-  report.phrases = phrases.size();
+  const Phrases phrases = readPhrases(task, report);
   const TableLog log(task.verbose);
   NewTables tables(directory);
   const InterruptGuard guard([&tables] { tables.discardForGood(); });

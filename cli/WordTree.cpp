@@ -8,6 +8,7 @@
 #include "cli/IndexDirectory.h"
 #include "cli/OpenIndex.h"
 #include "cli/TableLog.h"
+#include "cli/WaitingNote.h"
 #include "wordcatcher/fuzzy/TableImage.h"
 #include "wordcatcher/storage/PLXDFA.h"
 #include "wordcatcher/storage/SearchImage.h"
@@ -101,6 +102,7 @@ std::shared_ptr<const SearchImage> openWords(const std::string& name, bool verbo
   }
   const IndexDirectory directory(name);
   const TableLog log(verbose);
+  const WaitingNote note("Reading " + name);
   PLXDFA tables(directory.path());
   directory.openForReading(log, [&] { tables.setMode(kReading); });
   return makeTableImage(tables);

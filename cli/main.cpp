@@ -12,6 +12,7 @@
 #include "cli/Failure.h"
 #include "cli/Output.h"
 #include "cli/Program.h"
+#include "cli/VerbNames.h"
 
 namespace wordcatcher::cli {
 
@@ -49,7 +50,11 @@ std::string chosenPath(const CLI::App& app) {
 /// Prints what --help and --version ask for; everything else that ends parsing is wrong usage.
 ExitCode endParsing(const CLI::App& program, const CLI::ParseError& error) {
   if (error.get_exit_code() != static_cast<int>(CLI::ExitCodes::Success)) {
-    return fail(std::string(error.what()) + "; see \"" + chosenPath(program) + " --help\".");
+    std::string what = error.what();
+    if (what == CLI::RequiredError::Subcommand(1).what()) {
+      what = "VERB is required";
+    }
+    return fail(what + "; see \"" + chosenPath(program) + " --help\".");
   }
   std::ostringstream text;
   program.exit(error, text, text);
@@ -68,7 +73,9 @@ ExitCode run(int argc, char** argv) {
     return kFailed;
   }
   try {
-    program.parse(shieldedArguments(argc, argv));
+    const auto arguments = withHelpAsOption({argv + 1, argv + argc});
+    checkVerbNames(program, arguments);
+    program.parse(shieldedArguments(arguments));
   } catch (const CLI::ParseError& error) {
     return endParsing(program, error);
   }

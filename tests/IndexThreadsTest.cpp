@@ -48,6 +48,10 @@ TEST_P(IndexThreadsTest, ManyUseOneWhileAnotherPublishes) {
   const Rows found = rowsOf(shared.query(text));
   ASSERT_EQ(found, (Rows{{GetParam() == MatchingMode::wholeText ? "konrad zuse" : text, 0}}));
   const Rows words = rowsOf(shared.search("KNRT", 3));
+  const FindResult phrases = shared.find(text);
+  ASSERT_EQ(phrases.matches.front().value, "Konrad Zuse");
+  const std::string explained = shared.explain(text, "Konrad Zuse").toJson();
+  ASSERT_NE(explained.find("\"cost\":0"), std::string::npos);
   std::atomic<bool> stop = false;
   std::atomic<int> wrong = 0;
   std::vector<std::thread> readers;
@@ -60,6 +64,9 @@ TEST_P(IndexThreadsTest, ManyUseOneWhileAnotherPublishes) {
         wrong += rowsOf(copy.query(text)) != found ? 1 : 0;
         wrong += rowsOf(Index::open(path).query(text)) != found ? 1 : 0;
         wrong += rowsOf(copy.search("KNRT", 3)) != words ? 1 : 0;
+        wrong += copy.find(text) != phrases ? 1 : 0;
+        wrong += Index::open(path).find(text) != phrases ? 1 : 0;
+        wrong += copy.explain(text, "Konrad Zuse").toJson() != explained ? 1 : 0;
       }
     });
   }

@@ -10,6 +10,7 @@ import os
 import pty
 import re
 import shutil
+import signal
 import subprocess
 import sys
 import threading
@@ -22,10 +23,32 @@ from cli_test import BRIDGE, DATA, DOGS, EDGES, PATIENCE, PUPPY, locked
 GREEN, YELLOW, RESET = "\x1b[32m", "\x1b[33m", "\x1b[0m"
 
 
+@contextlib.contextmanager
+def slowed_down(process):
+    """Lets a process run for a fiftieth of the time only, until what is yielded is called."""
+    enough = threading.Event()
+
+    def hold():
+        while not enough.is_set() and process.poll() is None:
+            process.send_signal(signal.SIGSTOP)
+            enough.wait(0.1)
+            process.send_signal(signal.SIGCONT)
+            time.sleep(0.002)
+
+    holder = threading.Thread(target=hold)
+    holder.start()
+    try:
+        yield enough.set
+    finally:
+        enough.set()
+        holder.join()
+
+
 class TerminalTest(cli_test.CommandTest):
     def on_terminal(self, *arguments, meanwhile=lambda: None, environment=None, stdout=None,
-                    stdin=subprocess.DEVNULL):
-        """What the command shows on a terminal, its standard output as well unless it is given."""
+                    stdin=subprocess.DEVNULL, slow_until=None):
+        """What the command shows on a terminal, its standard output as well unless it is given.
+        It is slowed down until it has shown `slow_until`, if that is given."""
         environment = {**os.environ, "NO_COLOR": "", **(environment or {})}
         master, terminal = pty.openpty()
         shown = b""
@@ -34,9 +57,12 @@ class TerminalTest(cli_test.CommandTest):
                                        stdout=stdout or terminal, stderr=terminal, env=environment)
             os.close(terminal)
             meanwhile()
-            with contextlib.suppress(OSError):
+            slowing = slowed_down(process) if slow_until else contextlib.nullcontext()
+            with slowing as let_go, contextlib.suppress(OSError):
                 while chunk := screen.read(4096):
                     shown += chunk
+                    if slow_until and slow_until.encode() in shown:
+                        let_go()
             self.code = process.wait(PATIENCE)
         return shown.decode().replace("\r\n", "\n")
 
@@ -180,6 +206,9 @@ class FindTest(TerminalTest):
         self.fail_with("--threads", "1 to 64", of=[*find, "--threads", "0"])
         self.fail_with("no-sub", of=[*find, "--overlaps", "some"])
         self.fail_with("--highlight", of=[*find, "--highlight", "--json"])
+        self.fail_with("--json excludes --color always",
+                       of=[*find, "--json", "--color", "always"])
+        self.succeed(*find, "--json", "--color", "never")
         self.fail_with("wordcatcher find --help", of=["find"])
 
     def test_mode_of_an_image_is_remembered(self):
@@ -343,13 +372,41 @@ class StreamTest(TerminalTest):
             self.assertEqual(self.on_terminal("find", self.dogs, stdin=stdin,
                                               stdout=subprocess.DEVNULL), "")
 
+    def test_progress_over_a_pipe_counts_what_came(self):
+        for verb in ("find", "query"):
+            with self.subTest(verb=verb):
+                reader, writer = os.pipe()
+
+                def send_slowly():
+                    for text in (b"goldan\n", b"retriver\n"):
+                        os.write(writer, text)
+                        time.sleep(1.3)
+                    os.close(writer)
+
+                with open(reader, "rb") as stdin:
+                    shown = self.on_terminal(verb, self.dogs, stdin=stdin,
+                                             stdout=subprocess.DEVNULL, meanwhile=send_slowly)
+                self.assertEqual(shown, "\r\x1b[K7 bytes read ... 1 s"
+                                        "\r\x1b[K16 bytes read ... 2 s\r\x1b[K")
+
+    def test_nothing_is_shown_while_somebody_types(self):
+        master, terminal = pty.openpty()
+        with open(terminal, "rb") as stdin:
+            def type_late():
+                time.sleep(1.3)
+                os.write(master, b"xyzzy\n\x04")
+            shown = self.on_terminal("find", self.dogs, stdin=stdin, stdout=subprocess.DEVNULL,
+                                     meanwhile=type_late)
+        os.close(master)
+        self.assertEqual(shown, "")
+
 
 class WaitingTest(TerminalTest):
     tables = True
 
     def test_reading_tables_says_for_how_long_it_has_been_at_it(self):
         self.index()
-        for verb in (["find", "--color", "never"], ["verify"]):
+        for verb in (["find", "--color", "never"], ["verify"], ["dot", "tree"]):
             with self.subTest(verb=verb):
                 self.expect_waiting(verb)
 
@@ -366,13 +423,41 @@ class WaitingTest(TerminalTest):
         self.assertEqual(self.code, 0)
         self.assertIn(f"\r\x1b[KReading {self.dogs} ... 1 s", shown)
         self.assertIn("\r\x1b[Kwordcatcher: waiting for", shown)
-        self.assertRegex(shown, r"\r\x1b\[K[^\r]*(is whole: |\tgolden )[^\r]*\n$")
+        self.assertRegex(shown, r"\r\x1b\[K[^\r]*(is whole: |\tgolden |digraph )[^\r]*$")
 
     def test_short_work_says_nothing(self):
         self.index()
         shown = self.on_terminal("verify", self.dogs)
         self.assertNotIn("Checking", shown)
         self.assertNotIn("Reading", shown)
+
+
+class LongWorkTest(TerminalTest):
+    def expect(self, note, *arguments, last):
+        """The note appears when the work lasts, and is gone when `last` is printed."""
+        # Nobody can tell which share of the machine the command gets after all.
+        for _ in range(5):
+            shown = self.on_terminal(*arguments, slow_until=f"\r\x1b[K{note} ... 1 s")
+            self.assertIn(self.code, (0, 1), shown)
+            if note in shown:
+                break
+        self.assertIn(f"\r\x1b[K{note} ... 1 s", shown)
+        self.assertIn(last, shown.rsplit("\r\x1b[K", 1)[1])
+        self.assertNotIn(note, shown.rsplit("\r\x1b[K", 1)[1])
+
+    def test_says_what_it_does_and_for_how_long(self):
+        names = self.write("names.txt", cli_test.many_phrases(30_000))
+        self.expect("Writing the index", "index", self.dogs, names, last="Indexed 30000 phrases")
+        self.index(cli_test.many_phrases(100_000))
+        self.expect(f"Checking {self.dogs}", "verify", self.dogs, last="is whole")
+        self.expect("Explaining", "explain", self.dogs, "retriever number99999",
+                    "retriever number50000 kennel50000", "--max-cost", "100", "--limit", "1000000",
+                    last="Cost: ")
+        # A text that is slow by itself, as are all the others, of which none comes.
+        text = " ".join(f"retriver nunber{i} kenel" for i in range(900))
+        self.expect("Answering", "find", "--color", "never", "--max-postings", "1000000000",
+                    self.dogs, text, last="retriever")
+        self.expect("Answering", "query", self.dogs, text, last="")
 
 
 class ExplainTest(cli_test.CommandTest):

@@ -4,15 +4,19 @@ Usage: cli_pages_test.py PROGRAM DIRECTORY [unittest arguments]; the pages stand
 """
 
 import os
+import pty
 import re
-import shutil
+import select
 import subprocess
 import sys
 import tempfile
+import time
 import unittest
 
 PROGRAM, PAGES = (os.path.abspath(path) for path in sys.argv[1:3])
 BASH_COMPLETION = os.path.join(PAGES, "bash", "wordcatcher")
+
+PATIENCE = 30
 
 VERBS = ["index", "find", "explain", "query", "search", "info", "verify", "encode", "dot"]
 PATHS = [[], *([verb] for verb in VERBS), ["dot", "nfa"], ["dot", "dfa"], ["dot", "tree"]]
@@ -28,7 +32,7 @@ def options_of(path):
     return sorted(set(re.findall(r"^ +(?:-h,)?(--[a-z-]+)", help_of(path).split("\n\n\n")[0], re.M)))
 
 
-class BashCompletionTest(unittest.TestCase):
+class CompletionTest(unittest.TestCase):
     def setUp(self):
         directory = tempfile.TemporaryDirectory()
         self.addCleanup(directory.cleanup)
@@ -36,6 +40,8 @@ class BashCompletionTest(unittest.TestCase):
         for name in ("dogs.wci", "dog names.txt", "cats.wci"):
             open(os.path.join(self.root, name), "w").close()
 
+
+class BashCompletionTest(CompletionTest):
     def complete(self, *words):
         """What bash offers for the last word, with the words split as bash splits them."""
         script = ('source "$1"; shift; COMP_WORDS=(wordcatcher "$@"); COMP_CWORD=$#; _wordcatcher; '
@@ -80,11 +86,77 @@ class BashCompletionTest(unittest.TestCase):
             self.assertEqual(self.complete(*words), [], words)
 
 
-class ZshCompletionTest(unittest.TestCase):
+# Control-O completes what was typed, and writes the line as it then stands.
+ZSH_SETUP = r'''
+PS1= PS2= RPS1= HISTFILE=
+setopt no_beep no_always_to_end
+fpath=("$1" $fpath)
+autoload -Uz compinit && compinit -u -D
+whole-line() { zle expand-or-complete; print -r -- "$BUFFER" >> lines; BUFFER= }
+zle -N whole-line
+bindkey '^O' whole-line
+print ready > lines
+'''
+
+
+class ZshCompletionTest(CompletionTest):
     def setUp(self):
+        super().setUp()
         self.script = os.path.join(PAGES, "zsh", "_wordcatcher")
 
-    @unittest.skipUnless(shutil.which("zsh"), "zsh is not installed")
+    def lines(self, master, count):
+        """What zsh wrote, once that are so many lines; what it shows goes nowhere."""
+        deadline = time.monotonic() + PATIENCE
+        path = os.path.join(self.root, "lines")
+        while time.monotonic() < deadline:
+            while select.select([master], [], [], 0.01)[0]:
+                os.read(master, 4096)
+            if os.path.exists(path):
+                with open(path, encoding="utf-8") as file:
+                    if len(lines := file.read().split("\n")[:-1]) >= count:
+                        return lines
+        self.fail(f"zsh wrote no {count} lines")
+
+    def complete(self, *typed):
+        """Each line as a person at a terminal gets it completed."""
+        setup = os.path.join(self.root, ".setup")
+        with open(setup, "w", encoding="utf-8") as file:
+            file.write(ZSH_SETUP)
+        master, terminal = pty.openpty()
+        zsh = subprocess.Popen(["zsh", "-f", "-i"], stdin=terminal, stdout=terminal,
+                               stderr=terminal, cwd=self.root, start_new_session=True,
+                               env={"PATH": os.environ["PATH"], "TERM": "dumb", "HOME": self.root,
+                                    "LC_ALL": "C.UTF-8"})
+        os.close(terminal)
+        try:
+            os.write(master, f". ./.setup '{os.path.dirname(self.script)}'\n".encode())
+            self.lines(master, 1)
+            for count, line in enumerate(typed, start=2):
+                os.write(master, line.encode() + b"\x0f")
+                lines = self.lines(master, count)
+        finally:
+            zsh.kill()
+            zsh.wait()
+            os.close(master)
+        return lines[1:]
+
+    def test_what_is_typed_is_completed(self):
+        expected = {
+            "wordcatcher fi": "wordcatcher find ",
+            "wordcatcher dot tr": "wordcatcher dot tree ",
+            "wordcatcher find --overl": "wordcatcher find --overlaps=",
+            "wordcatcher find --overlaps=lo": "wordcatcher find --overlaps=longest ",
+            "wordcatcher find --json --max-p": "wordcatcher find --json --max-postings=",
+            "wordcatcher index --mode=ph": "wordcatcher index --mode=phonetic ",
+            "wordcatcher find dogs": "wordcatcher find dogs.wci ",
+            "wordcatcher explain --json c": "wordcatcher explain --json cats.wci ",
+            "wordcatcher index new.wci dog\\ ": "wordcatcher index new.wci dog\\ names.txt ",
+            # A text is no file, and no verb begins so.
+            "wordcatcher find dogs.wci ca": "wordcatcher find dogs.wci ca",
+            "wordcatcher xy": "wordcatcher xy",
+        }
+        self.assertEqual(self.complete(*expected), list(expected.values()))
+
     def test_syntax(self):
         done = subprocess.run(["zsh", "-n", self.script], capture_output=True, text=True)
         self.assertEqual((done.returncode, done.stderr), (0, ""))
@@ -113,7 +185,6 @@ class ManPageTest(unittest.TestCase):
         self.assertEqual((done.returncode, done.stderr), (0, ""), page)
         return done.stdout
 
-    @unittest.skipUnless(shutil.which("groff"), "groff is not installed")
     def test_pages_are_without_warnings_and_say_what_the_help_says(self):
         for path in PATHS:
             page, help_text = self.rendered(path), help_of(path)
@@ -128,7 +199,6 @@ class ManPageTest(unittest.TestCase):
             self.assertEqual(headings[:2], ["NAME", "SYNOPSIS"])
             self.assertIn("EXAMPLES", headings)
 
-    @unittest.skipUnless(shutil.which("lexgrog"), "man-db is not installed")
     def test_pages_can_be_found_by_their_summary(self):
         for path in PATHS:
             name = "-".join(["wordcatcher", *path])

@@ -152,6 +152,53 @@ class ProgramTest(CommandTest):
         self.fail_with("sounds", of=[*self.index_verb, "--mode", "sounds", self.dogs])
         self.assertFalse(os.path.exists(self.dogs))
 
+    def test_a_word_that_is_no_verb_is_named_with_the_nearest_verb(self):
+        for word, verb in (("fnid", "find"), ("qeury", "query"), ("inf", "info"), ("hlep", "help")):
+            self.fail_with(f'"{word}" is no verb; did you mean "{verb}"? '
+                           'See "wordcatcher --help".', of=[word, self.dogs])
+        for word in ("fetch", "x", "", "é"):
+            self.fail_with('is no verb. See "wordcatcher --help".', of=[word])
+        self.fail_with('"nfaa" is no verb; did you mean "nfa"? See "wordcatcher dot --help".',
+                       of=["dot", "nfaa", "gate", "1"])
+        self.fail_with("VERB is required", '"wordcatcher dot --help"', of=["dot"])
+
+    def test_help_is_a_verb_too(self):
+        for path in ([], ["find"], ["dot"], ["dot", "nfa"]):
+            self.assertEqual(self.succeed("help", *path), self.succeed(*path, "--help"))
+        self.assertIn("Usage: wordcatcher [OPTIONS] VERB\n", self.succeed("help"))
+        self.assertIn("Usage: wordcatcher dot [OPTIONS] VERB\n", self.succeed("help", "dot"))
+        self.assertNotIn("ubcommand", self.succeed("help").lower())
+        self.fail_with('"fnid" is no verb; did you mean "find"?', of=["help", "fnid"])
+
+    def test_an_index_behind_its_text_is_recognised(self):
+        self.index()
+        os.mkdir(self.path("tables"))
+        self.succeed("index", "--tables", self.path("tables"), stdin=DOGS)
+        for index in (self.dogs, self.path("tables")):
+            hint = f'There is no index at "lake geneva", but "{index}" is one: give the INDEX first'
+            for verb in (["find"], ["query"], ["search"], ["dot", "tree"]):
+                self.fail_with(hint, of=[*verb, "lake geneva", index])
+            self.fail_with(hint, of=["find", "lake geneva", "lakes", index])
+            self.fail_with(hint, of=["explain", "lake geneva", "Lake Geneva", index])
+        self.write("notes.txt", "lake geneva\n")
+        for other in ("absent.wci", self.path("notes.txt"), self.root):
+            self.assertEqual(self.run_it("find", "lake geneva", other), 2)
+            self.assertIn("There is no index at lake geneva", self.err)
+            self.assertNotIn("first", self.err)
+
+    def test_a_dash_alone_is_standard_input(self):
+        self.index()
+        for verb, text in (("find", "golden"), ("query", BRIDGE), ("search", "goldan")):
+            lines = self.succeed(verb, self.dogs, stdin=f"{text}\n{text}\n")
+            self.assertTrue(lines.startswith(f"{text}\n"))
+            self.assertEqual(self.succeed(verb, self.dogs, "-", stdin=f"{text}\n{text}\n"), lines)
+            self.assertIn('"-" alone', self.succeed(verb, "--help"))
+        self.assertEqual(self.succeed("encode", "-", stdin="golden\n"),
+                         self.succeed("encode", "golden"))
+        # Among others, and behind "--", it is a text.
+        self.assertIn("-\n", self.succeed("find", self.dogs, "golden", "-"))
+        self.assertEqual(self.run_it("find", self.dogs, "--", "-", stdin="golden\n"), 1)
+
     def test_help_that_cannot_be_written(self):
         with open("/dev/full", "wb") as full:
             done = subprocess.run([PROGRAM, "--help"], stdout=full, stderr=subprocess.PIPE)
@@ -233,7 +280,8 @@ class InputTest(IndexTest):
                 while chunk := screen.read(4096):
                     shown += chunk
         self.assertEqual(done.returncode, 0)
-        self.assertIn(b"% of 2 phrases" if self.tables else b"0 phrases read", shown)
+        self.assertIn(b"0 phrases read", shown)
+        self.assertEqual(b"% of 2 phrases" in shown, self.tables)
         self.assertIn(b"\r\x1b[KIndexed 2 phrases", shown)
         self.succeed(*self.index_verb, self.dogs, names)
         self.assertNotIn("\r", self.err)

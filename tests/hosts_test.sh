@@ -1,9 +1,9 @@
 #!/usr/bin/env bash
 # Builds hosts in C++ and in C against an installed prefix and runs them: once found by CMake, once by
 # pkg-config. Whatever else is installed or built is not used. Arguments: source directory, prefix,
-# compiler flags.
+# version, compiler flags.
 set -euo pipefail
-source=$1 prefix=$2 flags=$3
+source=$1 prefix=$2 version=$3 flags=$4
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 libdir=$(dirname "$(find "$prefix" -name libwordcatcher.so)")
@@ -23,7 +23,7 @@ of_prefix() {
   }
 }
 
-expected=$'1.0.0\n{KXWordcatch v:"golden retriever", dist: 1}'
+expected=$version$'\n{KXWordcatch v:"golden retriever", dist: 1}'
 check() {
   mkdir "$work/$1"
   local output
@@ -38,11 +38,30 @@ check() {
   echo "the host built by $1 works"
 }
 
-cmake -S "$source/examples/installed_host" -B "$work/host" -DCMAKE_PREFIX_PATH="$prefix" \
-  -DCMAKE_CXX_FLAGS="$flags" >/dev/null
-of_prefix "what CMake finds" "$work/host/CMakeCache.txt"
-cmake --build "$work/host" >/dev/null
-check cmake "$work/host/host"
+# build EXAMPLE: with CMake, in a directory named after it.
+build() {
+  cmake -S "$source/examples/$1" -B "$work/$1" -DCMAKE_PREFIX_PATH="$prefix" \
+    -DCMAKE_CXX_FLAGS="$flags" >/dev/null
+  of_prefix "what CMake finds for $1" "$work/$1/CMakeCache.txt"
+  cmake --build "$work/$1" >/dev/null
+}
+
+build installed_host
+check cmake "$work/installed_host/host"
+
+# The example of a tutorial: finding by spelling, and by sound.
+build names_register
+printf '%s\t%s\n' 'Catherine Schmidt' 4711 'Stephen Phillips' 4712 >"$work/register"
+output=$("$work/names_register/names_register" "$work/register" "$work" \
+  <<<$'Cathrine Schmit\nSteven Philips\nJon Smith')
+[ "$output" = $'Cathrine Schmit\tspelt\tCatherine Schmidt\t4711
+Steven Philips\tsounds\tStephen Phillips\t4712' ] || {
+  echo "the register of names printed: $output" >&2
+  exit 1
+}
+ldd "$work/names_register/names_register" >"$work/loaded"
+of_prefix "the register of names" "$work/loaded"
+echo "the register of names works"
 
 export PKG_CONFIG_LIBDIR=$libdir/pkgconfig
 # shellcheck disable=SC2046

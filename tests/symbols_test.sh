@@ -1,9 +1,11 @@
 #!/usr/bin/env bash
 # Compares the C symbols of the shared library with the list in its version script, and the list
-# with the header. Arguments: shared library, version script, header.
+# with the header and with what the tests in C call. Arguments: shared library, version script, header,
+# a test in C...
 set -euo pipefail
 export LC_ALL=C
 library=$1 script=$2 header=$3
+shift 3
 
 # "name@@NODE" of each symbol that the list has.
 listed=$(awk '/^[A-Z_0-9]+ \{/ { node = $1 } /^ +wordcatcher_[a-z_]+;$/ {
@@ -28,4 +30,10 @@ diff <(sed 's/@@.*//' <<<"$listed") <(echo "$declared") >&2 || {
   echo "$header (>) declares other functions than $script lists (<)" >&2
   exit 1
 }
-echo "$(wc -l <<<"$exported") C symbols are as listed"
+called=$(cat "$@" | grep -oE '\bwordcatcher_[a-z_]+\(' | tr -d '(' | sort -u)
+untried=$(comm -23 <(echo "$declared") <(echo "$called"))
+[ -z "$untried" ] || {
+  echo "no test in C calls" $untried >&2
+  exit 1
+}
+echo "$(wc -l <<<"$exported") C symbols are as listed, and each is called"

@@ -103,6 +103,11 @@ int main(int count, char** arguments) {
   }
   try {
     std::ifstream entries(arguments[1]);
+    // A directory can be opened, but has no first byte.
+    if (entries.peek(); !entries.is_open() || entries.bad()) {
+      std::cerr << "Cannot read the register " << arguments[1] << ": check its name.\n";
+      return 2;
+    }
     NamesRegister::build(entries, arguments[2]);
     const NamesRegister names(arguments[2]);
     for (std::string name; std::getline(std::cin, name);) {

@@ -59,7 +59,10 @@ def marked(text: str, hits: Iterable[wordcatcher.FoundWord]) -> str:
 
 
 def main(phrases: str) -> None:
-    names = Path(phrases).read_text(encoding="utf-8").splitlines()
+    try:
+        names = Path(phrases).read_text(encoding="utf-8").splitlines()
+    except (OSError, UnicodeError) as error:
+        sys.exit(f"Cannot read the names: {error}")
     with tempfile.TemporaryDirectory() as directory:
         box = SearchBox.of(names, Path(directory, "names.wci"))
         for line in sys.stdin:
