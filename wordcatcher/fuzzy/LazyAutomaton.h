@@ -71,7 +71,7 @@ class LazyAutomaton {
   const State& operator[](Number state) const noexcept { return _memory.states[state]; }
 
  private:
-  static constexpr std::size_t kFewestSlots = 256;
+  static constexpr std::size_t kFewestSlots = K < 2 ? 64 : 256;
   static constexpr Number kUnknown = UINT32_MAX;
   static constexpr std::uint64_t kEnd = std::uint64_t{1} << image::kEndBit;
   /// A label within reach has the class of the first column in which it stands, all others have one
