@@ -1,5 +1,7 @@
-// How long a query takes over texts that are made to make it slow, from 64 KB to 1 MB, in every
-// mode, with the budgets that an index has by default and with budgets that cut nothing off.
+// How long query() and find() take over texts that are made to make them slow, from 64 KB to 1 MB,
+// in every mode, with the budgets that an index has by default and with budgets of the text that
+// cut nothing off. The budget of postings is find()'s own in both: how much it judges is not a
+// matter of the text's length.
 //
 // Prints how many times as long a text takes as one of half its size. Up to 2.3 counts as linear;
 // what is beyond is marked. Memory that was given back is kept by the process: whether the system
@@ -43,6 +45,20 @@ std::string joined(const std::vector<std::u16string>& names) {
   return text;
 }
 
+/// The names with no space within: "PapuaNewGuinea".
+std::string joinedWords(const std::vector<std::u16string>& names) {
+  std::string text;
+  for (auto name : names) {
+    std::erase(name, u' ');
+    text += utf8(name) + ' ';
+  }
+  return text;
+}
+
+/// A word of which a phrase of the index holds many.
+constexpr const char* kEqualWord = "duran";
+constexpr std::size_t kEqualWords = 200;
+
 /// A text of as many bytes as are wanted, of one piece again and again; nothing of it is cut.
 struct Hostile {
   const char* name;
@@ -71,7 +87,9 @@ std::vector<Hostile> hostileTexts() {
           {"ill-formed bytes in words", "isl\xC3(and\xE2\x82"},
           {"ideographs", "沖縄県"},
           {"accents on one letter", "\xCC\x81"},
-          {"capitals that grow", "İ"}};
+          {"capitals that grow", "İ"},
+          {"many equal words", kEqualWord + " "s},
+          {"joined words", joinedWords(isoNames(200))}};
 }
 
 struct Mode {
@@ -101,15 +119,34 @@ Index indexOf(MatchingMode mode, const Index::Options& options) {
   for (const auto& name : isoNames(kNames)) {
     builder.add(utf8(name), utf8(name));
   }
+  std::string equalWords;
+  for (std::size_t i = 0; i < kEqualWords; ++i) {
+    equalWords += kEqualWord + std::string(" ");
+  }
+  builder.add(equalWords, "equal words");
+  builder.add(std::string(kEqualWord) + kEqualWord, "joined words");
   builder.commit();
   Index index = Index::open(path, options);
   std::filesystem::remove(path);
   return index;
 }
 
+/// What is timed.
+struct Call {
+  const char* name;
+  void (*of)(const Index& index, const std::string& text);
+};
+constexpr std::array<Call, 2> kCalls = {
+    {{"query", [](const Index& index,
+                  const std::string& text) { benchmark::DoNotOptimize(index.query(text)); }},
+     {"find", [](const Index& index, const std::string& text) {
+        benchmark::DoNotOptimize(index.find(text));
+      }}}};
+
 /// The name of a benchmark without its size.
-std::string seriesName(const Mode& mode, const Budgets& budget, const Hostile& hostile) {
-  return std::string(mode.name) + ", " + budget.name + ", " + hostile.name;
+std::string seriesName(const Call& call, const Mode& mode, const Budgets& budget,
+                       const Hostile& hostile) {
+  return std::string(call.name) + ", " + mode.name + ", " + budget.name + ", " + hostile.name;
 }
 
 std::string nameOf(const std::string& series, std::size_t kilobytes) {
@@ -117,13 +154,14 @@ std::string nameOf(const std::string& series, std::size_t kilobytes) {
 }
 
 /// Registers a benchmark for each size.
-void addSeries(const std::string& series, const Index& index, const Hostile& hostile) {
+void addSeries(const std::string& series, const Call& call, const Index& index,
+               const Hostile& hostile) {
   for (const std::size_t kilobytes : kKilobytes) {
     benchmark::RegisterBenchmark(nameOf(series, kilobytes).c_str(),
-                                 [index, hostile, kilobytes](benchmark::State& state) {
+                                 [call, index, hostile, kilobytes](benchmark::State& state) {
                                    const auto text = hostile.text(kilobytes * kKilobyte);
                                    while (state.KeepRunning()) {
-                                     benchmark::DoNotOptimize(index.query(text));
+                                     call.of(index, text);
                                    }
                                  })
         ->Unit(benchmark::kMillisecond)
@@ -136,7 +174,7 @@ void printRatios(const std::string& series, const LeastTimeReporter& reporter) {
   if (!reporter.has(nameOf(series, kKilobytes.back()))) {
     return;  // a filter left it out
   }
-  std::printf("%-55s", series.c_str());
+  std::printf("%-62s", series.c_str());
   bool linear = true;
   for (std::size_t i = 1; i < kKilobytes.size(); ++i) {
     const double ratio =
@@ -153,14 +191,16 @@ void run() {
     for (const auto& budget : budgets()) {
       const Index index = indexOf(mode.mode, budget.options);
       for (const auto& hostile : hostileTexts()) {
-        all.push_back(seriesName(mode, budget, hostile));
-        addSeries(all.back(), index, hostile);
+        for (const auto& call : kCalls) {
+          all.push_back(seriesName(call, mode, budget, hostile));
+          addSeries(all.back(), call, index, hostile);
+        }
       }
     }
   }
   LeastTimeReporter reporter(LeastTimeReporter::Rows::fastest);
   benchmark::RunSpecifiedBenchmarks(&reporter);
-  std::printf("\n%-55s", "Times as long as half the text (at most 2.3):");
+  std::printf("\n%-62s", "Times as long as half the text (at most 2.3):");
   for (std::size_t i = 1; i < kKilobytes.size(); ++i) {
     std::printf("%6zu KB", kKilobytes[i]);
   }

@@ -29,6 +29,22 @@ ImageBytes exampleImage();
 /// Words of nothing but two letters, all heads of one another: the deepest tree of its size.
 ImageBytes deepImage();
 
+/// Phrases of several words: words twice, joined words, numbers, values with several phrases, and
+/// leaves with and without tails.
+ImageBytes phrasesImage();
+
+/// Phrases in three scripts, so that letters of some words have no bit of their own.
+ImageBytes rareLettersImage();
+
+/// Phrases of more letters than one byte tells apart.
+ImageBytes wideLabelsImage();
+
+/// Phrases of phonetic codes.
+ImageBytes codesImage();
+
+/// Whole texts, one with two values and two with one.
+ImageBytes textsImage();
+
 ImageBytes emptyImage();
 
 }  // namespace wordcatcher::testing

@@ -70,7 +70,10 @@ const std::vector<std::u16string>& someQueries() {
                                                       u"ré",
                                                       u"oder",
                                                       std::u16string(1, 0x4E03),
-                                                      u"alaknandaangara"};
+                                                      u"alaknandaangara",
+                                                      u"newzealand aotaeroa new york",
+                                                      u"a 12 route 67 duran durane",
+                                                      u"река дунаи μαύρηθάλασσα"};
   return queries;
 }
 
@@ -355,8 +358,10 @@ void mutate(ImageBytes& bytes, const image::Section& section, std::mt19937_64& r
 TEST(HostileImageTest, ManyMutationsWithTheRightChecksums) {
   constexpr int kMutations = 100000;
   const ImageBytes large = testing::manyLettersImage();
-  const std::vector<ImageBytes> small = {testing::riverImage(), testing::exampleImage(),
-                                         testing::deepImage()};
+  const std::vector<ImageBytes> small = {testing::riverImage(),       testing::exampleImage(),
+                                         testing::deepImage(),        testing::phrasesImage(),
+                                         testing::rareLettersImage(), testing::wideLabelsImage(),
+                                         testing::codesImage(),       testing::textsImage()};
   std::mt19937_64 random(20261121);  // NOLINT(cert-msc32-c,cert-msc51-cpp): the same every time
   int opened = 0;
   int answered = 0;
@@ -620,16 +625,32 @@ TEST(VerifyTest, FindsWhatASearchWouldMiss) {
       << "a letter for the end of a word";
 }
 
-/// The inputs of fuzz/image_fuzzer.cpp: each sample with a query and a distance.
+/// The inputs of fuzz/image_fuzzer.cpp, which says what their bytes mean: each sample with texts
+/// and options.
 std::map<std::string, std::string> fuzzCorpus() {
+  struct Questions {
+    const char* name;
+    std::string_view options;  // five bytes
+    std::u16string_view text;
+  };
+  using namespace std::string_view_literals;
+  const std::vector<Questions> questions = {
+      // The default limits of edits, swaps; with the phrase of the first value behind the text.
+      {"search", "\x51\x02\x24\x00\x00"sv, u"rhine"},
+      // verify() first. All limits at 3; longest ranges; the phrase of another value in one word.
+      {"verify", "\xDB\x05\xFF\x02\x00"sv, u"_o*er new"},
+      // No swaps, two words at the least, a cost of at most 14, one edit of a number, no ranges
+      // within others; a text of its own.
+      {"words", "\x05\x08\x64\x03\x04"sv, u"newzealand duran route 67 река"},
+      // verify() first. Small budgets, and no edits.
+      {"budgets", "\x73\x00\x00\x04\x00"sv, u"a 12 new zealand"}};
   std::map<std::string, std::string> corpus;
   for (const SampleImage& sample : testing::sampleImages()) {
-    for (std::size_t i = 0; i < 2; ++i) {
-      const std::u16string& query = i == 0 ? someQueries()[0] : someQueries()[1];
-      std::string input = {static_cast<char>(1 + 2 * i), static_cast<char>(2 + 3 * i),
-                           static_cast<char>(query.size())};
-      input.append(reinterpret_cast<const char*>(query.data()), 2 * query.size());
-      corpus[sample.name + (i == 0 ? "-search" : "-verify")] = input + asText(sample.bytes);
+    for (const auto& [name, options, text] : questions) {
+      std::string input(options);
+      input += static_cast<char>(text.size());
+      input.append(reinterpret_cast<const char*>(text.data()), 2 * text.size());
+      corpus[sample.name + '-' + name] = input + asText(sample.bytes);
     }
   }
   return corpus;
