@@ -149,12 +149,7 @@ class BandedPattern {
     }
     if (units.size() + B::kColumns <= 64) {
       for (std::size_t p = 0; p < units.size(); ++p) {
-        const std::uint64_t bit = std::uint64_t{1} << (p + K);
-        if (units[p].any) {
-          _any |= bit;
-        } else if (units[p].label < image::kRareBit) {
-          _table[units[p].label] |= bit;
-        }
+        addToTable(units[p], std::uint64_t{1} << (p + K));
       }
       _hasTable = true;
     }
@@ -171,18 +166,6 @@ class BandedPattern {
   std::uint16_t labelAt(std::size_t depth, unsigned column) const noexcept {
     const std::size_t p = depth + column - K;
     return p < _units.size() && !_units[p].any ? _units[p].label : 0;
-  }
-
-  /// Of these the columns with a label, which is not 0. `depth` is at most length() + K.
-  std::uint64_t labelColumns(std::size_t depth, std::uint16_t label) const noexcept {
-    if (_hasTable && label < image::kRareBit) {
-      return (_table[label] >> depth) & B::kRow;
-    }
-    std::uint64_t bits = 0;
-    for (unsigned c = 0; c < kWindow; ++c) {
-      bits |= std::uint64_t{label != 0 && labelAt(depth, c) == label} << c;
-    }
-    return bits;
   }
 
   std::uint64_t validAt(std::size_t depth) const noexcept { return _states[depth].valid; }
@@ -239,18 +222,28 @@ class BandedPattern {
     return column >= B::kColumns ? B::kRow : (std::uint64_t{1} << column) - 1;
   }
 
-  std::uint64_t matching(std::size_t depth, std::uint16_t label) const noexcept {
-    return labelColumns(depth, label) | anyColumns(depth);
+  void addToTable(const QueryUnit& unit, std::uint64_t bit) noexcept {
+    if (unit.any) {
+      for (auto& row : _table) {
+        row |= bit;
+      }
+    } else if (unit.label != 0 && unit.label < image::kRareBit) {
+      _table[unit.label] |= bit;
+    }
   }
 
-  std::uint64_t anyColumns(std::size_t depth) const noexcept {
-    if (_hasTable) {
-      return (_any >> depth) & B::kRow;
-    }
+  std::uint64_t matching(std::size_t depth, std::uint16_t label) const noexcept {
+    return _hasTable && label < image::kRareBit ? (_table[label] >> depth) & B::kRow
+                                                : compared(depth, label);
+  }
+
+  std::uint64_t compared(std::size_t depth, std::uint16_t label) const noexcept {
     std::uint64_t bits = 0;
     for (unsigned c = 0; c < B::kColumns; ++c) {
       const std::size_t p = depth + c - K;
-      bits |= std::uint64_t{p < _units.size() && _units[p].any} << c;
+      if (p < _units.size() && _units[p].matches(label)) {
+        bits |= std::uint64_t{1} << c;
+      }
     }
     return bits;
   }
@@ -261,7 +254,6 @@ class BandedPattern {
   AtDepth* _states = _fewStates.data();
   // For queries that fit: bit p + K of a label's row says that it is the query's code unit p.
   std::uint64_t _table[image::kRareBit] = {};
-  std::uint64_t _any = 0;  // likewise for those that match any
   bool _hasTable = false;
 };
 

@@ -10,13 +10,16 @@
 // demand (Aho, Lam, Sethi, Ullman, "Compilers", section 3.7.4).
 
 #include <algorithm>
+#include <array>
 #include <bit>
 #include <cstddef>
 #include <cstdint>
+#include <tuple>
 #include <utility>
 #include <vector>
 
 #include "wordcatcher/fuzzy/BandedAutomaton.h"
+#include "wordcatcher/storage/LeafTails.h"
 #include "wordcatcher/storage/SearchImageFormat.h"
 #include "wordcatcher/storage/WalkMemory.h"
 
@@ -44,6 +47,7 @@ class LazyAutomaton {
     _memory.steps.resize(kFewestSlots / 2 * kClasses);
     std::fill_n(_memory.steps.begin(), kClasses, kDead);
     _memory.slots.assign(kFewestSlots, 0);
+    _memory.classes.clear();
   }
 
   /// The state of a set of states of the pattern's after `depth` code units, at which no word ends.
@@ -63,25 +67,53 @@ class LazyAutomaton {
     return to != kUnknown ? to : make(step, from, depth, label);
   }
 
-  /// The same, also beyond the depths of all states but the dead one.
+  /// The same, also beyond the depths of all states that are not dead.
   Number nextAnywhere(Number from, std::size_t depth, std::uint16_t label) {
-    return next(from, std::min(depth, _pattern.length() + K), label);
+    return next(from, std::min(depth, _lastDepth), label);
   }
 
   const State& operator[](Number state) const noexcept { return _memory.states[state]; }
 
  private:
-  static constexpr std::size_t kFewestSlots = K < 2 ? 64 : 256;
+  static constexpr std::size_t kFewestSlots = 256;
   static constexpr Number kUnknown = UINT32_MAX;
   static constexpr std::uint64_t kEnd = std::uint64_t{1} << image::kEndBit;
-  /// A label within reach has the class of the first column in which it stands, all others have one
-  /// in common. A power of two, so that rows are shifted to.
+  /// Labels that match within reach, and all others; a power of two, so that rows are shifted to.
   static constexpr std::size_t kClasses = std::bit_ceil(Pattern::kWindow + 1U);
+  static_assert(Pattern::kWindow <=
+                std::tuple_size_v<decltype(AutomatonMemory::Classes::ofColumn)>);
 
-  /// The first column with the label, or one behind the last.
-  std::size_t classOf(std::size_t depth, std::uint16_t label) const noexcept {
-    constexpr std::uint64_t kNone = std::uint64_t{1} << Pattern::kWindow;
-    return static_cast<std::size_t>(std::countr_zero(_pattern.labelColumns(depth, label) | kNone));
+  std::uint8_t classOf(std::size_t depth, std::uint16_t label) const noexcept {
+    return label < image::kRareBit ? _memory.classes[depth].ofLabel[label]
+                                   : classOfRare(depth, label);
+  }
+
+  std::uint8_t classOfRare(std::size_t depth, std::uint16_t label) const noexcept {
+    for (unsigned column = 0; column < Pattern::kWindow; ++column) {
+      if (_pattern.labelAt(depth, column) == label) {
+        return _memory.classes[depth].ofColumn[column];
+      }
+    }
+    return 0;
+  }
+
+  /// For one more depth.
+  void addClasses() {
+    const std::size_t depth = _memory.classes.size();
+    _lastDepth = depth;
+    auto& classes = _memory.classes.emplace_back();
+    std::uint8_t last = 0;
+    for (unsigned column = 0; column < Pattern::kWindow; ++column) {
+      const std::uint16_t label = _pattern.labelAt(depth, column);
+      if (label == 0) {
+        continue;
+      }
+      const std::uint8_t known = classOf(depth, label);
+      classes.ofColumn[column] = known != 0 ? known : ++last;
+      if (label < image::kRareBit) {
+        classes.ofLabel[label] = classes.ofColumn[column];
+      }
+    }
   }
 
   [[gnu::noinline]] Number make(std::size_t step, Number from, std::size_t depth,
@@ -124,6 +156,9 @@ class LazyAutomaton {
     Number& slot = slotOf(depth, set, distance);
     if (slot == 0) {
       slot = static_cast<Number>(_memory.states.size());
+      while (_memory.classes.size() <= depth) {
+        addClasses();
+      }
       const std::uint64_t byEdit = _pattern.editedAt(set, depth) & _pattern.validAt(depth + 1);
       const std::uint64_t wanted = (byEdit & B::kLane) != 0 ? ~kEnd : matchingChildren(depth, set);
       const auto [least, most] = restOf(depth, set);
@@ -190,6 +225,7 @@ class LazyAutomaton {
   const Pattern& _pattern;
   bool _backward;
   AutomatonMemory& _memory;
+  std::size_t _lastDepth = 0;  // that has classes
 };
 
 }  // namespace wordcatcher

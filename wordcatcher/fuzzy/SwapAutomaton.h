@@ -144,18 +144,6 @@ class SwapPattern {
     return p < _labels.size() ? _labels[p] : 0;
   }
 
-  /// Of these the columns with a label, which is not 0. `depth` is at most length() + K.
-  std::uint64_t labelColumns(std::size_t depth, std::uint16_t label) const noexcept {
-    if (_hasTable && label < image::kRareBit) {
-      return (_table[label] >> depth) & ((std::uint64_t{1} << kWindow) - 1);
-    }
-    std::uint64_t bits = 0;
-    for (unsigned c = 0; c < kWindow; ++c) {
-      bits |= std::uint64_t{label != 0 && labelAt(depth, c) == label} << c;
-    }
-    return bits;
-  }
-
   std::uint64_t validAt(std::size_t depth) const noexcept { return _states[depth].valid; }
   std::uint64_t acceptingAt(std::size_t depth) const noexcept { return _states[depth].accepting; }
 
@@ -169,7 +157,7 @@ class SwapPattern {
   }
   std::uint64_t matchedAt(std::uint64_t states, std::size_t depth,
                           std::uint16_t label) const noexcept {
-    return B::matched(states, labelColumns(depth, label));
+    return B::matched(states, matching(depth, label));
   }
 
   /// The columns behind which a code unit may match.
@@ -197,6 +185,20 @@ class SwapPattern {
       return 0;
     }
     return column >= B::kColumns ? Plain::kRow : (std::uint64_t{1} << column) - 1;
+  }
+
+  std::uint64_t matching(std::size_t depth, std::uint16_t label) const noexcept {
+    if (_hasTable && label < image::kRareBit) {
+      return (_table[label] >> depth) & ((std::uint64_t{1} << (B::kColumns + 1)) - 1);
+    }
+    std::uint64_t bits = 0;
+    for (unsigned c = 0; c <= B::kColumns; ++c) {
+      const std::size_t p = depth + c - K;
+      if (p < _labels.size() && _labels[p] == label && label != 0) {
+        bits |= std::uint64_t{1} << c;
+      }
+    }
+    return bits;
   }
 
   std::span<const std::uint16_t> _labels;

@@ -153,8 +153,9 @@ Pairing::Onward Pairing::bestOnward(const Word& word, std::uint32_t option) cons
   return best;
 }
 
-/// Finds what comes best behind each option.
-void Pairing::rankOptions() {
+/// Each word takes an option of its least edits; of these the ones with the least disorder. False
+/// when two words come to want the same word of the text.
+bool Pairing::pairEachByItself() {
   _onward.assign(_options.size(), {0, kNone});
   _bestUpTo.resize(_options.size());
   _bestBehind.resize(_options.size());
@@ -166,23 +167,13 @@ void Pairing::rankOptions() {
     }
     rankOnward(_words[w]);
   }
-}
-
-/// Each word takes an option of its least edits; of these the ones with the least disorder. False
-/// when two words come to want the same word of the text.
-bool Pairing::pairEachByItself() {
-  // Mostly there is one option for each.
-  const bool isForced = _options.size() == _words.size();
-  if (!isForced) {
-    rankOptions();
-  }
   bool isFree = true;
-  std::uint32_t option = isForced ? 0 : _bestBehind[_words.front().firstOption];
+  std::uint32_t option = _bestBehind[_words.front().firstOption];
   for (const Word& word : _words) {
     _best.push_back({word.position, _options[option]});
     isFree = isFree && _used[_options[option].position] == 0;
     _used[_options[option].position] = 1;
-    option = isForced ? option + 1 : _onward[option].next;
+    option = _onward[option].next;
   }
   for (const Pair& pair : _best) {
     _used[pair.option.position] = 0;

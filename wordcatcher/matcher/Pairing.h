@@ -98,7 +98,6 @@ class Pairing {
   bool follows(const Pair& last, std::uint32_t phrasePosition, const PairOption& option) const;
   std::uint64_t disorderOf(const Pair& last, std::uint32_t phrasePosition,
                            const PairOption& option) const;
-  void rankOptions();
   void rankOnward(const Word& word);
   Onward bestOnward(const Word& word, std::uint32_t option) const;
   PairingScore scoreOf(std::span<const Pair> pairs) const;

@@ -1,6 +1,14 @@
 #ifndef WORDCATCHER_PHONETIC_WORDPREDICATES_H
 #define WORDCATCHER_PHONETIC_WORDPREDICATES_H
 
+/// @file
+///
+/// The questions that the letter rules of the phonetic encoder ask about a word. They look at code
+/// units and match upper-case letters only, since the rules see upper-cased words. No position is
+/// out of range: what lies outside a word reads as a space or as an empty piece. All of them are
+/// safe for concurrent use; none allocates. They are inline because the rules ask dozens of them a
+/// word.
+
 #include <algorithm>
 #include <cstddef>
 #include <cstdint>
@@ -9,12 +17,6 @@
 #include <string_view>
 
 namespace wordcatcher {
-
-// The questions that the letter rules of the phonetic encoder ask about a word. They look at code
-// units and match upper-case letters only, since the rules see upper-cased words. No position is
-// out of range: what lies outside a word reads as a space or as an empty piece. All of them are
-// safe for concurrent use; none allocates. They are inline because the rules ask dozens of them a
-// word.
 
 /// Strings to compare with, in the order in which they are tried.
 using StringList = std::span<const std::u16string_view>;

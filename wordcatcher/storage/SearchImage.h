@@ -1,7 +1,6 @@
 #ifndef WORDCATCHER_STORAGE_SEARCHIMAGE_H
 #define WORDCATCHER_STORAGE_SEARCHIMAGE_H
 
-#include <array>
 #include <cstdint>
 #include <memory>
 #include <span>
@@ -45,9 +44,7 @@ class SearchImage {
   std::uint64_t phraseWordCount() const noexcept { return _phraseWords.size(); }  // of all phrases
 
   /// The label of a code unit; 0 when no word holds it. Logarithmic in the number of labels.
-  std::uint16_t labelOf(char16_t unit) const noexcept {
-    return unit < _asciiLabels.size() ? _asciiLabels[unit] : findLabel(unit);
-  }
+  std::uint16_t labelOf(char16_t unit) const noexcept;
 
   /// The labels of a word, and its code units. The word must be below wordCount().
   using Labels = TwoWidths<std::uint8_t, std::uint16_t>;
@@ -172,7 +169,6 @@ class SearchImage {
   template <typename Narrow, typename Wide>
   TwoWidths<Narrow, Wide> sectionOfEither(image::SectionKind kind) const;
   const image::Section& find(image::SectionKind kind) const;
-  std::uint16_t findLabel(char16_t unit) const noexcept;
   void verifySections() const;
   void verifyLabels() const;
   void verifyWords() const;
@@ -191,7 +187,6 @@ class SearchImage {
   std::uint32_t _wordCount = 0;
   std::uint32_t _valueCount = 0;
   std::span<const std::uint16_t> _labels;
-  std::array<std::uint16_t, 0x80> _asciiLabels = {};
   std::span<const std::uint32_t> _wordOffsets;
   Labels _wordText;
   Tree _forward;

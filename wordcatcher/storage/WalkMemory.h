@@ -31,12 +31,19 @@ struct AutomatonMemory {
     std::uint32_t depth = 0;
   };
 
+  /// After so many code units, the class of each common label, and of the label in each column.
+  struct Classes {
+    std::array<std::uint8_t, image::kRareBit + 1> ofLabel = {};
+    std::array<std::uint8_t, 16> ofColumn = {};
+  };
+
   std::vector<State> states;
   std::vector<std::uint32_t> steps;  // a row for each state
+  std::vector<Classes> classes;      // by depth
   std::vector<std::uint32_t> slots;  // hash table of the states; 0: free
 
   std::size_t bytes() const noexcept {
-    return states.capacity() * sizeof(State) +
+    return states.capacity() * sizeof(State) + classes.capacity() * sizeof(Classes) +
            (steps.capacity() + slots.capacity()) * sizeof(std::uint32_t);
   }
 };
