@@ -2,6 +2,8 @@
 #include <utility>
 
 #include "python/Bindings.h"
+#include "python/Call.h"
+#include "python/Lock.h"
 #include "python/Names.h"
 
 namespace wordcatcher::python {
@@ -34,7 +36,8 @@ void set(FindOptions& options, const std::string& name, const py::handle& value,
 }  // namespace
 
 std::uint64_t count(const py::handle& value, const std::string& parameter, std::uint64_t least) {
-  const auto number = py::reinterpret_steal<py::int_>(PyNumber_Index(value.ptr()));
+  const auto number =
+      py::reinterpret_steal<py::int_>(callPython([&] { return PyNumber_Index(value.ptr()); }));
   if (!number) {
     PyErr_Clear();
     throw py::type_error(parameter + " is an int");
@@ -56,7 +59,7 @@ FindOptions findOptions(const py::kwargs& arguments, const std::string& method) 
     } catch (const py::cast_error&) {
       std::string sentence = method;
       sentence.append("() cannot take this as ").append(parameter).append(": ");
-      throw py::type_error(sentence.append(py::repr(value)));
+      throw py::type_error(sentence.append(callPython([&] { return py::repr(value); })));
     }
   }
   return options;

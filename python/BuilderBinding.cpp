@@ -1,8 +1,11 @@
+#include <filesystem>
 #include <optional>
+#include <system_error>
 #include <utility>
 
 #include "python/Bindings.h"
 #include "python/Call.h"
+#include "python/Lock.h"
 #include "python/Names.h"
 #include "python/Text.h"
 #include "wordcatcher/matcher/IndexBuilder.h"
@@ -60,7 +63,7 @@ class Builder {
     IndexBuilder builder = std::move(open());
     _builder.reset();
     try {
-      const py::gil_scoped_release unlocked;
+      const Unlocked unlocked;
       return builder.commit();
     } catch (const std::exception&) {
       _builder = std::move(builder);
@@ -92,8 +95,8 @@ class Builder {
 /// Table files go into a directory, also when its path ends without a slash, as os.PathLike's do.
 std::string tablesPrefix(const py::object& tables) {
   std::string prefix = pathBytes(tables);
-  const bool isDirectory =
-      py::module_::import("os.path").attr("isdir")(py::bytes(prefix)).cast<bool>();
+  std::error_code noDirectory;
+  const bool isDirectory = std::filesystem::is_directory(prefix, noDirectory);
   return isDirectory && !prefix.ends_with('/') ? prefix + '/' : prefix;
 }
 

@@ -8,6 +8,7 @@
 #include "python/Call.h"
 #include "python/FindMany.h"
 #include "python/Names.h"
+#include "python/Lock.h"
 #include "python/Record.h"
 #include "python/Results.h"
 #include "python/Text.h"
@@ -115,7 +116,7 @@ class OpenIndex {
 
  private:
   static Index open(const Source& source) {
-    const py::gil_scoped_release unlocked;
+    const Unlocked unlocked;
     return Index::open(source.path, source.options, source.mode);
   }
 
@@ -179,26 +180,39 @@ std::string valueUtf8(const py::str& value) {
 FindResult find(const OpenIndex& self, const Call& call) {
   const FindOptions options = findOptions(call.options(), "find");
   const std::string utf8 = searchedUtf8(call.text("text"));
-  const py::gil_scoped_release unlocked;
+  const Unlocked unlocked;
   FindResult result = self.index().find(utf8, options);
   CodePoints(utf8).convert(result);
   return result;
+/// The next object of an iterator, null at its end.
+py::object next(const py::object& iterator) {
+  auto object =
+      py::reinterpret_steal<py::object>(callPython([&] { return PyIter_Next(iterator.ptr()); }));
+  if (!object && PyErr_Occurred() != nullptr) {
+    throw py::error_already_set();
+  }
+  return object;
+}
+
 }
 
 /// The UTF-8 copies of the next texts of an iterator; none at its end.
-std::vector<std::string> nextTexts(py::iterator& texts) {
+std::vector<std::string> nextTexts(const py::object& texts) {
   std::vector<std::string> utf8;
-  for (; utf8.size() < kTextsAtOnce && texts != py::iterator::sentinel(); ++texts) {
-    if (!py::isinstance<py::str>(*texts)) {
-      throw py::type_error("texts is an iterable of str, not of " + typeName(*texts));
+  while (utf8.size() < kTextsAtOnce) {
+    const py::object text = next(texts);
+    if (!text) {
+      break;
     }
-    utf8.push_back(searchedUtf8(py::reinterpret_borrow<py::str>(*texts)));
+    if (!py::isinstance<py::str>(text)) {
+      throw py::type_error("texts is an iterable of str, not of " + typeName(text));
+    }
+    utf8.push_back(searchedUtf8(py::reinterpret_borrow<py::str>(text)));
   }
   return utf8;
 }
 
 void checkSignals() {
-  const py::gil_scoped_acquire locked;
   if (PyErr_CheckSignals() != 0) {
     throw py::error_already_set();
   }
@@ -206,22 +220,22 @@ void checkSignals() {
 
 std::vector<FindResult> findWithoutLock(const Index& index, const std::vector<std::string>& texts,
                                         const FindOptions& options, std::size_t threads) {
-  const py::gil_scoped_release unlocked;
-  return findMany(index, texts, options, threads, &checkSignals);
+  Unlocked unlocked;
+  return findMany(index, texts, options, threads, [&] { unlocked.withLock(&checkSignals); });
 }
 
-py::iterator iteratorOf(const py::object& texts) {
+py::object iteratorOf(const py::object& texts) {
   if (py::isinstance<py::str>(texts)) {
     throw py::type_error("texts is one str; use find(), or give a list");
   }
   if (!py::isinstance<py::iterable>(texts)) {
     throw py::type_error("texts is an iterable of str, not " + typeName(texts));
   }
-  return py::iter(texts);
+  return callPython([&] { return py::object(py::iter(texts)); });
 }
 
 py::list findAll(const OpenIndex& self, const Call& call) {
-  py::iterator rest = iteratorOf(call.get("texts", py::none()));
+  const py::object rest = iteratorOf(call.get("texts", py::none()));
   const py::object threads = call.get("threads", py::none());
   const FindOptions options = findOptions(call.options(), "find_many");
   const std::size_t threadCount = threads.is_none()
@@ -238,7 +252,7 @@ py::list findAll(const OpenIndex& self, const Call& call) {
 
 Index::QueryResult query(const OpenIndex& self, const Call& call) {
   const std::string utf8 = searchedUtf8(call.text("text"));
-  const py::gil_scoped_release unlocked;
+  const Unlocked unlocked;
   return self.index().query(utf8);
 }
 
@@ -247,7 +261,7 @@ Index::SearchResult search(const OpenIndex& self, const Call& call) {
   const py::object maxDistance = call.get("max_distance", py::int_(kMaxDistance));
   const auto distance = std::min(count(maxDistance, "max_distance"), kTooMuch);
   const std::string utf8 = storedUtf8(call.text("word"));
-  const py::gil_scoped_release unlocked;
+  const Unlocked unlocked;
   return self.index().search(utf8, static_cast<std::int64_t>(distance));
 }
 
@@ -255,7 +269,7 @@ FindExplanation explain(const OpenIndex& self, const Call& call) {
   const FindOptions options = findOptions(call.options(), "explain");
   const std::string textBytes = searchedUtf8(call.text("text"));
   const std::string valueBytes = valueUtf8(call.text("value"));
-  const py::gil_scoped_release unlocked;
+  const Unlocked unlocked;
   FindExplanation explanation = self.index().explain(textBytes, valueBytes, options);
   CodePoints(textBytes).convert(explanation);
   return explanation;
@@ -264,12 +278,12 @@ FindExplanation explain(const OpenIndex& self, const Call& call) {
 QueryExplanation explainQuery(const OpenIndex& self, const Call& call) {
   const std::string textBytes = searchedUtf8(call.text("text"));
   const std::string valueBytes = valueUtf8(call.text("value"));
-  const py::gil_scoped_release unlocked;
+  const Unlocked unlocked;
   return self.index().explainQuery(textBytes, valueBytes);
 }
 
 void verify(const OpenIndex& self) {
-  const py::gil_scoped_release unlocked;
+  const Unlocked unlocked;
   self.index().verify();
 }
 

@@ -2,6 +2,8 @@
 
 #include <algorithm>
 
+#include "python/Lock.h"
+
 namespace wordcatcher::python {
 
 namespace {
@@ -54,7 +56,7 @@ std::string storedUtf8(const py::str& text) { return encoded(text); }
 
 std::string pathBytes(const py::object& path) {
   PyObject* bytes = nullptr;
-  if (PyUnicode_FSConverter(path.ptr(), &bytes) == 0) {
+  if (callPython([&] { return PyUnicode_FSConverter(path.ptr(), &bytes); }) == 0) {
     throw py::error_already_set();
   }
   return std::string(py::reinterpret_steal<py::bytes>(bytes));
