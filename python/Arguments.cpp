@@ -52,8 +52,10 @@ std::uint64_t count(const py::handle& value, const std::string& parameter, std::
 
 FindOptions findOptions(const py::kwargs& arguments, const std::string& method) {
   FindOptions options;
-  for (const auto& [name, value] : arguments) {
-    const auto parameter = name.cast<std::string>();
+  for (const auto& item : arguments) {
+    const std::string parameter = parameterName(item.first);
+    // Reading it may run Python code, which can reach the dictionary and empty it.
+    const auto value = py::reinterpret_borrow<py::object>(item.second);
     try {
       set(options, parameter, value, method);
     } catch (const py::cast_error&) {

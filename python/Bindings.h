@@ -20,8 +20,7 @@ void bindBuilder(py::module_& module);
 void bindIndex(py::module_& module);
 
 /// A docstring from whose first line inspect and help() tell the parameters. The first one of a
-/// method is $self, which inspect leaves out; that of __init__ is self, as inspect leaves out the
-/// first one of a class's signature in any case.
+/// method is $self, which inspect leaves out.
 inline std::string documented(const std::string& signature, const std::string& text) {
   return signature + "\n--\n\n" + text;
 }

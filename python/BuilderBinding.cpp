@@ -5,6 +5,7 @@
 
 #include "python/Bindings.h"
 #include "python/Call.h"
+#include "python/Construction.h"
 #include "python/Lock.h"
 #include "python/Names.h"
 #include "python/Text.h"
@@ -100,13 +101,13 @@ std::string tablesPrefix(const py::object& tables) {
   return isDirectory && !prefix.ends_with('/') ? prefix + '/' : prefix;
 }
 
-Builder makeBuilder(const py::object& path, const std::string& mode, const py::object& tables) {
+py::object makeBuilder(const py::object& path, const std::string& mode, const py::object& tables) {
   IndexBuilder::Options options;
   options.mode = modeNamed(mode);
   if (!tables.is_none()) {
     options.tables = tablesPrefix(tables);
   }
-  return {pathBytes(path), options};
+  return py::cast(Builder(pathBytes(path), options));
 }
 
 void add(Builder& builder, const Call& call) {
@@ -141,14 +142,11 @@ std::string shown(const Builder& builder) {
 }  // namespace
 
 void bindBuilder(py::module_& module) {
+  const py::cpp_function make(&makeBuilder, py::name("wordcatcher.IndexBuilder"), py::arg("path"),
+                              py::arg("mode") = "words", py::arg("tables") = py::none());
   py::class_<Builder>(
-      module, "IndexBuilder", py::is_final(),
+      module, "IndexBuilder", py::is_final(), Construction<Builder>::by(make),
       documented("IndexBuilder(path, mode='words', tables=None)", kBuilderDoc).c_str())
-      .def(py::init(&makeBuilder), py::arg("path"), py::arg("mode") = "words",
-           py::arg("tables") = py::none(),
-           documented("__init__(self, path, mode='words', tables=None)",
-                      "Makes a builder; nothing is touched yet.")
-               .c_str())
       .def("add", method({"add", {"phrase", "data"}, 1}, &add),
            documented("add($self, phrase, data=...)", kAddDoc).c_str())
       .def("commit", &Builder::commit, documented("commit($self)", kCommitDoc).c_str())

@@ -38,7 +38,7 @@ Call::Call(const Parameters& parameters, const py::args& byPlace, const py::kwar
     _arguments[py::str(names[i])] = byPlace[i];
   }
   for (const auto& [key, value] : byName) {
-    const auto name = key.cast<std::string>();
+    const std::string name = parameterName(key);
     if (std::find(names.begin(), names.end(), name) == names.end()) {
       if (!parameters.options) {
         refuse(parameters, "got an unexpected keyword argument '" + name + "'");
@@ -70,6 +70,15 @@ py::str Call::text(const std::string& name) const {
 }
 
 py::kwargs Call::options() const { return _options; }
+
+std::string parameterName(const py::handle& name) {
+  const auto bytes = py::reinterpret_steal<py::bytes>(
+      PyUnicode_AsEncodedString(name.ptr(), "utf-8", "backslashreplace"));
+  if (!bytes) {
+    throw py::error_already_set();
+  }
+  return std::string(bytes);
+}
 
 std::string typeName(const py::handle& object) {
   return py::type::handle_of(object).attr("__name__").cast<std::string>();

@@ -50,6 +50,9 @@ auto method(Parameters parameters, Result (*function)(Self&, const Call&)) {
   };
 }
 
+/// A name that an argument was given by. Lone surrogates, which no parameter's has, are escaped.
+std::string parameterName(const py::handle& name);
+
 /// The name of an object's class, for sentences.
 std::string typeName(const py::handle& object);
 

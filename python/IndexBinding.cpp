@@ -6,9 +6,10 @@
 
 #include "python/Bindings.h"
 #include "python/Call.h"
+#include "python/Construction.h"
 #include "python/FindMany.h"
-#include "python/Names.h"
 #include "python/Lock.h"
+#include "python/Names.h"
 #include "python/Record.h"
 #include "python/Results.h"
 #include "python/Text.h"
@@ -30,6 +31,10 @@ Pickled, it is its path and its options, and opens the file that stands there wh
 
 A lone surrogate in a text separates words. Every call may raise Error (damaged) when the file turns
 out to be damaged, and does nothing worse, whatever the file holds.)";
+
+constexpr const char* kNoConstructor =
+    "An index is opened with wordcatcher.Index.open(path), and built with "
+    "wordcatcher.IndexBuilder(path).";
 
 constexpr const char* kOpenDoc = R"(Opens an index.
 
@@ -147,16 +152,9 @@ py::tuple pickled(const OpenIndex& self) {
                         source.options.maxWordUnits);
 }
 
-OpenIndex unpickled(const py::tuple& state) {
-  checkPickle(state, 5);
-  return open(state[0], state[1].cast<bool>(), state[2].cast<std::string>(), state[3], state[4]);
-}
-
-/// What pybind11 says of a class without constructor does not tell where its objects come from.
-OpenIndex refuseToMake(const py::args& /*byPlace*/, const py::kwargs& /*byName*/) {
-  throw py::type_error(
-      "An index is opened with wordcatcher.Index.open(path), and built with "
-      "wordcatcher.IndexBuilder(path).");
+OpenIndex unpickled(const py::tuple& parts) {
+  checkPickle(parts, 5);
+  return open(parts[0], parts[1].cast<bool>(), parts[2].cast<std::string>(), parts[3], parts[4]);
 }
 
 std::string shown(const OpenIndex& self) {
@@ -184,6 +182,8 @@ FindResult find(const OpenIndex& self, const Call& call) {
   FindResult result = self.index().find(utf8, options);
   CodePoints(utf8).convert(result);
   return result;
+}
+
 /// The next object of an iterator, null at its end.
 py::object next(const py::object& iterator) {
   auto object =
@@ -192,8 +192,6 @@ py::object next(const py::object& iterator) {
     throw py::error_already_set();
   }
   return object;
-}
-
 }
 
 /// The UTF-8 copies of the next texts of an iterator; none at its end.
@@ -323,9 +321,9 @@ void defineQuery(py::class_<OpenIndex>& type) {
 }  // namespace
 
 void bindIndex(py::module_& module) {
-  py::class_<OpenIndex> type(module, "Index", py::is_final(), kIndexDoc);
   // Without a signature, which help() would show as if an index could be made so.
-  type.def(py::init(&refuseToMake), "Raises TypeError: use Index.open(path).");
+  py::class_<OpenIndex> type(module, "Index", py::is_final(),
+                             Construction<OpenIndex>::refused(kNoConstructor), kIndexDoc);
   defineOpen(type);
   defineFind(type);
   defineQuery(type);
@@ -337,7 +335,7 @@ void bindIndex(py::module_& module) {
       "path", [](const OpenIndex& self) { return pathText(self.source().path); },
       "The absolute path that was opened; os.fsencode() gives its bytes.");
   type.def("__repr__", &shown);
-  type.def(py::pickle(&pickled, &unpickled));
+  definePickle(type, &pickled, &unpickled);
 }
 
 }  // namespace wordcatcher::python

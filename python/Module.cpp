@@ -1,4 +1,5 @@
 #include "python/Bindings.h"
+#include "python/Construction.h"
 #include "wordcatcher/Version.h"
 
 PYBIND11_MODULE(_wordcatcher, module) {
@@ -14,5 +15,6 @@ PYBIND11_MODULE(_wordcatcher, module) {
   bindResults(module);
   bindBuilder(module);
   bindIndex(module);
+  fixClasses(module);
   py::delattr(module, "__module__");
 }

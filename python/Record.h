@@ -10,6 +10,8 @@
 #include <utility>
 #include <vector>
 
+#include "python/Construction.h"
+
 namespace wordcatcher::python {
 
 namespace py = pybind11;
@@ -55,13 +57,33 @@ void fromPython(py::handle object, Value& value) {
 
 template <typename Item>
 void fromPython(py::handle object, std::vector<Item>& items) {
-  for (const py::handle item : object) {
+  for (const py::handle item : object.cast<py::tuple>()) {
     fromPython(item, items.emplace_back());
   }
 }
 
-/// Throws ValueError when the state of a pickle is not of so many parts.
-void checkPickle(const py::tuple& state, std::size_t parts);
+/// Throws ValueError when a pickle is not of so many parts.
+void checkPickle(const py::tuple& parts, std::size_t count);
+
+/// Throws ValueError for a pickle whose parts are not what they should be.
+[[noreturn]] void refusePickle();
+
+/// Lets objects be pickled and copied, as the parts that `take` gives and that `make` takes. They
+/// are made anew by a function of the package, not from an object that has no value yet.
+template <typename Class, typename Take, typename Make>
+void definePickle(py::class_<Class>& type, Take take, Make make) {
+  type.def("__reduce__", [take](const py::object& self) {
+    return py::make_tuple(py::module_::import("wordcatcher").attr("_unpickled"),
+                          py::make_tuple(py::type::of(self), take(self.cast<const Class&>())));
+  });
+  type.def_static("_unpickled", [make](const py::tuple& parts) {
+    try {
+      return make(parts);
+    } catch (const py::cast_error&) {
+      refusePickle();
+    }
+  });
+}
 
 template <typename Struct, typename Value>
 struct Field {
@@ -73,12 +95,13 @@ struct Field {
 template <typename Struct, typename Value>
 Field(const char*, Value Struct::*, const char*) -> Field<Struct, Value>;
 
-/// Binds a struct as an immutable Python class: its fields are properties; it is compared, hashed,
-/// shown, pickled and matched by them.
+/// Binds a struct as an immutable Python class, whose objects are made as `construction` says: its
+/// fields are properties; it is compared, hashed, shown, pickled and matched by them.
 template <typename Struct, typename... Values>
 py::class_<Struct> bindRecord(py::module_& module, const char* name, const char* doc,
+                              const py::custom_type_setup& construction,
                               Field<Struct, Values>... fields) {
-  py::class_<Struct> type(module, name, py::is_final(), doc);
+  py::class_<Struct> type(module, name, py::is_final(), construction, doc);
   const auto values = [fields...](const Struct& self) {
     return py::make_tuple(toPython(self.*fields.member)...);
   };
@@ -103,14 +126,23 @@ py::class_<Struct> bindRecord(py::module_& module, const char* name, const char*
     return py::bool_(values(self).equal(values(other.cast<const Struct&>())));
   });
   type.def("__hash__", [values](const Struct& self) { return py::hash(values(self)); });
-  type.def(py::pickle(values, [fields...](const py::tuple& state) {
-    checkPickle(state, sizeof...(Values));
+  definePickle(type, values, [fields...](const py::tuple& parts) {
+    checkPickle(parts, sizeof...(Values));
     Struct value{};
     std::size_t at = 0;
-    (fromPython(state[at++], value.*fields.member), ...);
+    (fromPython(parts[at++], value.*fields.member), ...);
     return value;
-  }));
+  });
   return type;
+}
+
+/// The same for a struct that only the library makes.
+template <typename Struct, typename... Values>
+py::class_<Struct> bindRecord(py::module_& module, const char* name, const char* doc,
+                              Field<Struct, Values>... fields) {
+  const std::string sentence =
+      "A wordcatcher." + std::string(name) + " is what an index answers; no program makes one.";
+  return bindRecord(module, name, doc, Construction<Struct>::refused(sentence), fields...);
 }
 
 /// Lets a bound struct with `matches` be used as a sequence of them.

@@ -44,10 +44,10 @@ void bindLimits(py::module_& module) {
                                  ", long_edits=" + std::to_string(limits.longEdits) +
                                  ", whole_text_edits=" + std::to_string(limits.wholeTextEdits) +
                                  ", number_edits=" + std::to_string(limits.numberEdits) + ")";
-  const auto make = [](const py::object& shortLength, const py::object& mediumLength,
-                       const py::object& shortEdits, const py::object& mediumEdits,
-                       const py::object& longEdits, const py::object& wholeTextEdits,
-                       const py::object& numberEdits) {
+  const auto makeLimits = [](const py::object& shortLength, const py::object& mediumLength,
+                             const py::object& shortEdits, const py::object& mediumEdits,
+                             const py::object& longEdits, const py::object& wholeTextEdits,
+                             const py::object& numberEdits) {
     const auto edits = [](const py::object& value, const char* name) {
       const std::uint64_t number = count(value, name);
       if (number > EditLimits::kMaxEdits) {
@@ -56,13 +56,21 @@ void bindLimits(py::module_& module) {
       }
       return static_cast<std::uint32_t>(number);
     };
-    return EditLimits{count(shortLength, "short_length"), count(mediumLength, "medium_length"),
-                      edits(shortEdits, "short_edits"),   edits(mediumEdits, "medium_edits"),
-                      edits(longEdits, "long_edits"),     edits(wholeTextEdits, "whole_text_edits"),
-                      edits(numberEdits, "number_edits")};
+    return py::cast(
+        EditLimits{count(shortLength, "short_length"), count(mediumLength, "medium_length"),
+                   edits(shortEdits, "short_edits"), edits(mediumEdits, "medium_edits"),
+                   edits(longEdits, "long_edits"), edits(wholeTextEdits, "whole_text_edits"),
+                   edits(numberEdits, "number_edits")});
   };
+  const py::cpp_function make(
+      makeLimits, py::name("wordcatcher.EditLimits"), py::kw_only(),
+      py::arg("short_length") = limits.shortLength, py::arg("medium_length") = limits.mediumLength,
+      py::arg("short_edits") = limits.shortEdits, py::arg("medium_edits") = limits.mediumEdits,
+      py::arg("long_edits") = limits.longEdits, py::arg("whole_text_edits") = limits.wholeTextEdits,
+      py::arg("number_edits") = limits.numberEdits);
   bindRecord(
       module, "EditLimits", documented("EditLimits(" + parameters, kLimitsDoc).c_str(),
+      Construction<EditLimits>::by(make),
       Field{"short_length", &EditLimits::shortLength, "A word of up to so many is short."},
       Field{"medium_length", &EditLimits::mediumLength, "A longer one of up to so many is medium."},
       Field{"short_edits", &EditLimits::shortEdits, "Edits of a short word."},
@@ -70,14 +78,7 @@ void bindLimits(py::module_& module) {
       Field{"long_edits", &EditLimits::longEdits, "Edits of a long word."},
       Field{"whole_text_edits", &EditLimits::wholeTextEdits, "Edits of a whole text."},
       Field{"number_edits", &EditLimits::numberEdits,
-            "Edits of a word when it or the stored word holds a digit."})
-      .def(py::init(make), py::kw_only(), py::arg("short_length") = limits.shortLength,
-           py::arg("medium_length") = limits.mediumLength,
-           py::arg("short_edits") = limits.shortEdits, py::arg("medium_edits") = limits.mediumEdits,
-           py::arg("long_edits") = limits.longEdits,
-           py::arg("whole_text_edits") = limits.wholeTextEdits,
-           py::arg("number_edits") = limits.numberEdits,
-           documented("__init__(self, " + parameters, "Makes limits.").c_str());
+            "Edits of a word when it or the stored word holds a digit."});
 }
 
 void bindFind(py::module_& module) {
@@ -222,12 +223,16 @@ void bindInfo(py::module_& module) {
 
 }  // namespace
 
-void checkPickle(const py::tuple& state, std::size_t parts) {
-  if (state.size() != parts) {
-    throw py::value_error("The pickle was written by another version of wordcatcher than " +
-                          std::string(versionString) +
-                          ", which runs here; load it with that one, or make it anew with this.");
+void checkPickle(const py::tuple& parts, std::size_t count) {
+  if (parts.size() != count) {
+    refusePickle();
   }
+}
+
+void refusePickle() {
+  throw py::value_error("The pickle was written by another version of wordcatcher than " +
+                        std::string(versionString) +
+                        ", which runs here; load it with that one, or make it anew with this.");
 }
 
 void bindResults(py::module_& module) {

@@ -211,7 +211,9 @@ def test_results_can_be_pickled_copied_and_matched(index: Index) -> None:
         index.info(),
         EditLimits(long_edits=1),
     ):
-        assert pickle.loads(pickle.dumps(result)) == result
+        for protocol in range(pickle.HIGHEST_PROTOCOL + 1):
+            assert pickle.loads(pickle.dumps(result, protocol)) == result
+        assert copy.copy(result) == result
         assert copy.deepcopy(result) == result
     match index.find("tobbago")[0].hits[0]:
         case hit_class if type(hit_class).__match_args__ == ("begin", "end", "word", "edits"):
@@ -336,7 +338,9 @@ def test_a_wrong_call_is_told_in_one_sentence(index: Index, call: str, sentence:
 
 
 def test_a_pickle_of_another_version_says_what_to_do(index: Index) -> None:
-    for kept in (index, index.find("tobbago"), EditLimits()):
-        other = type(kept).__new__(type(kept))
-        with pytest.raises(ValueError, match=rf"than {wordcatcher.__version__}.*make it anew"):
-            other.__setstate__(("one", "of", "another", "version"))
+    for kept in (index, index.find("tobbago"), index.find("tobbago")[0].hits[0], EditLimits()):
+        make, (kind, parts) = kept.__reduce__()
+        assert make(kind, parts) == kept or kind is Index
+        for others in ((*parts, "new"), parts[1:], (*parts[:1], "wrong", *parts[2:])):
+            with pytest.raises(ValueError, match=rf"than {wordcatcher.__version__}.*make it anew"):
+                make(kind, others)

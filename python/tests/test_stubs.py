@@ -17,7 +17,7 @@ PUBLIC = sorted(name for name in CLASSES if not name.startswith("_"))
 
 # What every class of the module has, and every type checker knows of.
 OF_EVERY_CLASS = {"__eq__", "__hash__", "__repr__", "__str__", "__init__", "__match_args__"}
-OF_THE_MACHINERY = {"__doc__", "__module__", "__getstate__", "__setstate__", "__init__"}
+OF_THE_MACHINERY = {"__doc__", "__module__", "__new__", "__init__", "__reduce__", "_unpickled"}
 
 
 class Kind(enum.Enum):

@@ -56,3 +56,8 @@ __all__ = [
     "WordMatch",
     "__version__",
 ]
+
+
+def _unpickled(kind: type, parts: tuple) -> object:
+    """What a pickle of an object of this package calls, with the object's class and its parts."""
+    return kind._unpickled(parts)
