@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <random>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -296,6 +297,27 @@ TEST_P(QueryMemoryTest, OfManyLetters) {
   many.expectWithinBound("syllables", "각나다라마");
   many.expectWithinBound("letters", "abcde");
   many.expectWithinBound("stars", "*****");
+}
+
+TEST_P(QueryMemoryTest, OfLongWordsThatAreStored) {
+  constexpr std::size_t kLongest = 70000;
+  std::mt19937 random(5);  // NOLINT(cert-msc32-c,cert-msc51-cpp): the same every time
+  std::string letters;
+  while (letters.size() < kLongest) {
+    letters += static_cast<char>('a' + random() % 4);
+  }
+  for (const std::size_t length : {100U, 1000U, 10000U, 70000U}) {
+    const std::string text = letters.substr(0, length);
+    const std::vector<std::string> one = {text};
+    Opened(one, GetParam()).expectWithinBound("one long word", text);
+    // More words than a leaf holds, so that trees are as deep as they are long.
+    std::vector<std::string> many;
+    for (char letter = 'a'; letter <= 'z'; ++letter) {
+      many.push_back(text + letter);
+      many.push_back(letter + text);
+    }
+    Opened(many, GetParam()).expectWithinBound("long words that share much", text);
+  }
 }
 
 TEST_P(QueryMemoryTest, OfWordsWithoutData) {

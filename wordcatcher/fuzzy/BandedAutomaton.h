@@ -16,24 +16,14 @@
 // The method of rows is that of Wu and Manber, "Fast text searching allowing errors" (1992); moving
 // the columns along with the text is that of Ukkonen's band (1985).
 
-#include <array>
 #include <bit>
 #include <cstddef>
 #include <cstdint>
 #include <span>
-#include <vector>
 
-#include "wordcatcher/storage/SearchImageFormat.h"
+#include "wordcatcher/fuzzy/QueryPattern.h"
 
 namespace wordcatcher {
-
-/// A code unit of a query: the label that it has in an image (0: no word holds it), or any one.
-struct QueryUnit {
-  std::uint16_t label = 0;
-  bool any = false;
-
-  bool matches(std::uint16_t other) const noexcept { return any || (label == other && other != 0); }
-};
 
 /// One or two sets of states side by side in a word: lane 0 decides where a walk goes on, lane 1
 /// goes along, stepped by the same instructions, where both fit (K up to 3).
@@ -125,73 +115,39 @@ struct Band {
 
 /// A query prepared for simulation at up to K edits.
 template <unsigned K, unsigned Lanes = 1>
-class BandedPattern {
+class BandedPattern : public QueryPattern<K, Band<K>::kColumns> {
  public:
   using B = Band<K, Lanes>;
 
   /// In lane 0 `restricted` code units at the head may only be passed with at most `edits` edits.
+  /// The units must live as long as this does.
   BandedPattern(std::span<const QueryUnit> units, std::size_t restricted, unsigned edits)
-      : _units(units) {
-    const std::size_t depths = units.size() + K + 2;
-    if (depths > _fewStates.size()) {
-      _manyStates.resize(depths);
-      _states = _manyStates.data();
-    }
-    const auto length = static_cast<std::int64_t>(units.size());
-    for (std::size_t depth = 0; depth < depths; ++depth) {
-      const auto shift = static_cast<std::int64_t>(depth) - static_cast<std::int64_t>(K);
-      // Column c stands for p = shift + c.
-      const std::uint64_t inside = below(length + 1 - shift) & ~below(-shift);
-      const std::uint64_t head = inside & below(static_cast<std::int64_t>(restricted) - shift);
-      _states[depth].valid = (inside * B::kStarts) & ~(head * B::rowStarts(edits + 1, K + 1));
-      const std::uint64_t end = below(length + 1 - shift) & ~below(length - shift);
-      _states[depth].accepting = end * B::kStarts;
-    }
-    if (units.size() + B::kColumns <= 64) {
-      for (std::size_t p = 0; p < units.size(); ++p) {
-        addToTable(units[p], std::uint64_t{1} << (p + K));
-      }
-      _hasTable = true;
-    }
-  }
-
-  BandedPattern(const BandedPattern&) = delete;
-  BandedPattern& operator=(const BandedPattern&) = delete;
-
-  std::size_t length() const noexcept { return _units.size(); }
-
-  /// How many code units of the query a step looks at, and the label of one of them; 0 where there
-  /// is none, or it stands for any.
-  static constexpr unsigned kWindow = B::kColumns;
-  std::uint16_t labelAt(std::size_t depth, unsigned column) const noexcept {
-    const std::size_t p = depth + column - K;
-    return p < _units.size() && !_units[p].any ? _units[p].label : 0;
-  }
-
-  std::uint64_t validAt(std::size_t depth) const noexcept { return _states[depth].valid; }
-  std::uint64_t acceptingAt(std::size_t depth) const noexcept { return _states[depth].accepting; }
+      : Base(units, B::kStarts, [=](std::uint64_t inside, auto before) {
+          const std::uint64_t head = inside & before(static_cast<std::int64_t>(restricted));
+          return (inside * B::kStarts) & ~(head * B::rowStarts(edits + 1, K + 1));
+        }) {}
 
   /// The states before anything is read: nothing is accounted for, and leaving out the head of the
   /// query is not allowed yet.
   std::uint64_t start() const noexcept { return B::inLanes(std::uint64_t{1} << K); }
 
   /// The same, with the head left out as well.
-  std::uint64_t closedStart() const noexcept { return B::closed(start()) & validAt(0); }
+  std::uint64_t closedStart() const noexcept { return B::closed(start()) & Base::validAt(0); }
 
   std::uint64_t step(std::uint64_t states, std::size_t depth, std::uint16_t label) const noexcept {
     return (editedAt(states, depth) | B::closed(matchedAt(states, depth, label))) &
-           _states[depth + 1].valid;
+           Base::validAt(depth + 1);
   }
 
-  /// The two parts of a step apart, for a place whose children share the first; neither is masked
-  /// by what is valid at the next depth. No missing code units follow the second.
+  /// The two parts of a step apart, neither masked by what is valid at the next depth. No missing
+  /// code units follow the second.
   std::uint64_t editedAt(std::uint64_t states, std::size_t depth) const noexcept {
     // The states before anything is read need not be closed.
     return depth == 0 ? B::closed(B::edited(states)) : B::edited(states);
   }
   std::uint64_t matchedAt(std::uint64_t states, std::size_t depth,
                           std::uint16_t label) const noexcept {
-    return B::matched(states, matching(depth, label));
+    return B::matched(states, Base::matching(depth, label));
   }
 
   /// The columns behind which a code unit may match.
@@ -199,62 +155,8 @@ class BandedPattern {
     return B::columnsOf(states);
   }
 
-  /// The bits, in a tree's sets of children, of the labels that match behind a column.
-  std::uint64_t childBits(std::size_t depth, unsigned column) const noexcept {
-    const std::size_t p = depth + column - K;
-    if (p < _units.size() && _units[p].any) {
-      return ~(std::uint64_t{1} << image::kEndBit);
-    }
-    return image::childBit(labelAt(depth, column));
-  }
-
  private:
-  /// Per depth: the states that may be, and those at the end of the query.
-  struct AtDepth {
-    std::uint64_t valid;
-    std::uint64_t accepting;
-  };
-
-  static std::uint64_t below(std::int64_t column) noexcept {
-    if (column <= 0) {
-      return 0;
-    }
-    return column >= B::kColumns ? B::kRow : (std::uint64_t{1} << column) - 1;
-  }
-
-  void addToTable(const QueryUnit& unit, std::uint64_t bit) noexcept {
-    if (unit.any) {
-      for (auto& row : _table) {
-        row |= bit;
-      }
-    } else if (unit.label != 0 && unit.label < image::kRareBit) {
-      _table[unit.label] |= bit;
-    }
-  }
-
-  std::uint64_t matching(std::size_t depth, std::uint16_t label) const noexcept {
-    return _hasTable && label < image::kRareBit ? (_table[label] >> depth) & B::kRow
-                                                : compared(depth, label);
-  }
-
-  std::uint64_t compared(std::size_t depth, std::uint16_t label) const noexcept {
-    std::uint64_t bits = 0;
-    for (unsigned c = 0; c < B::kColumns; ++c) {
-      const std::size_t p = depth + c - K;
-      if (p < _units.size() && _units[p].matches(label)) {
-        bits |= std::uint64_t{1} << c;
-      }
-    }
-    return bits;
-  }
-
-  std::span<const QueryUnit> _units;
-  std::array<AtDepth, 48> _fewStates;
-  std::vector<AtDepth> _manyStates;
-  AtDepth* _states = _fewStates.data();
-  // For queries that fit: bit p + K of a label's row says that it is the query's code unit p.
-  std::uint64_t _table[image::kRareBit] = {};
-  bool _hasTable = false;
+  using Base = QueryPattern<K, B::kColumns>;
 };
 
 }  // namespace wordcatcher

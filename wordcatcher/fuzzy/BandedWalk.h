@@ -16,6 +16,7 @@
 #include <utility>
 #include <vector>
 
+#include "wordcatcher/fuzzy/BandedAutomaton.h"
 #include "wordcatcher/fuzzy/LazyAutomaton.h"
 #include "wordcatcher/storage/LeafTails.h"
 #include "wordcatcher/storage/SearchImage.h"
@@ -119,7 +120,6 @@ class BandedWalk {
   struct LeafWord {
     std::uint32_t place;
     std::uint32_t word;
-    std::size_t depth;
     Number state;
   };
   static constexpr std::size_t kLeafWords = 64;
@@ -146,6 +146,10 @@ class BandedWalk {
       }
       sortOut(depth + 1);
       goOn();
+      if (_automaton.isLarge()) {
+        readLeafWords();
+        _automaton.forgetAllBut(_memory.level, depth + 1);
+      }
     }
     readLeafWords();
     for (const auto& found : _memory.found) {
@@ -256,7 +260,7 @@ class BandedWalk {
     WalkMemory::Place* levelEnd = _memory.nextLevel.roomFor(count);
     WalkMemory::Ending* endingsEnd = _memory.nextEndings.roomFor(count);
     WalkMemory::Reached* leavesEnd = _memory.leaves.roomFor(count);
-    const TreeSlot* slots = _tree.slots.data();
+    const auto slots = _tree.slots;
     for (const auto& reached : _memory.reached) {
       const auto& state = _automaton[reached.state];
       const std::uint32_t index = reached.target & TreeSlot::kIndex;
@@ -264,7 +268,9 @@ class BandedWalk {
       const auto ends = static_cast<std::uint32_t>(reached.children & kEnd);
       const unsigned isWanted = (reached.children & state.wanted) != 0 ? 1 : 0;
       const unsigned isAccepted = state.distance != Automaton::kNotAccepted ? 1 : 0;
-      __builtin_prefetch(slots + (isLeaf != 0 ? 0 : index));
+      // A leaf's flag makes this more than there are slots.
+      const std::uint32_t child = reached.target & (TreeSlot::kLeaf | TreeSlot::kIndex);
+      __builtin_prefetch(slots.data() + (child < slots.size() ? child : 0));
       *leavesEnd = reached;
       leavesEnd += isLeaf;
       *levelEnd = {reached.children & ~kEnd, index + ends, reached.state};
@@ -311,7 +317,7 @@ class BandedWalk {
       } else {
         __builtin_prefetch(&_tree.order[place]);
       }
-      _leafWords[_leafWordCount++] = {place, 0, depth, leaf.state};
+      _leafWords[_leafWordCount++] = {place, 0, leaf.state};
       if (_leafWordCount == kLeafWords) {
         readLeafWords();
       }
@@ -368,18 +374,16 @@ class BandedWalk {
   void readRest(const LeafWord& leaf) {
     const auto labels = _image.labelsOf(leaf.word);
     _budget.spendUnits(labels.size());
-    if (labels.size() < leaf.depth) {
+    const std::size_t length = labels.size();
+    if (length < _automaton[leaf.state].depth) {
       return;
     }
-    Number state = leaf.state;
-    std::size_t depth = leaf.depth;
-    for (; depth < labels.size() && state != Automaton::kDead; ++depth) {
-      const std::uint16_t label = _backward ? labels[labels.size() - 1 - depth] : labels[depth];
-      state = _automaton.next(state, depth, label);
-    }
-    const std::uint32_t distance = _automaton[state].distance;
+    const std::uint32_t distance =
+        _automaton.distanceBehind(leaf.state, length, [this, &labels, length](std::size_t depth) {
+          return _backward ? labels[length - 1 - depth] : labels[depth];
+        });
     if (distance != Automaton::kNotAccepted) {
-      addFound(leaf.place, distance, depth);
+      addFound(leaf.place, distance, length);
     }
   }
 

@@ -7,19 +7,16 @@
 // a set of states gets a number when it is first met, and a step is made once from each for each
 // class of code units: those that match nothing within reach are one class, and each that does is
 // one of its own. All further steps are read from a table. This is the subset construction on
-// demand (Aho, Lam, Sethi, Ullman, "Compilers", section 3.7.4).
+// demand (Aho, Lam, Sethi, Ullman, "Compilers", section 3.7.4). As a state belongs to one depth, a
+// walk that goes level by level may forget those of former depths, when they have become many.
 
 #include <algorithm>
-#include <array>
 #include <bit>
 #include <cstddef>
 #include <cstdint>
-#include <tuple>
 #include <utility>
 #include <vector>
 
-#include "wordcatcher/fuzzy/BandedAutomaton.h"
-#include "wordcatcher/storage/LeafTails.h"
 #include "wordcatcher/storage/SearchImageFormat.h"
 #include "wordcatcher/storage/WalkMemory.h"
 
@@ -47,7 +44,6 @@ class LazyAutomaton {
     _memory.steps.resize(kFewestSlots / 2 * kClasses);
     std::fill_n(_memory.steps.begin(), kClasses, kDead);
     _memory.slots.assign(kFewestSlots, 0);
-    _memory.classes.clear();
   }
 
   /// The state of a set of states of the pattern's after `depth` code units, at which no word ends.
@@ -57,7 +53,7 @@ class LazyAutomaton {
   Number afterInsertion() {
     const std::uint64_t set =
         B::closed(B::inLanes(std::uint64_t{1} << (B::kColumns + K - 1))) & _pattern.validAt(1);
-    return set == 0 ? kDead : numberOf(1, set, distanceOf(1, set, set));
+    return set == 0 ? kDead : numberOf(1, set, distanceOf(1, {set, set}));
   }
 
   /// The state behind a code unit read in another, which is after `depth` code units.
@@ -67,64 +63,78 @@ class LazyAutomaton {
     return to != kUnknown ? to : make(step, from, depth, label);
   }
 
-  /// The same, also beyond the depths of all states that are not dead.
+  /// The same, also beyond the depths of all states but the dead one.
   Number nextAnywhere(Number from, std::size_t depth, std::uint16_t label) {
-    return next(from, std::min(depth, _lastDepth), label);
+    return next(from, std::min(depth, _pattern.length() + K), label);
+  }
+
+  /// The distance of a word that goes on to `length` code units, `labelAt(depth)`, or kNotAccepted.
+  /// Makes no states: what is left of a word is mostly like that of no other.
+  template <typename LabelAt>
+  std::uint32_t distanceBehind(Number from, std::size_t length, LabelAt labelAt) const {
+    const State& state = _memory.states[from];
+    std::size_t depth = state.depth;
+    if (depth == length) {
+      return state.distance;
+    }
+    Step last = {state.set, state.set};
+    for (; depth < length && (last.set & B::kLane) != 0; ++depth) {
+      last = stepOf(last.set, depth, labelAt(depth));
+    }
+    return (last.set & B::kLane) != 0 ? distanceOf(length, last) : kNotAccepted;
+  }
+
+  /// Whether there are so many states that the ones of former depths should be forgotten.
+  bool isLarge() const noexcept { return _memory.states.size() >= kManyStates; }
+
+  /// Forgets all states but those that the places are in, all after `depth` code units, and gives
+  /// these new numbers. Bounds the memory by what the states of one depth take.
+  template <typename Places>
+  void forgetAllBut(Places& places, std::size_t depth) {
+    _memory.former.swap(_memory.states);
+    begin();
+    for (auto& place : places) {
+      const State& state = _memory.former[place.state];
+      place.state = numberOf(depth, state.set, state.distance);
+    }
   }
 
   const State& operator[](Number state) const noexcept { return _memory.states[state]; }
 
  private:
-  static constexpr std::size_t kFewestSlots = 256;
+  static constexpr std::size_t kFewestSlots = K < 2 ? 64 : 256;
+  static constexpr std::size_t kManyStates = 1024;
   static constexpr Number kUnknown = UINT32_MAX;
   static constexpr std::uint64_t kEnd = std::uint64_t{1} << image::kEndBit;
-  /// Labels that match within reach, and all others; a power of two, so that rows are shifted to.
+  /// A label within reach has the class of the first column in which it stands, all others have one
+  /// in common. A power of two, so that rows are shifted to.
   static constexpr std::size_t kClasses = std::bit_ceil(Pattern::kWindow + 1U);
-  static_assert(Pattern::kWindow <=
-                std::tuple_size_v<decltype(AutomatonMemory::Classes::ofColumn)>);
 
-  std::uint8_t classOf(std::size_t depth, std::uint16_t label) const noexcept {
-    return label < image::kRareBit ? _memory.classes[depth].ofLabel[label]
-                                   : classOfRare(depth, label);
+  /// The first column with the label, or one behind the last.
+  std::size_t classOf(std::size_t depth, std::uint16_t label) const noexcept {
+    constexpr std::uint64_t kNone = std::uint64_t{1} << Pattern::kWindow;
+    return static_cast<std::size_t>(std::countr_zero(_pattern.labelColumns(depth, label) | kNone));
   }
 
-  std::uint8_t classOfRare(std::size_t depth, std::uint16_t label) const noexcept {
-    for (unsigned column = 0; column < Pattern::kWindow; ++column) {
-      if (_pattern.labelAt(depth, column) == label) {
-        return _memory.classes[depth].ofColumn[column];
-      }
-    }
-    return 0;
-  }
+  /// What a step leads to. `unclosed`: without what only leaving out code units behind the last one
+  /// read leads to.
+  struct Step {
+    std::uint64_t set;
+    std::uint64_t unclosed;
+  };
 
-  /// For one more depth.
-  void addClasses() {
-    const std::size_t depth = _memory.classes.size();
-    _lastDepth = depth;
-    auto& classes = _memory.classes.emplace_back();
-    std::uint8_t last = 0;
-    for (unsigned column = 0; column < Pattern::kWindow; ++column) {
-      const std::uint16_t label = _pattern.labelAt(depth, column);
-      if (label == 0) {
-        continue;
-      }
-      const std::uint8_t known = classOf(depth, label);
-      classes.ofColumn[column] = known != 0 ? known : ++last;
-      if (label < image::kRareBit) {
-        classes.ofLabel[label] = classes.ofColumn[column];
-      }
-    }
+  Step stepOf(std::uint64_t set, std::size_t depth, std::uint16_t label) const noexcept {
+    const std::uint64_t byEdit = _pattern.editedAt(set, depth);
+    const std::uint64_t match = _pattern.matchedAt(set, depth, label);
+    return {(byEdit | B::closed(match)) & _pattern.validAt(depth + 1), byEdit | match};
   }
 
   [[gnu::noinline]] Number make(std::size_t step, Number from, std::size_t depth,
                                 std::uint16_t label) {
-    const std::uint64_t set = _memory.states[from].set;
-    const std::uint64_t byEdit = _pattern.editedAt(set, depth);
-    const std::uint64_t match = _pattern.matchedAt(set, depth, label);
-    const std::uint64_t next = (byEdit | B::closed(match)) & _pattern.validAt(depth + 1);
-    const Number to = (next & B::kLane) == 0
+    const Step made = stepOf(_memory.states[from].set, depth, label);
+    const Number to = (made.set & B::kLane) == 0
                           ? kDead
-                          : numberOf(depth + 1, next, distanceOf(depth + 1, next, byEdit | match));
+                          : numberOf(depth + 1, made.set, distanceOf(depth + 1, made));
     _memory.steps[step] = to;
     return to;
   }
@@ -137,14 +147,13 @@ class LazyAutomaton {
     std::fill_n(_memory.steps.begin() + static_cast<std::ptrdiff_t>(first), kClasses, kUnknown);
   }
 
-  /// The distance at the end of a word. `unclosed`: the states without those that only leaving out
-  /// code units behind the last one read leads to.
-  std::uint32_t distanceOf(std::size_t depth, std::uint64_t set,
-                           std::uint64_t unclosed) const noexcept {
+  /// The distance at the end of a word.
+  std::uint32_t distanceOf(std::size_t depth, const Step& last) const noexcept {
     const std::uint64_t accepting = _pattern.acceptingAt(depth);
-    std::uint64_t accepted = set & accepting & B::kLane;
+    std::uint64_t accepted = last.set & accepting & B::kLane;
     if constexpr (Lanes == 2) {
-      accepted = accepted == 0 ? 0 : ((_backward ? unclosed : set) & accepting) >> B::kLaneBits;
+      const std::uint64_t ofWhole = _backward ? last.unclosed : last.set;
+      accepted = accepted == 0 ? 0 : (ofWhole & accepting) >> B::kLaneBits;
     }
     return accepted == 0 ? kNotAccepted : B::distanceOf(accepted);
   }
@@ -156,9 +165,6 @@ class LazyAutomaton {
     Number& slot = slotOf(depth, set, distance);
     if (slot == 0) {
       slot = static_cast<Number>(_memory.states.size());
-      while (_memory.classes.size() <= depth) {
-        addClasses();
-      }
       const std::uint64_t byEdit = _pattern.editedAt(set, depth) & _pattern.validAt(depth + 1);
       const std::uint64_t wanted = (byEdit & B::kLane) != 0 ? ~kEnd : matchingChildren(depth, set);
       const auto [least, most] = restOf(depth, set);
@@ -191,20 +197,21 @@ class LazyAutomaton {
 
   /// The labels that lead on from a set of states without an edit.
   std::uint64_t matchingChildren(std::size_t depth, std::uint64_t set) const {
-    const std::uint64_t columns = _pattern.matchableColumns(set);
     std::uint64_t children = 0;
-    for (unsigned column = 0; column < Pattern::kWindow; ++column) {
-      children |= _pattern.childBits(depth, column) & -(columns >> column & 1);
+    for (std::uint64_t columns = _pattern.matchableColumns(set); columns != 0;
+         columns &= columns - 1) {
+      children |= _pattern.childBits(depth, static_cast<unsigned>(std::countr_zero(columns)));
     }
     return children;
   }
 
   Number& slotOf(std::size_t depth, std::uint64_t set, std::uint32_t distance) {
-    // Knuth's multiplicative hashing, see NumberIndex.h.
+    // Knuth's multiplicative hashing, see NumberIndex.h. The highest bits depend on all of them:
+    // the same set at many depths must not meet itself.
     constexpr std::uint64_t kGoldenRatio = 0x9E3779B97F4A7C15;
     auto& slots = _memory.slots;
-    const std::uint64_t mixed = (set ^ (std::uint64_t{depth} << 48U)) * kGoldenRatio;
-    std::size_t slot = (mixed >> 32U) & (slots.size() - 1);
+    const std::uint64_t mixed = (set ^ depth * kGoldenRatio) * kGoldenRatio;
+    std::size_t slot = mixed >> std::countl_zero(slots.size() - 1);
     for (; slots[slot] != 0; slot = (slot + 1) & (slots.size() - 1)) {
       const State& state = _memory.states[slots[slot]];
       if (state.set == set && state.depth == depth && state.distance == distance) {
@@ -225,7 +232,6 @@ class LazyAutomaton {
   const Pattern& _pattern;
   bool _backward;
   AutomatonMemory& _memory;
-  std::size_t _lastDepth = 0;  // that has classes
 };
 
 }  // namespace wordcatcher

@@ -94,7 +94,7 @@ void forEachWordAlong(const SearchImage& image, bool backward,
 /// the least edits that their limits allow, so a word that both meet has the lesser of its two
 /// counts: with all edits in reach of one half, that is the distance.
 template <unsigned K>
-void searchWithin(const SearchImage& image, const std::vector<std::uint16_t>& labels, bool swaps,
+void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units, bool swaps,
                   std::vector<NearWord>& found) {
   constexpr std::size_t kMinSplitLength = 2 + 2 * std::size_t{K};
   const auto accept = [&found](std::uint32_t word, std::uint32_t edits, std::size_t) {
@@ -102,17 +102,17 @@ void searchWithin(const SearchImage& image, const std::vector<std::uint16_t>& la
   };
   const auto memory = image.lendWalkMemory();
   using Walk = BandedWalk<K, 1, SwapPattern<K>>;
-  if (labels.size() < kMinSplitLength) {
-    const SwapPattern<K> whole(labels, swaps, 0, K);
+  if (units.size() < kMinSplitLength) {
+    const SwapPattern<K> whole(units, swaps, 0, K);
     Walk(image, image.forward(), false, whole, *memory).run(whole.start(), accept);
     return;
   }
   constexpr unsigned kInFirst = K / 2;
   constexpr unsigned kInSecond = K - kInFirst - 1;
-  const std::size_t half = (labels.size() + kInFirst - kInSecond) / 2;
-  const std::vector<std::uint16_t> reversed(labels.rbegin(), labels.rend());
-  const SwapPattern<K> first(labels, swaps, half, kInFirst);
-  const SwapPattern<K> second(reversed, swaps, labels.size() - half, kInSecond);
+  const std::size_t half = (units.size() + kInFirst - kInSecond) / 2;
+  const std::vector<QueryUnit> reversed(units.rbegin(), units.rend());
+  const SwapPattern<K> first(units, swaps, half, kInFirst);
+  const SwapPattern<K> second(reversed, swaps, units.size() - half, kInSecond);
   Walk(image, image.forward(), false, first, *memory).run(first.start(), accept);
   Walk(image, image.backward(), true, second, *memory).run(second.start(), accept);
 }
@@ -125,7 +125,7 @@ std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view wo
   if (word.empty()) {
     return found;
   }
-  const auto labels = labelsOf(image, word);
+  const auto units = unitsOf(image, word);
   switch (maxEdits) {
     case 0:
       if (const auto same = exactWord(image, word)) {
@@ -133,13 +133,13 @@ std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view wo
       }
       return found;
     case 1:
-      searchWithin<1>(image, labels, transpositions, found);
+      searchWithin<1>(image, units, transpositions, found);
       break;
     case 2:
-      searchWithin<2>(image, labels, transpositions, found);
+      searchWithin<2>(image, units, transpositions, found);
       break;
     default:
-      searchWithin<3>(image, labels, transpositions, found);
+      searchWithin<3>(image, units, transpositions, found);
       break;
   }
   std::sort(found.begin(), found.end(), [](const NearWord& a, const NearWord& b) {

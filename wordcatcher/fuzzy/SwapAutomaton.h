@@ -12,14 +12,12 @@
 //
 // The extension is that of Oflazer, "Error-tolerant finite-state recognition" (1996), in bits.
 
-#include <array>
-#include <bit>
 #include <cstddef>
 #include <cstdint>
 #include <span>
-#include <vector>
 
 #include "wordcatcher/fuzzy/BandedAutomaton.h"
+#include "wordcatcher/fuzzy/QueryPattern.h"
 
 namespace wordcatcher {
 
@@ -92,123 +90,47 @@ struct SwapBand {
 /// A query prepared for simulation at up to K edits, the head as free to be left out as the rest;
 /// with `swaps` false it is the plain Levenshtein automaton.
 template <unsigned K>
-class SwapPattern {
+class SwapPattern : public QueryPattern<K, SwapBand<K>::kColumns + 1> {
  public:
   using B = SwapBand<K>;
 
   /// `restricted` code units at the head may only be passed with at most `edits` edits; a swap of
-  /// the last of them with the one behind is not held against them.
-  SwapPattern(std::span<const std::uint16_t> labels, bool swaps, std::size_t restricted,
-              unsigned edits)
-      : _labels(labels), _swaps(swaps) {
-    const std::size_t depths = labels.size() + K + 2;
-    if (depths > _fewStates.size()) {
-      _manyStates.resize(depths);
-      _states = _manyStates.data();
-    }
-    const auto length = static_cast<std::int64_t>(labels.size());
-    for (std::size_t depth = 0; depth < depths; ++depth) {
-      const auto shift = static_cast<std::int64_t>(depth) - static_cast<std::int64_t>(K);
-      const auto head = static_cast<std::int64_t>(restricted) - shift;
-      const std::uint64_t inside = below(length + 1 - shift) & ~below(-shift);
-      const std::uint64_t plain = (inside * Plain::kStarts) &
-                                  ~((inside & below(head)) * Plain::rowStarts(edits + 1, K + 1));
-      const std::uint64_t swapping =
-          swaps ? (inside * B::kSwapStarts) &
-                      ~((inside & below(head - 1)) * Plain::rowStarts(edits, K))
-                : 0;
-      _states[depth].valid = plain | swapping << B::kPlainBits;
-      const std::uint64_t end = below(length + 1 - shift) & ~below(length - shift);
-      _states[depth].accepting = end * Plain::kStarts;
-    }
-    if (labels.size() + B::kColumns < 64) {
-      for (std::size_t p = 0; p < labels.size(); ++p) {
-        if (labels[p] != 0 && labels[p] < image::kRareBit) {
-          _table[labels[p]] |= std::uint64_t{1} << (p + K);
-        }
-      }
-      _hasTable = true;
-    }
+  /// the last of them with the one behind is not held against them. The units must live as long as
+  /// this does.
+  SwapPattern(std::span<const QueryUnit> units, bool swaps, std::size_t restricted, unsigned edits)
+      : Base(units, Plain::kStarts,
+             [=, head = static_cast<std::int64_t>(restricted)](std::uint64_t inside, auto before) {
+               const std::uint64_t plain =
+                   (inside * Plain::kStarts) &
+                   ~((inside & before(head)) * Plain::rowStarts(edits + 1, K + 1));
+               const std::uint64_t swapping =
+                   (inside * B::kSwapStarts) &
+                   ~((inside & before(head - 1)) * Plain::rowStarts(edits, K));
+               return plain | (swaps ? swapping << B::kPlainBits : 0);
+             }) {}
+
+  std::uint64_t start() const noexcept {
+    return B::closed(std::uint64_t{1} << K) & Base::validAt(0);
   }
 
-  SwapPattern(const SwapPattern&) = delete;
-  SwapPattern& operator=(const SwapPattern&) = delete;
-
-  std::size_t length() const noexcept { return _labels.size(); }
-
-  /// How many code units of the query a step looks at, and the label of one of them; 0 where there
-  /// is none.
-  static constexpr unsigned kWindow = B::kColumns + 1;
-  std::uint16_t labelAt(std::size_t depth, unsigned column) const noexcept {
-    const std::size_t p = depth + column - K;
-    return p < _labels.size() ? _labels[p] : 0;
-  }
-
-  std::uint64_t validAt(std::size_t depth) const noexcept { return _states[depth].valid; }
-  std::uint64_t acceptingAt(std::size_t depth) const noexcept { return _states[depth].accepting; }
-
-  std::uint64_t start() const noexcept { return B::closed(std::uint64_t{1} << K) & validAt(0); }
-  std::uint64_t step(std::uint64_t states, std::size_t depth, std::uint16_t label) const noexcept {
-    return (editedAt(states, depth) | B::closed(matchedAt(states, depth, label))) &
-           _states[depth + 1].valid;
-  }
+  /// The two parts of a step; see BandedPattern.
   std::uint64_t editedAt(std::uint64_t states, std::size_t) const noexcept {
     return B::edited(states);
   }
   std::uint64_t matchedAt(std::uint64_t states, std::size_t depth,
                           std::uint16_t label) const noexcept {
-    return B::matched(states, matching(depth, label));
+    return B::matched(states, Base::matching(depth, label));
   }
 
-  /// The columns behind which a code unit may match.
+  /// The columns behind which a code unit may match, or complete a swap. Where one may begin, an
+  /// edit leads on as well.
   std::uint64_t matchableColumns(std::uint64_t states) const noexcept {
-    const std::uint64_t columns = B::columnsOf(states);
-    return columns | B::swapColumnsOf(states) | (_swaps ? columns << 1 : 0);
-  }
-
-  /// The bits, in a tree's sets of children, of the labels that match behind a column.
-  std::uint64_t childBits(std::size_t depth, unsigned column) const noexcept {
-    return image::childBit(labelAt(depth, column));
+    return B::columnsOf(states) | B::swapColumnsOf(states);
   }
 
  private:
+  using Base = QueryPattern<K, B::kColumns + 1>;
   using Plain = Band<K>;
-
-  /// Per depth: the states that may be, and those at the end of the query.
-  struct AtDepth {
-    std::uint64_t valid;
-    std::uint64_t accepting;
-  };
-
-  static std::uint64_t below(std::int64_t column) noexcept {
-    if (column <= 0) {
-      return 0;
-    }
-    return column >= B::kColumns ? Plain::kRow : (std::uint64_t{1} << column) - 1;
-  }
-
-  std::uint64_t matching(std::size_t depth, std::uint16_t label) const noexcept {
-    if (_hasTable && label < image::kRareBit) {
-      return (_table[label] >> depth) & ((std::uint64_t{1} << (B::kColumns + 1)) - 1);
-    }
-    std::uint64_t bits = 0;
-    for (unsigned c = 0; c <= B::kColumns; ++c) {
-      const std::size_t p = depth + c - K;
-      if (p < _labels.size() && _labels[p] == label && label != 0) {
-        bits |= std::uint64_t{1} << c;
-      }
-    }
-    return bits;
-  }
-
-  std::span<const std::uint16_t> _labels;
-  bool _swaps;
-  std::array<AtDepth, 48> _fewStates;
-  std::vector<AtDepth> _manyStates;
-  AtDepth* _states = _fewStates.data();
-  // For queries that fit: bit p + K of a label's row says that it is the query's code unit p.
-  std::uint64_t _table[image::kRareBit] = {};
-  bool _hasTable = false;
 };
 
 }  // namespace wordcatcher

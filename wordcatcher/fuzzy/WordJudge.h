@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "wordcatcher/fuzzy/BandedAutomaton.h"
+#include "wordcatcher/fuzzy/QueryPattern.h"
 #include "wordcatcher/storage/SearchImage.h"
 
 namespace wordcatcher {
@@ -50,15 +51,6 @@ class WordJudge {
   }
 
  private:
-  static std::vector<QueryUnit> unitsOf(const SearchImage& image, std::u16string_view query) {
-    std::vector<QueryUnit> units;
-    units.reserve(query.size());
-    for (const char16_t unit : query) {
-      units.push_back({.label = image.labelOf(unit)});
-    }
-    return units;
-  }
-
   const SearchImage& _image;
   std::uint32_t _maxDistance;
   std::vector<QueryUnit> _units;

@@ -40,7 +40,8 @@ namespace wordcatcher {
 /// 64 bytes for each code unit of its longest word, 32 for each byte of the text and 64 for each
 /// posting of the words that it finds (a word without any counts as one), and, whatever the text,
 /// 512 KB and 16 bytes for each word of the index. find() needs 512 bytes for each word of the text
-/// more; what it finds are the words within the edit limits.
+/// more; what it finds are the words within the edit limits. An index keeps memory of its queries
+/// for the next ones: at most 1 MB for each of those that run at once, and 8 MB in all.
 class WORDCATCHER_EXPORT Index {
  public:
   /// How an index file gets into memory.

@@ -162,7 +162,9 @@ bool Pairing::pairEachByItself() {
   for (std::size_t w = _words.size(); w-- > 0;) {
     if (w + 1 < _words.size()) {
       for (std::uint32_t i = _words[w].firstOption; i < _words[w].endOption; ++i) {
-        _onward[i] = bestOnward(_words[w + 1], i);
+        if (_options[i].gain() == _words[w].bestGain) {
+          _onward[i] = bestOnward(_words[w + 1], i);
+        }
       }
     }
     rankOnward(_words[w]);

@@ -9,7 +9,7 @@ namespace {
 
 /// The place at which a thread begins to look, so that each mostly has one to itself.
 std::size_t firstPlace() {
-  // Numbers of threads are addresses, of which the lowest bits are alike.
+  // The hash may be the number itself, which is an address: the lowest bits are alike.
   const std::size_t number = std::hash<std::thread::id>()(std::this_thread::get_id());
   return number ^ number >> 12U;
 }

@@ -31,19 +31,13 @@ struct AutomatonMemory {
     std::uint32_t depth = 0;
   };
 
-  /// After so many code units, the class of each common label, and of the label in each column.
-  struct Classes {
-    std::array<std::uint8_t, image::kRareBit + 1> ofLabel = {};
-    std::array<std::uint8_t, 16> ofColumn = {};
-  };
-
   std::vector<State> states;
+  std::vector<State> former;         // while the states that are still needed get new numbers
   std::vector<std::uint32_t> steps;  // a row for each state
-  std::vector<Classes> classes;      // by depth
   std::vector<std::uint32_t> slots;  // hash table of the states; 0: free
 
   std::size_t bytes() const noexcept {
-    return states.capacity() * sizeof(State) + classes.capacity() * sizeof(Classes) +
+    return (states.capacity() + former.capacity()) * sizeof(State) +
            (steps.capacity() + slots.capacity()) * sizeof(std::uint32_t);
   }
 };
@@ -75,6 +69,8 @@ class WalkList {
     std::swap(_size, other._size);
   }
   std::size_t size() const noexcept { return _size; }
+  Element* begin() noexcept { return _elements.data(); }
+  Element* end() noexcept { return _elements.data() + _size; }
   const Element* begin() const noexcept { return _elements.data(); }
   const Element* end() const noexcept { return _elements.data() + _size; }
   std::size_t bytes() const noexcept { return _elements.capacity() * sizeof(Element); }
