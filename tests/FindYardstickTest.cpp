@@ -245,11 +245,8 @@ TEST(FindYardstickTest, ExplainsEveryValueAsItIsFound) {
   }
 }
 
-/// A name like those that people ask for, of few letters, so that much is near to much.
-rc::Gen<std::string> anyRow(std::size_t most) {
-  const auto word =
-      rc::gen::element<std::string>("a", "b", "ab", "ba", "abc", "bac", "abcab", "abcba", "cab",
-                                    "bc", "12", "a1", "a12", "É", "abé");
+/// Up to so many words.
+rc::Gen<std::string> rowsOf(const rc::Gen<std::string>& word, std::size_t most) {
   return rc::gen::map(
       rc::gen::resize(static_cast<int>(most), rc::gen::container<std::vector<std::string>>(word)),
       [](const std::vector<std::string>& words) {
@@ -259,6 +256,14 @@ rc::Gen<std::string> anyRow(std::size_t most) {
         }
         return row;
       });
+}
+
+/// A name like those that people ask for, of few letters, so that much is near to much.
+rc::Gen<std::string> anyRow(std::size_t most) {
+  const auto word =
+      rc::gen::element<std::string>("a", "b", "ab", "ba", "abc", "bac", "abcab", "abcba", "cab",
+                                    "bc", "12", "a1", "a12", "É", "abé");
+  return rowsOf(word, most);
 }
 
 rc::Gen<FindOptions> anyOptions() {
@@ -324,15 +329,7 @@ rc::Gen<std::string> anySounds(std::size_t most) {
   const auto word =
       rc::gen::element<std::string>("Catherine", "Kathryn", "thorn", "tarn", "knee", "nie",
                                     "Xavier", "the", "U.S", "d’Ivoire", "h", "a1", "É", "沖");
-  return rc::gen::map(
-      rc::gen::resize(static_cast<int>(most), rc::gen::container<std::vector<std::string>>(word)),
-      [](const std::vector<std::string>& words) {
-        std::string row;
-        for (const auto& each : words) {
-          row += (row.empty() ? "" : " ") + each;
-        }
-        return row;
-      });
+  return rowsOf(word, most);
 }
 
 TEST(FindYardstickTest, Codes) {

@@ -11,9 +11,9 @@ PROGRAM = Path(__file__).parents[2] / "bench" / "python_find_many.py"
 
 @pytest.fixture
 def bench() -> ModuleType:
-    spec = importlib.util.spec_from_file_location("python_find_many", PROGRAM)
-    module = importlib.util.module_from_spec(spec)
-    spec.loader.exec_module(module)
+    source = importlib.util.spec_from_file_location("python_find_many", PROGRAM)
+    module = importlib.util.module_from_spec(source)
+    source.loader.exec_module(module)
     return module
 
 
