@@ -121,8 +121,7 @@ static void every_option_counts(const wordcatcher_index* index) {
 
 static void whole_texts_have_edits_of_their_own(void) {
   build_places(file("whole.wci"), WORDCATCHER_MODE_WHOLE_TEXT);
-  wordcatcher_index* index = NULL;
-  CHECK(wordcatcher_index_open(file("whole.wci"), NULL, &index, NULL) == WORDCATCHER_OK);
+  wordcatcher_index* index = opened("whole.wci");
   wordcatcher_find_options options;
   wordcatcher_find_options_init(&options, sizeof options);
   CHECK(count(index, "New Zeeelend", &options) == 1);
@@ -139,8 +138,7 @@ static void numbers_have_edits_of_their_own(void) {
                                 NULL) == WORDCATCHER_OK);
   CHECK(wordcatcher_builder_commit(builder, NULL, NULL) == WORDCATCHER_OK);
   wordcatcher_builder_free(builder);
-  wordcatcher_index* index = NULL;
-  CHECK(wordcatcher_index_open(file("rooms.wci"), NULL, &index, NULL) == WORDCATCHER_OK);
+  wordcatcher_index* index = opened("rooms.wci");
   wordcatcher_find_options options;
   wordcatcher_find_options_init(&options, sizeof options);
   CHECK(count(index, "b118", &options) == 0);

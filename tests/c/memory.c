@@ -116,8 +116,7 @@ static wordcatcher_code attempt_commit(struct scene* scene, wordcatcher_error* e
   if (code != WORDCATCHER_OK) {
     fail_allocations_after(-1);
     CHECK(wordcatcher_builder_phrase_count(scene->builder) == phrases);
-    wordcatcher_index* index = NULL;
-    CHECK(wordcatcher_index_open(file("dogs.wci"), NULL, &index, NULL) == WORDCATCHER_OK);
+    wordcatcher_index* index = opened("dogs.wci");
     wordcatcher_info info;
     CHECK(wordcatcher_index_info(index, &info, sizeof info, NULL) == WORDCATCHER_OK);
     CHECK(info.phrases == 5);

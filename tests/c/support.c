@@ -92,13 +92,17 @@ void build_places(const char* path, int32_t mode) {
   wordcatcher_builder_free(builder);
 }
 
-wordcatcher_index* places(void) {
-  build_places(file("places.wci"), WORDCATCHER_MODE_WORDS);
+wordcatcher_index* opened(const char* name) {
   wordcatcher_index* index = NULL;
   wordcatcher_error error;
-  if (wordcatcher_index_open(file("places.wci"), NULL, &index, &error) != WORDCATCHER_OK) {
+  if (wordcatcher_index_open(file(name), NULL, &index, &error) != WORDCATCHER_OK) {
     fprintf(stderr, "%s\n", error.message);
     exit(2);
   }
   return index;
+}
+
+wordcatcher_index* places(void) {
+  build_places(file("places.wci"), WORDCATCHER_MODE_WORDS);
+  return opened("places.wci");
 }

@@ -36,6 +36,9 @@ void write_file(const char* path, const char* bytes, size_t length);
 /* Writes an index of places in this mode, with data strings such as "New Zealand{ NZ }". */
 void build_places(const char* path, int32_t mode);
 
+/* The index in a file of the tests' directory; ends the program if there is none. */
+wordcatcher_index* opened(const char* name);
+
 /* The same, opened. */
 wordcatcher_index* places(void);
 
