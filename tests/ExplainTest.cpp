@@ -140,6 +140,10 @@ TEST(ExplainTest, TellsWhatWasJoined) {
   EXPECT_EQ(joined.cost, 1U);
   EXPECT_TRUE(joined.missing.empty());
   EXPECT_NE(joined.toText().find("Paired: wonlost with won lost, 1 edit\n"), std::string::npos);
+  const auto wrongKey = index.explain("wonvlost", "won-lost");
+  EXPECT_EQ(wrongKey.pairs, (std::vector<FoundWord>{{0, 8, "won lost", 1}}));
+  EXPECT_EQ(wrongKey.cost, 1U);
+  EXPECT_TRUE(wrongKey.isFound);
   const auto split = index.explain("a rail way", "railway");
   EXPECT_EQ(split.pairs, (std::vector<FoundWord>{{2, 10, "railway", 1}}));
   EXPECT_EQ(split.surplus, Values{"a"});

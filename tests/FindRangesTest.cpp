@@ -136,6 +136,45 @@ TEST(FindRangesTest, JoinedWordsHaveTheRangeOfBoth) {
   EXPECT_EQ(joined[0].hits[0].word, "fish and");
 }
 
+TEST(FindRangesTest, AWrongKeyForTheSpace) {
+  const auto index = indexOfPhrases({"railway station", "fish and chips", "oak"});
+  const auto joined = index.find("The fishnand chips").matches;
+  ASSERT_EQ(joined.size(), 1U);
+  EXPECT_EQ(joined[0].cost, 3U) << "one edit and a word left over";
+  EXPECT_EQ(joined[0].hits, (std::vector<FoundWord>{{4, 12, "fish and", 1}, {13, 18, "chips", 0}}));
+  const auto split = index.find("rai way station").matches;
+  ASSERT_EQ(split.size(), 1U);
+  EXPECT_EQ(split[0].cost, 1U);
+  EXPECT_EQ(split[0].hits, (std::vector<FoundWord>{{0, 7, "railway", 1}, {8, 15, "station", 0}}));
+  EXPECT_TRUE(index.find("o k").matches.empty()) << "short words are too many things";
+}
+
+TEST(FindRangesTest, ALetterForTheSpaceNeedsTwoEdits) {
+  const auto index = indexOfPhrases({"gold fish", "goldxrisch", "omega 6", "a1b2c3d"});
+  const auto firstForOneEdit = [&index](std::string_view text, const EditLimits& limits) {
+    FindOptions options;
+    options.edits = limits;
+    const auto matches = index.find(text, options).matches;
+    return !matches.empty() && matches[0].cost == 1 ? matches[0].value : "";
+  };
+  EXPECT_EQ(firstForOneEdit("goldnfish", {}), "gold fish");
+  EXPECT_EQ(firstForOneEdit("goldnfish", {2, 5, 0, 1, 1}), "");
+  EXPECT_EQ(firstForOneEdit("goldnfish", {2, 9, 0, 0, 2}), "");
+  EXPECT_EQ(firstForOneEdit("gold risch", {}), "goldxrisch");
+  EXPECT_EQ(firstForOneEdit("gold risch", {2, 5, 0, 0, 1}), "");
+  EXPECT_EQ(firstForOneEdit("gold risch", {2, 10, 0, 0, 2}), "");
+  // Numbers are no other numbers.
+  const EditLimits ofNumbers = {2, 5, 0, 1, 2, 3, 2};
+  for (const std::string_view text : {"omegax6", "omega76"}) {
+    EXPECT_EQ(firstForOneEdit(text, {}), "");
+    EXPECT_EQ(firstForOneEdit(text, ofNumbers), "omega 6");
+  }
+  for (const std::string_view text : {"a1b c3d", "a1 2c3d"}) {
+    EXPECT_EQ(firstForOneEdit(text, {}), "");
+    EXPECT_EQ(firstForOneEdit(text, ofNumbers), "a1b2c3d");
+  }
+}
+
 TEST(FindRangesTest, WholeTextsAreOneHit) {
   const auto index = indexOfPhrases({"Rhône, at Lyon"}, MatchingMode::wholeText);
   EXPECT_EQ(firstIn(index, "rhone at lyon"),

@@ -138,7 +138,9 @@ TEST_F(HostileFindTest, WordsThatRepeatEachOtherAreNotMultiplied) {
   forged.set(SectionKind::backwardTree, std::vector<image::TreeSlot>{root, leaf});
   forged.header().wordCount = kWords;
   // Beyond the time that a test has if each beginning meets each end.
-  EXPECT_TRUE(wordsJoinedIn(*SearchImage::fromBytes(forged.bytes()), u"aaa").empty());
+  const auto image = SearchImage::fromBytes(forged.bytes());
+  EXPECT_TRUE(wordsJoinedIn(*image, u"aaa", Seam::none).empty());
+  EXPECT_EQ(wordsJoinedIn(*image, u"aaa", Seam::unit).size(), 1U);
   EXPECT_TRUE(open(forged).find("aaa").matches.empty());
 }
 

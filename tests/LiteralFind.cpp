@@ -33,6 +33,18 @@ std::uint32_t limitByLength(std::u16string_view word, const EditLimits& limits) 
   return word.size() <= limits.mediumLength ? limits.mediumEdits : limits.longEdits;
 }
 
+/// Whether two words are one, or would be with some unit for the space between them, which is
+/// looked for in words of at least two edits.
+bool areOne(std::u16string_view head, std::u16string_view tail, std::u16string_view word,
+            const EditLimits& limits) {
+  if (word.size() != head.size() + tail.size() + 1) {
+    return word == std::u16string(head) + std::u16string(tail);
+  }
+  const bool isNumber = namesNumber(head) || namesNumber(tail) || namesNumber(word);
+  return word.substr(0, head.size()) == head && word.substr(head.size() + 1) == tail &&
+         limitByLength(word, limits) >= 2 && (!isNumber || limits.numberEdits >= 2);
+}
+
 std::size_t bytesOf(std::u16string_view text) { return toUtf8(text).value().size(); }
 
 std::vector<std::u16string_view> tokensOf(std::u16string_view text) {
@@ -164,10 +176,12 @@ std::vector<LiteralFind::Pair> LiteralFind::waysToPair(const Phrase& phrase,
       if (mayPair(phrase[i], text[j].word, edits, limits)) {
         ways.push_back({i, 1, j, 1, edits});
       }
-      if (joins && i + 1 < phrase.size() && phrase[i] + phrase[i + 1] == text[j].word) {
+      if (joins && i + 1 < phrase.size() &&
+          areOne(phrase[i], phrase[i + 1], text[j].word, limits)) {
         ways.push_back({i, 2, j, 1, 1});
       }
-      if (joins && j + 1 < text.size() && text[j].word + text[j + 1].word == phrase[i]) {
+      if (joins && j + 1 < text.size() &&
+          areOne(text[j].word, text[j + 1].word, phrase[i], limits)) {
         ways.push_back({i, 1, j, 2, 1});
       }
     }

@@ -10,6 +10,7 @@
 #include <random>
 #include <set>
 #include <string>
+#include <tuple>
 #include <vector>
 
 #include "LiteralFind.h"
@@ -85,32 +86,56 @@ class Words {
     }
   }
 
-  /// The number of ways to write the word as two.
+  /// The number of ways to write the word as two, some unit of it standing for the space or none.
   std::size_t expectJoined(const std::u16string& query) const {
-    std::vector<std::pair<std::u16string, std::u16string>> expected;
-    for (std::size_t length = 1; length < query.size(); ++length) {
-      const auto head = query.substr(0, length);
-      const auto tail = query.substr(length);
-      if (std::binary_search(_words.begin(), _words.end(), head) &&
-          std::binary_search(_words.begin(), _words.end(), tail)) {
-        expected.emplace_back(head, tail);
+    std::size_t ways = 0;
+    for (const Seam most : {Seam::none, Seam::unit}) {
+      std::set<std::tuple<std::u16string, std::u16string, Seam>> expected;
+      for (const Seam seam : {Seam::none, most}) {
+        const std::size_t gap = seam == Seam::unit ? 1 : 0;
+        for (std::size_t length = 1; length + gap < query.size(); ++length) {
+          const auto head = query.substr(0, length);
+          const auto tail = query.substr(length + gap);
+          if (has(head) && has(tail)) {
+            expected.emplace(head, tail, seam);
+          }
+        }
+      }
+      std::set<std::tuple<std::u16string, std::u16string, Seam>> found;
+      const auto joined = wordsJoinedIn(*_image, query, most);
+      for (const JoinedWords& each : joined) {
+        found.emplace(_image->textOf(each.head), _image->textOf(each.tail), each.seam);
+      }
+      EXPECT_EQ(found.size(), joined.size()) << "each once: " << displayUtf8(query);
+      EXPECT_TRUE(found == expected) << displayUtf8(query);
+      ways += expected.size();
+    }
+    return ways;
+  }
+
+  /// The number of words that are two others and a unit between them.
+  std::size_t expectBetween(std::u16string_view head, std::u16string_view tail) const {
+    std::vector<std::u16string> expected;
+    for (const auto& word : _words) {
+      if (word.size() == head.size() + 1 + tail.size() && word.starts_with(head) &&
+          word.ends_with(tail)) {
+        expected.push_back(word);
       }
     }
-    std::vector<std::pair<std::u16string, std::u16string>> found;
-    for (const auto& [head, tail] : wordsJoinedIn(*_image, query)) {
-      found.emplace_back(_image->textOf(head), _image->textOf(tail));
+    std::vector<std::u16string> found;
+    for (const std::uint32_t word : wordsWithUnitBetween(*_image, head, tail)) {
+      found.emplace_back(_image->textOf(word));
     }
     std::sort(found.begin(), found.end());
-    std::sort(expected.begin(), expected.end());
-    EXPECT_TRUE(found == expected) << displayUtf8(query);
+    EXPECT_TRUE(found == expected) << displayUtf8(head) << " and " << displayUtf8(tail);
     return expected.size();
   }
 
-  std::size_t joinedWays(const std::u16string& query) const {
-    return wordsJoinedIn(*_image, query).size();
+ private:
+  bool has(const std::u16string& word) const {
+    return std::binary_search(_words.begin(), _words.end(), word);
   }
 
- private:
   std::vector<std::u16string> _words;
   std::shared_ptr<const SearchImage> _image;
 };
@@ -267,6 +292,7 @@ TEST(NearWordsTest, NoWordsAtAll) {
   for (const std::u16string_view query : {u"", u"a", u"abcdefghijklmnop"}) {
     none.expectExact(query);
     none.expectJoined(std::u16string(query));
+    none.expectBetween(query, query);
   }
   none.expectNear(u"a");
   none.expectNear(u"abcdefghijklmnop");
@@ -301,17 +327,53 @@ TEST(WordsJoinedInTest, EveryWordOfThreeLetters) {
       return;
     }
   }
-  EXPECT_GT(ways, 1000U);
+  EXPECT_GT(ways, 3000U);
 }
 
-TEST(WordsJoinedInTest, AtMostSixtyFour) {
+TEST(WordsJoinedInTest, AsManyWaysAsThereAre) {
   std::vector<std::u16string> words;
-  for (std::size_t length = 1; length <= 100; ++length) {
+  for (std::size_t length = 1; length <= 200; ++length) {
     words.emplace_back(length, u'a');
   }
   const Words world(words);
-  EXPECT_EQ(world.expectJoined(std::u16string(65, u'a')), 64U);
-  EXPECT_EQ(world.joinedWays(std::u16string(66, u'a')), 64U);
+  EXPECT_EQ(world.expectJoined(std::u16string(150, u'a')), 149U + 149U + 148U);
+}
+
+TEST(WordsWithUnitBetweenTest, EveryTwoWordsOfThreeLetters) {
+  const Words world = smallWorld();
+  const auto parts = wordsUpTo(4, u"abc");
+  std::size_t words = 0;
+  for (const auto& head : parts) {
+    for (const auto& tail : parts) {
+      words += world.expectBetween(head, tail);
+    }
+    if (HasFailure()) {
+      return;
+    }
+  }
+  EXPECT_GT(words, 300U);
+  // A letter that no word has, on either side, and nothing on either side.
+  for (const auto& part : parts) {
+    world.expectBetween(part + u'!', u"a");
+    world.expectBetween(u"a", u'!' + part);
+    world.expectBetween(part, u"");
+    world.expectBetween(u"", part);
+  }
+}
+
+TEST(WordsWithUnitBetweenTest, OfMoreLettersThanHaveABitOfTheirOwn) {
+  std::vector<std::u16string> words;
+  for (char16_t unit = 0x4E00; unit < 0x4E00 + 200; ++unit) {
+    words.push_back(std::u16string(u"go") + unit + u"fish");
+    words.push_back(std::u16string(u"go") + unit);
+    words.push_back(std::u16string(1, unit) + u"go");
+    words.push_back(unit % 2 == 0 ? std::u16string(u"elbe") + unit : u"elbe");
+  }
+  const Words world(words);
+  EXPECT_EQ(world.expectBetween(u"go", u"fish"), 200U);
+  EXPECT_EQ(world.expectBetween(u"", u"go"), 200U);
+  EXPECT_EQ(world.expectBetween(u"elbe", u""), 100U);
+  EXPECT_EQ(world.expectBetween(u"g", u"\x4E01"), 1U);
 }
 
 }  // namespace

@@ -523,7 +523,8 @@ TEST(HostileImageTest, OneWordAtEveryPlaceOfALeaf) {
     image.set(kind, slots);
   }
   const auto opened = SearchImage::fromBytes(image.bytes());
-  EXPECT_LE(wordsJoinedIn(*opened, u"rhinerhine").size(), 64U);
+  EXPECT_LE(wordsJoinedIn(*opened, u"rhinerhine", Seam::unit).size(), 20U);
+  EXPECT_LE(wordsWithUnitBetween(*opened, u"rh", u"ne").size(), std::size_t{kBroad} + 1);
 }
 
 TEST(HostileImageTest, AllPostingsInEveryList) {

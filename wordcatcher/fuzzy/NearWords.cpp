@@ -13,7 +13,6 @@ namespace {
 
 using image::TreeSlot;
 
-constexpr std::size_t kMaxJoined = 64;
 constexpr std::uint32_t kNoWord = UINT32_MAX;
 
 std::vector<std::uint16_t> labelsOf(const SearchImage& image, std::u16string_view word) {
@@ -47,24 +46,33 @@ std::size_t childOf(const SearchImage& image, const SearchImage::Tree& tree, con
   }
 }
 
-/// Calls `visit(word, length)` for every word of the image that the labels begin with, or end with
-/// in the backward tree, where they stand in reverse.
-template <typename Visit>
-void forEachWordAlong(const SearchImage& image, bool backward,
-                      std::span<const std::uint16_t> labels, Visit visit) {
-  const auto& tree = backward ? image.backward() : image.forward();
-  const auto wordAt = [&](std::size_t place) {
-    if (place >= image.wordCount()) {
-      image.throwDamaged("a tree has more leaves than words");
-    }
-    return tree.order.empty() ? static_cast<std::uint32_t>(place) : tree.order[place];
-  };
+/// A place of a tree, and how many labels lead there.
+struct Reached {
   std::size_t slot = 0;
-  for (std::size_t depth = 0;; ++depth) {
-    const TreeSlot& place = tree.slots[slot];
-    if (depth > 0 && place.isLeaf()) {
+  std::size_t depth = 0;
+};
+
+/// The word at a place among a tree's leaves.
+std::uint32_t leafWordAt(const SearchImage& image, const SearchImage::Tree& tree,
+                         std::size_t place) {
+  if (place >= image.wordCount()) {
+    image.throwDamaged("a tree has more leaves than words");
+  }
+  return tree.order.empty() ? static_cast<std::uint32_t>(place) : tree.order[place];
+}
+
+/// Calls `visit(word, length)` for every word of the image that the labels begin with, or end with
+/// in the backward tree, where they stand in reverse; from a place on to which they lead, and up to
+/// the place that is given back: where the labels end, or no place is behind, or a leaf is reached.
+template <typename Visit>
+Reached forEachWordAlong(const SearchImage& image, bool backward,
+                         std::span<const std::uint16_t> labels, Reached from, Visit visit) {
+  const auto& tree = backward ? image.backward() : image.forward();
+  for (;; ++from.depth) {
+    const TreeSlot& place = tree.slots[from.slot];
+    if (from.depth > 0 && place.isLeaf()) {
       for (std::size_t i = 0; i < image::leafWords(place); ++i) {
-        const std::uint32_t word = wordAt(place.index() + i);
+        const std::uint32_t word = leafWordAt(image, tree, place.index() + i);
         const auto own = image.labelsOf(word);
         bool isAlong = own.size() <= labels.size();
         for (std::size_t at = 0; isAlong && at < own.size(); ++at) {
@@ -74,18 +82,19 @@ void forEachWordAlong(const SearchImage& image, bool backward,
           visit(word, own.size());
         }
       }
-      return;
+      return from;
     }
     if (const std::size_t end = childOf(image, tree, place, 0)) {
-      visit(wordAt(tree.slots[end].index()), depth);
+      visit(leafWordAt(image, tree, tree.slots[end].index()), from.depth);
     }
-    if (depth == labels.size() || labels[depth] == 0) {
-      return;
+    if (from.depth == labels.size() || labels[from.depth] == 0) {
+      return from;
     }
-    slot = childOf(image, tree, place, labels[depth]);
-    if (slot == 0) {
-      return;
+    const std::size_t child = childOf(image, tree, place, labels[from.depth]);
+    if (child == 0) {
+      return from;
     }
+    from.slot = child;
   }
 }
 
@@ -153,7 +162,7 @@ std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view wo
 std::optional<std::uint32_t> exactWord(const SearchImage& image, std::u16string_view word) {
   const auto labels = labelsOf(image, word);
   std::optional<std::uint32_t> found;
-  forEachWordAlong(image, false, labels, [&](std::uint32_t other, std::size_t length) {
+  forEachWordAlong(image, false, labels, {}, [&](std::uint32_t other, std::size_t length) {
     if (length == labels.size()) {
       found = other;
     }
@@ -161,24 +170,85 @@ std::optional<std::uint32_t> exactWord(const SearchImage& image, std::u16string_
   return found;
 }
 
-std::vector<std::pair<std::uint32_t, std::uint32_t>> wordsJoinedIn(const SearchImage& image,
-                                                                   std::u16string_view word) {
+std::vector<std::uint32_t> wordsWithUnitBetween(const SearchImage& image, std::u16string_view head,
+                                                std::u16string_view tail) {
+  auto labels = labelsOf(image, head);
+  const std::size_t gap = labels.size();
+  std::vector<std::uint32_t> found;
+  const auto& tree = image.forward();
+  const auto reached =
+      forEachWordAlong(image, false, labels, {}, [](std::uint32_t, std::size_t) {});
+  const TreeSlot& place = tree.slots[reached.slot];
+  labels.push_back(0);
+  for (const char16_t unit : tail) {
+    labels.push_back(image.labelOf(unit));
+  }
+  if (reached.depth > 0 && place.isLeaf()) {
+    for (std::size_t i = 0; i < image::leafWords(place); ++i) {
+      const std::uint32_t word = leafWordAt(image, tree, place.index() + i);
+      const auto own = image.labelsOf(word);
+      bool isSame = own.size() == labels.size();
+      for (std::size_t at = 0; isSame && at < own.size(); ++at) {
+        isSame = at == gap || labels[at] == own[at];
+      }
+      if (isSame) {
+        found.push_back(word);
+      }
+    }
+    return found;
+  }
+  if (reached.depth < gap || place.children == 0) {
+    return found;
+  }
+  for (std::size_t child = place.index();; ++child) {
+    if (child >= tree.slots.size()) {
+      image.throwDamaged("a tree leads out of its section");
+    }
+    labels[gap] = tree.slots[child].label;
+    if (labels[gap] != 0) {
+      forEachWordAlong(image, false, labels, {child, gap + 1},
+                       [&](std::uint32_t word, std::size_t length) {
+                         if (length == labels.size()) {
+                           found.push_back(word);
+                         }
+                       });
+    }
+    if (tree.slots[child].isLastChild()) {
+      return found;
+    }
+  }
+}
+
+std::vector<JoinedWords> wordsJoinedIn(const SearchImage& image, std::u16string_view word,
+                                       Seam seam) {
   auto labels = labelsOf(image, word);
-  // By length: words differ, so at most one of each length is the word's beginning.
+  // By length: words differ, so at most one of each length is the word's beginning, or its end.
   std::vector<std::uint32_t> heads(labels.size(), kNoWord);
-  forEachWordAlong(image, false, labels, [&](std::uint32_t other, std::size_t length) {
-    if (length > 0 && length < labels.size()) {
-      heads[length] = other;
-    }
-  });
-  std::vector<std::pair<std::uint32_t, std::uint32_t>> joined;
+  std::vector<std::uint32_t> tails(labels.size(), kNoWord);
+  const auto noteIn = [](std::vector<std::uint32_t>& words) {
+    return [&words](std::uint32_t other, std::size_t length) {
+      if (length > 0 && length < words.size()) {
+        words[length] = other;
+      }
+    };
+  };
+  forEachWordAlong(image, false, labels, {}, noteIn(heads));
   std::reverse(labels.begin(), labels.end());
-  forEachWordAlong(image, true, labels, [&](std::uint32_t other, std::size_t length) {
-    if (length > 0 && length < labels.size() && heads[labels.size() - length] != kNoWord &&
-        joined.size() < kMaxJoined) {
-      joined.emplace_back(heads[labels.size() - length], other);
+  forEachWordAlong(image, true, labels, {}, noteIn(tails));
+  std::vector<JoinedWords> joined;
+  for (std::size_t length = 1; length < tails.size(); ++length) {
+    const auto add = [&](std::size_t headLength, Seam between) {
+      if (heads[headLength] != kNoWord) {
+        joined.push_back({heads[headLength], tails[length], between});
+      }
+    };
+    if (tails[length] != kNoWord) {
+      add(tails.size() - length, Seam::none);
+      if (seam == Seam::unit && length + 1 < tails.size()) {
+        add(tails.size() - length - 1, Seam::unit);
+      }
     }
-  });
+  }
   return joined;
 }
 

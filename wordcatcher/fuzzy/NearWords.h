@@ -5,7 +5,6 @@
 #include <cstdint>
 #include <optional>
 #include <string_view>
-#include <utility>
 #include <vector>
 
 #include "wordcatcher/storage/SearchImage.h"
@@ -30,10 +29,31 @@ std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view wo
 /// The word of the image that is this one. Linear in the word.
 std::optional<std::uint32_t> exactWord(const SearchImage& image, std::u16string_view word);
 
-/// Pairs of words of the image which, written as one, are this word: at most 64. Linear in the
-/// word.
-std::vector<std::pair<std::uint32_t, std::uint32_t>> wordsJoinedIn(const SearchImage& image,
-                                                                   std::u16string_view word);
+/// The words of the image that are one word, any code unit and another word. Linear in the two and
+/// in the units that stand behind the first one in the image.
+std::vector<std::uint32_t> wordsWithUnitBetween(const SearchImage& image, std::u16string_view head,
+                                                std::u16string_view tail);
+
+/// What stands between two words that are written as one.
+enum class Seam : std::uint8_t {
+  none = 0,
+  unit = 1,  // one code unit, whichever
+};
+
+/// Two words of an image that are one, with or without a code unit between them.
+struct JoinedWords {
+  std::uint32_t head;
+  std::uint32_t tail;
+  Seam seam;
+
+  friend bool operator==(const JoinedWords&, const JoinedWords&) = default;
+};
+
+/// The pairs of words of the image which, written as one, are this word, ascending by their tails'
+/// lengths; with `seam` unit also those between which one unit of it stands. Fewer than twice as
+/// many as the word has units. Linear in the word.
+std::vector<JoinedWords> wordsJoinedIn(const SearchImage& image, std::u16string_view word,
+                                       Seam seam);
 
 }  // namespace wordcatcher
 

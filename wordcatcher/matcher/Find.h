@@ -17,8 +17,8 @@ namespace wordcatcher {
 ///
 /// Words that hold a digit name something that one edit turns into another thing, so those of the
 /// text and those stored are only found exactly, and the limits by length do not relax this:
-/// `numberEdits` alone does. Joined and split words are found all the same, since the letters and
-/// digits of both sides agree then, and no number is taken for another: "a 12" finds the stored
+/// `numberEdits` alone does. Joined and split words are found all the same, if the letters and
+/// digits of both sides agree, as no number is taken for another then: "a 12" finds the stored
 /// word "a12", and "a12" the stored words "a 12", for the one edit that joining costs. Whole texts
 /// and codes are no such words.
 struct EditLimits {

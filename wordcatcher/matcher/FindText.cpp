@@ -35,13 +35,6 @@ class CodeWords {
   WordSegmenter _segmenter;
 };
 
-std::uint32_t limitByLength(std::u16string_view word, const EditLimits& limits) {
-  if (word.size() <= limits.shortLength) {
-    return limits.shortEdits;
-  }
-  return word.size() <= limits.mediumLength ? limits.mediumEdits : limits.longEdits;
-}
-
 }  // namespace
 
 FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& limits,
@@ -51,17 +44,15 @@ FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& l
       hasCodes(mode == MatchingMode::phoneticWords) {
   const std::u16string units = decodeUtf8(text);
   const auto add = [&](std::u16string word, std::size_t begin, std::size_t end,
-                       std::uint32_t limit) {
+                       std::uint32_t lengthLimit, std::uint32_t limit) {
     const bool isLookedUp = word.size() <= maxWordUnits;
     truncated = truncated || !isLookedUp;
-    const bool isNumber = hasNumbers && holdsDigit(word);
-    words.push_back({std::move(word), begin, end, limit,
-                     isNumber ? std::min(limit, limits.numberEdits) : limit, isLookedUp});
+    words.push_back({std::move(word), begin, end, lengthLimit, limit, isLookedUp});
   };
   if (mode == MatchingMode::wholeText) {
     if (!units.empty()) {
       add(units.size() <= maxWordUnits ? toLower(units) : units, 0, text.size(),
-          limits.wholeTextEdits);
+          limits.wholeTextEdits, limits.wholeTextEdits);
     }
     return;
   }
@@ -84,14 +75,23 @@ FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& l
       if (token->size() <= maxWordUnits) {
         word = toLower(*token);
       }
-      const std::uint32_t limit = hasCodes ? 0 : limitByLength(word, limits);
-      add(std::move(word), begin, end, limit);
+      const std::uint32_t lengthLimit = hasCodes ? 0 : editLimit(word.size(), false, limits);
+      const std::uint32_t limit =
+          hasCodes ? 0 : editLimit(word.size(), hasNumbers && holdsDigit(word), limits);
+      add(std::move(word), begin, end, lengthLimit, limit);
       continue;
     }
     for (const auto& code : codes->of(*token)) {
-      add(code, begin, end, 0);
+      add(code, begin, end, 0, 0);
     }
   }
+}
+
+std::uint32_t editLimit(std::size_t length, bool isNumber, const EditLimits& limits) noexcept {
+  const std::uint32_t limit = length <= limits.shortLength    ? limits.shortEdits
+                              : length <= limits.mediumLength ? limits.mediumEdits
+                                                              : limits.longEdits;
+  return isNumber ? std::min(limit, limits.numberEdits) : limit;
 }
 
 bool holdsDigit(std::u16string_view word) noexcept {

@@ -41,6 +41,9 @@ struct FindText {
            std::size_t maxWords, std::size_t maxWordUnits);
 };
 
+/// How many edits a word of so many code units may have, and how many if it is a number.
+std::uint32_t editLimit(std::size_t length, bool isNumber, const EditLimits& limits) noexcept;
+
 /// Whether a string holds a decimal digit of any script: such words name numbers, of which one that
 /// is a digit off is another.
 bool holdsDigit(std::u16string_view word) noexcept;

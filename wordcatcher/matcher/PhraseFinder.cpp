@@ -16,6 +16,14 @@ namespace wordcatcher {
 namespace {
 
 constexpr std::uint32_t kJoinEdits = 1;
+
+// A letter in place of the space is looked for in words, written as one, that may have so many
+// edits: short ones agree with too much.
+constexpr std::uint32_t kUnitBetweenLimit = 2;
+
+Seam seamWithin(std::uint32_t limit) {
+  return limit >= kUnitBetweenLimit ? Seam::unit : Seam::none;
+}
 constexpr char16_t kFirstBeyondAscii = 0x80;
 
 // Trying all pairings of a phrase takes steps, which cost about as much as a posting.
@@ -120,7 +128,7 @@ bool PhraseFinder::isNumber(const NearWord& near, std::size_t length) const {
   return false;
 }
 
-/// Neighbours in the text that are one stored word.
+/// Neighbours in the text that are one stored word, or would be with a letter for the space.
 void PhraseFinder::lookUpJoins() {
   for (std::uint32_t position = 0; position + 1 < _text.words.size(); ++position) {
     const FindWord& first = _text.words[position];
@@ -128,8 +136,20 @@ void PhraseFinder::lookUpJoins() {
     if (!first.isLookedUp || !second.isLookedUp) {
       continue;
     }
+    const auto join = [&](std::uint32_t word) {
+      _wordOptions.push_back({word, {position, 2, 1, kJoinEdits}});
+    };
     if (const auto word = exactWord(_image, first.word + second.word)) {
-      _wordOptions.push_back({*word, {position, 2, 1, kJoinEdits}});
+      join(*word);
+    }
+    const std::size_t length = first.word.size() + 1 + second.word.size();
+    if (seamWithin(editLimit(length, false, _options.edits)) == Seam::unit) {
+      for (const std::uint32_t word : wordsWithUnitBetween(_image, first.word, second.word)) {
+        const bool isNumber = holdsDigit(_image.textOf(word));
+        if (seamWithin(editLimit(length, isNumber, _options.edits)) == Seam::unit) {
+          join(word);
+        }
+      }
     }
   }
 }
@@ -140,8 +160,8 @@ void PhraseFinder::lookUpSplits() {
     if (!word.isLookedUp) {
       continue;
     }
-    for (const auto& [head, tail] : wordsJoinedIn(_image, word.word)) {
-      _splits.push_back({head, tail, position});
+    for (const JoinedWords& joined : wordsJoinedIn(_image, word.word, seamWithin(word.limit))) {
+      _splits.push_back({joined.head, joined.tail, position});
     }
   }
   std::sort(_splits.begin(), _splits.end(), [](const Split& a, const Split& b) {

@@ -93,7 +93,7 @@ class PhraseFinder {
     std::uint32_t word;
     PairOption option;
   };
-  /// A text's word that joins two stored ones.
+  /// A text's word that joins two stored ones, with or without a letter between them.
   struct Split {
     std::uint32_t head;
     std::uint32_t tail;
