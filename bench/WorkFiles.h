@@ -1,6 +1,8 @@
 #ifndef WORDCATCHER_BENCH_WORKFILES_H
 #define WORDCATCHER_BENCH_WORKFILES_H
 
+#include <algorithm>
+#include <array>
 #include <chrono>
 #include <cstddef>
 #include <nlohmann/json.hpp>
@@ -32,6 +34,29 @@ class Stopwatch {
  private:
   std::chrono::steady_clock::time_point _start = std::chrono::steady_clock::now();
 };
+
+/// How often each question is asked to see how long it takes.
+inline constexpr std::size_t kPasses = 3;
+
+/// Asks all of so many questions, pass by pass, and tells the seconds of each: the median of the
+/// passes, which leaves out what else the machine did. `ask(number)` asks one, the first being 0.
+template <typename Ask>
+std::vector<double> medianSeconds(std::size_t questions, Ask ask) {
+  std::vector<std::array<double, kPasses>> passes(questions);
+  for (std::size_t pass = 0; pass < kPasses; ++pass) {
+    for (std::size_t number = 0; number < questions; ++number) {
+      const Stopwatch watch;
+      ask(number);
+      passes[number][pass] = watch.seconds();
+    }
+  }
+  std::vector<double> seconds;
+  for (auto& times : passes) {
+    std::sort(times.begin(), times.end());
+    seconds.push_back(times[kPasses / 2]);
+  }
+  return seconds;
+}
 
 /// Mean, median and 99th percentile, in microseconds, of how long queries took, in seconds.
 nlohmann::json latency(std::vector<double> seconds);

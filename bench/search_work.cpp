@@ -24,7 +24,6 @@ struct Distance {
   const char* name;
 };
 constexpr std::array<Distance, 3> kDistances = {{{1, "k1"}, {2, "k2"}, {3, "k3"}}};
-constexpr int kPasses = 3;
 
 /// The words are ASCII.
 std::u16string unitsOf(const std::string& word) { return {word.begin(), word.end()}; }
@@ -65,15 +64,10 @@ nlohmann::json lookUpAll(const SearchImage& image, const std::vector<std::u16str
   for (const auto& query : queries) {
     found += searchImage(image, query, distance).size();
   }
-  std::vector<double> seconds;
   std::size_t foundAgain = 0;
-  for (int pass = 0; pass < kPasses; ++pass) {
-    for (const auto& query : queries) {
-      const Stopwatch watch;
-      foundAgain += searchImage(image, query, distance).size();
-      seconds.push_back(watch.seconds());
-    }
-  }
+  auto seconds = medianSeconds(queries.size(), [&](std::size_t number) {
+    foundAgain += searchImage(image, queries[number], distance).size();
+  });
   if (foundAgain != kPasses * found) {
     throw std::runtime_error("A look-up did not find the same again.");
   }

@@ -166,7 +166,7 @@ class CompareTest(unittest.TestCase):
         for folder in ("data", "results"):
             (self.directory / folder).mkdir()
         for name in ("w1-words.txt", "w1-sample.txt", "w1-queries.txt", "w2-phrases.txt",
-                     "w2-queries.tsv", "w2-other-queries.tsv"):
+                     "w2-queries.tsv", "w2-other-queries.tsv", "w2-more-queries.tsv"):
             (self.directory / "data" / name).write_text("one\ntwo\n", encoding="utf-8")
         self.results = self.directory / "results"
 
