@@ -34,7 +34,7 @@ void Pairing::start() {
   _options.clear();
   _words.clear();
   _phraseWords = 0;
-  _mostGain = 0;
+  _most = {};
   _hasJoins = false;
   _best.clear();
   _bestScore = {};
@@ -50,14 +50,19 @@ void Pairing::add(const PairOption& option) {
   const std::uint32_t position = _phraseWords - 1;
   const auto number = static_cast<std::uint32_t>(_options.size());
   if (_words.empty() || _words.back().position != position) {
-    _words.push_back({position, number, number, 0});
+    _words.push_back({position, number, number, 0, 0, 0});
   }
   Word& word = _words.back();
   word.endOption = number + 1;
-  if (option.gain() > word.bestGain) {
-    _mostGain += option.gain() - word.bestGain;
-    word.bestGain = option.gain();
-  }
+  const auto raise = [](std::uint64_t& most, std::uint64_t& mostOfAll, std::uint64_t to) {
+    if (to > most) {
+      mostOfAll += to - most;
+      most = to;
+    }
+  };
+  raise(word.bestGain, _most.gain, option.gain());
+  raise(word.mostWords, _most.words, option.phraseWords);
+  raise(word.mostExact, _most.exact, exactWords(option));
   _hasJoins = _hasJoins || option.textWords + option.phraseWords > 2;
   _options.push_back(option);
 }
@@ -67,7 +72,9 @@ PairingScore Pairing::solve(std::uint64_t& steps) {
     return {};
   }
   steps -= std::min<std::uint64_t>(steps, _options.size());
-  if (_hasJoins || !pairEachByItself()) {
+  if (_words.size() == 1) {
+    pairOnlyWord();
+  } else if (_hasJoins || !pairEachByItself()) {
     tryAll(steps);
   }
   return _bestScore;
@@ -153,6 +160,18 @@ Pairing::Onward Pairing::bestOnward(const Word& word, std::uint32_t option) cons
   return best;
 }
 
+/// No other stands in the way of the best option, or of the first one of several.
+void Pairing::pairOnlyWord() {
+  const auto begin = _options.begin() + _words[0].firstOption;
+  const auto end = _options.begin() + _words[0].endOption;
+  const auto best = std::max_element(begin, end, [](const PairOption& a, const PairOption& b) {
+    return std::make_tuple(a.gain(), a.phraseWords, exactWords(a)) <
+           std::make_tuple(b.gain(), b.phraseWords, exactWords(b));
+  });
+  _best.push_back({_words[0].position, *best});
+  _bestScore = {best->gain(), best->phraseWords, exactWords(*best), 0};
+}
+
 /// Each word takes an option of its least edits; of these the ones with the least disorder. False
 /// when two words come to want the same word of the text.
 bool Pairing::pairEachByItself() {
@@ -217,15 +236,9 @@ void Pairing::tryAll(std::uint64_t& steps) {
   for (std::size_t w = _words.size(); w-- > 0;) {
     PairingScore& reachable = _reachableFrom[w];
     reachable = _reachableFrom[w + 1];
-    std::uint64_t words = 0;
-    std::uint64_t exact = 0;
-    for (std::uint32_t i = _words[w].firstOption; i < _words[w].endOption; ++i) {
-      words = std::max<std::uint64_t>(words, _options[i].phraseWords);
-      exact = std::max(exact, exactWords(_options[i]));
-    }
     reachable.gain += _words[w].bestGain;
-    reachable.words += words;
-    reachable.exact += exact;
+    reachable.words += _words[w].mostWords;
+    reachable.exact += _words[w].mostExact;
   }
   tryFrom(0, steps);
 }

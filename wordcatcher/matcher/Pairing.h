@@ -62,8 +62,9 @@ class Pairing {
   void nextWord();
   void add(const PairOption& option);
 
-  /// What pairing all words could gain at the most, if none stood in another's way.
-  std::uint64_t mostGain() const noexcept { return _mostGain; }
+  /// What pairing all words could come to at the most, each part by itself, if none stood in
+  /// another's way; with no disorder.
+  const PairingScore& most() const noexcept { return _most; }
 
   /// The best pairing of what was named. `steps` is a budget, which the work is taken off: when it
   /// is used up, the best pairing so far is taken, and isExact() is false from then on.
@@ -79,6 +80,8 @@ class Pairing {
     std::uint32_t firstOption;
     std::uint32_t endOption;
     std::uint64_t bestGain;
+    std::uint64_t mostWords;  // of the phrase, that an option takes
+    std::uint64_t mostExact;
   };
   /// What comes behind an option in the best way.
   struct Onward {
@@ -87,6 +90,7 @@ class Pairing {
   };
   static constexpr std::uint32_t kNone = UINT32_MAX;
 
+  void pairOnlyWord();
   bool pairEachByItself();
   void tryAll(std::uint64_t& steps);
   void tryFrom(std::size_t word, std::uint64_t& steps);
@@ -110,7 +114,7 @@ class Pairing {
   std::vector<std::uint32_t> _bestBehind;    // and from it on
   std::vector<PairingScore> _reachableFrom;  // the most that words from one on can add
   std::uint32_t _phraseWords = 0;
-  std::uint64_t _mostGain = 0;
+  PairingScore _most;
   bool _hasJoins = false;
   bool _isExact = true;
   std::vector<Pair> _current;

@@ -451,8 +451,13 @@ bool PhraseFinder::judgeAndKeep(std::uint32_t value, const Source& source) {
     return true;
   }
   namePairs(phrases);
-  if (isFull() && costOf(phrases, _pairing.mostGain()) > _kept.front().cost) {
-    return false;
+  if (isFull()) {
+    const PairingScore& most = _pairing.most();
+    const RankedPhrase& last = _kept.front();
+    if (std::make_tuple(costOf(phrases, most.gain), ~most.words, ~most.exact) >
+        std::make_tuple(last.cost, ~last.words, ~last.exact)) {
+      return false;
+    }
   }
   const RankedPhrase phrase = solve(value, phrases);
   return !isWithinBounds(phrase) || keep(phrase) || phrase.rarity > source.values.size();

@@ -219,9 +219,12 @@ void SearchImage::bind(const std::string& name) {
       _phraseOffsets.size() != values + 1 || _phraseClasses.size() > values) {
     throwDamaged("its sections do not have the lengths that its counts ask for");
   }
+  for (std::size_t unit = 0; unit < _asciiLabels.size(); ++unit) {
+    _asciiLabels[unit] = findLabel(static_cast<char16_t>(unit));
+  }
 }
 
-std::uint16_t SearchImage::labelOf(char16_t unit) const noexcept {
+std::uint16_t SearchImage::findLabel(char16_t unit) const noexcept {
   const auto common =
       _labels.subspan(1, std::min<std::size_t>(_labels.size(), image::kRareBit) - 1);
   const auto rare = _labels.subspan(1 + common.size());

@@ -1,6 +1,7 @@
 #ifndef WORDCATCHER_STORAGE_SEARCHIMAGE_H
 #define WORDCATCHER_STORAGE_SEARCHIMAGE_H
 
+#include <array>
 #include <cstdint>
 #include <memory>
 #include <span>
@@ -43,8 +44,11 @@ class SearchImage {
   std::uint64_t postingCount() const noexcept { return _postings.size(); }
   std::uint64_t phraseWordCount() const noexcept { return _phraseWords.size(); }  // of all phrases
 
-  /// The label of a code unit; 0 when no word holds it. Logarithmic in the number of labels.
-  std::uint16_t labelOf(char16_t unit) const noexcept;
+  /// The label of a code unit; 0 when no word holds it. Constant time for ASCII, else logarithmic
+  /// in the number of labels.
+  std::uint16_t labelOf(char16_t unit) const noexcept {
+    return unit < _asciiLabels.size() ? _asciiLabels[unit] : findLabel(unit);
+  }
 
   /// The labels of a word, and its code units. The word must be below wordCount().
   using Labels = TwoWidths<std::uint8_t, std::uint16_t>;
@@ -164,6 +168,7 @@ class SearchImage {
  private:
   SearchImage() = default;
   void bind(const std::string& name);
+  std::uint16_t findLabel(char16_t unit) const noexcept;
   template <typename Element>
   std::span<const Element> sectionOf(image::SectionKind kind) const;
   template <typename Narrow, typename Wide>
@@ -187,6 +192,7 @@ class SearchImage {
   std::uint32_t _wordCount = 0;
   std::uint32_t _valueCount = 0;
   std::span<const std::uint16_t> _labels;
+  std::array<std::uint16_t, 128> _asciiLabels{};  // of the units that most words are made of
   std::span<const std::uint32_t> _wordOffsets;
   Labels _wordText;
   Tree _forward;
