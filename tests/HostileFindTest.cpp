@@ -146,8 +146,7 @@ TEST_F(HostileFindTest, WordsThatRepeatEachOtherAreNotMultiplied) {
 
 TEST_F(HostileFindTest, OverlappingPostingListsAreDamage) {
   auto forged = rivers();
-  const auto postings = forged.get<std::uint32_t>(SectionKind::postings).size();
-  makeRangesWhole<std::uint32_t>(forged, SectionKind::postingOffsets, postings);
+  makeRangesWhole<std::uint32_t>(forged, SectionKind::postingOffsets, kRivers);
   leadToEvenWords(forged);
   const Index index = open(forged);
   EXPECT_NE(damageFoundBy([&] { index.find("rab rbb rcb rdb"); }).find("posting lists overlap"),

@@ -403,7 +403,7 @@ ForgedImage broadImage(std::uint32_t letters) {
   SearchImageWriter writer(0);
   for (std::uint32_t i = 0; i < letters; ++i) {
     writer.addPosting(std::u16string(1, static_cast<char16_t>(0x4E00 + i)),
-                      writer.addValue("x", 1));
+                      writer.addValue(std::to_string(i), 1));
   }
   return ForgedImage(std::move(writer).finish());
 }
@@ -538,6 +538,18 @@ TEST(HostileImageTest, AllPostingsInEveryList) {
   EXPECT_EQ(opened->postingsOf(0).size(), 300U);
   EXPECT_EQ(opened->postingsOf(2).size(), 300U);
   EXPECT_EQ(errorOf([&opened] { searchImage(*opened, u"*", 0); }), ErrorCode::damaged);
+}
+
+TEST(HostileImageTest, APostingListLongerThanThereAreValues) {
+  ForgedImage image = broadImage(300);
+  image.set(SectionKind::postings, std::vector<std::uint32_t>(301));
+  auto offsets = image.get<std::uint32_t>(SectionKind::postingOffsets);
+  offsets.back() = 301;
+  offsets[1] = 301;
+  image.set(SectionKind::postingOffsets, offsets);
+  const auto opened = SearchImage::fromBytes(image.bytes());
+  EXPECT_EQ(errorOf([&opened] { opened->postingsOf(0); }), ErrorCode::damaged);
+  EXPECT_EQ(opened->postingsOf(299).size(), 2U);
 }
 
 TEST(HostileImageTest, BranchesWithoutWordsThatMeetAgain) {

@@ -256,6 +256,9 @@ std::span<const std::uint32_t> SearchImage::postingsOf(std::uint32_t word) const
   if (begin > end || end > _postings.size()) {
     throwDamaged("a posting list lies outside its section");
   }
+  if (end - begin > _valueCount) {
+    throwDamaged("a posting list is longer than there are values");
+  }
   return _postings.subspan(begin, end - begin);
 }
 
