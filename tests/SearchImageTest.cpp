@@ -540,6 +540,28 @@ TEST(HostileImageTest, AllPostingsInEveryList) {
   EXPECT_EQ(errorOf([&opened] { searchImage(*opened, u"*", 0); }), ErrorCode::damaged);
 }
 
+TEST(HostileImageTest, EveryLeafHoldsAllWords) {
+  // As many words behind each unit between two words: the square of the image's size.
+  SearchImageWriter writer(0);
+  const std::uint32_t value = writer.addValue("x", 1);
+  for (std::uint32_t i = 0; i < kBroad; ++i) {
+    const char16_t unit = static_cast<char16_t>(0x4E00 + i);
+    writer.addPosting(std::u16string(u"go") + unit + u"fish", value);
+  }
+  ForgedImage image(std::move(writer).finish());
+  auto slots = image.get<TreeSlot>(SectionKind::forwardTree);
+  for (auto& slot : slots) {
+    if (slot.isLeaf()) {
+      slot.children = kBroad;
+      slot.target = TreeSlot::kLeaf | (slot.target & TreeSlot::kLastChild);
+    }
+  }
+  image.set(SectionKind::forwardTree, slots);
+  const auto opened = SearchImage::fromBytes(image.bytes());
+  EXPECT_EQ(errorOf([&opened] { wordsWithUnitBetween(*opened, u"go", u"fish"); }),
+            ErrorCode::damaged);
+}
+
 TEST(HostileImageTest, APostingListLongerThanThereAreValues) {
   ForgedImage image = broadImage(300);
   image.set(SectionKind::postings, std::vector<std::uint32_t>(301));

@@ -200,18 +200,24 @@ std::vector<std::uint32_t> wordsWithUnitBetween(const SearchImage& image, std::u
   if (reached.depth < gap || place.children == 0) {
     return found;
   }
+  std::uint64_t inLeaves = 0;
   for (std::size_t child = place.index();; ++child) {
     if (child >= tree.slots.size()) {
       image.throwDamaged("a tree leads out of its section");
     }
     labels[gap] = tree.slots[child].label;
     if (labels[gap] != 0) {
-      forEachWordAlong(image, false, labels, {child, gap + 1},
-                       [&](std::uint32_t word, std::size_t length) {
-                         if (length == labels.size()) {
-                           found.push_back(word);
-                         }
-                       });
+      const auto end = forEachWordAlong(image, false, labels, {child, gap + 1},
+                                        [&](std::uint32_t word, std::size_t length) {
+                                          if (length == labels.size()) {
+                                            found.push_back(word);
+                                          }
+                                        });
+      inLeaves += tree.slots[end.slot].isLeaf() ? image::leafWords(tree.slots[end.slot]) : 0;
+      // Else all words could stand behind each child.
+      if (inLeaves > image.wordCount()) {
+        image.throwDamaged("leaves of a tree overlap");
+      }
     }
     if (tree.slots[child].isLastChild()) {
       return found;
