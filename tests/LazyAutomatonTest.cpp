@@ -81,7 +81,8 @@ struct Literal {
     for (std::size_t depth = 0; depth < word.size(); ++depth) {
       const std::uint64_t byEdit = pattern.editedAt(sets.back(), depth);
       const std::uint64_t match = pattern.matchedAt(sets.back(), depth, word[depth]);
-      const std::uint64_t set = (byEdit | B::closed(match)) & pattern.validAt(depth + 1);
+      const std::uint64_t set =
+          (byEdit | pattern.closedAt(match, depth + 1)) & pattern.validAt(depth + 1);
       if ((set & B::kLane) == 0) {
         break;
       }
@@ -206,6 +207,11 @@ std::size_t anyLength(Random& random) {
   }
 }
 
+HeadLimit anyLimit(Random& random, std::size_t length, unsigned mostEdits) {
+  return {random() % (length + 1), static_cast<unsigned>(random() % (mostEdits + 1)),
+          random() % 2 == 0};
+}
+
 constexpr int kQueries = 400;
 constexpr int kWords = 20;
 
@@ -231,8 +237,7 @@ void expectBanded() {
     const std::size_t letters = 1 + random() % kLabels.size();
     const auto units = anyQuery(random, anyLength(random), letters, i % 3 == 0);
     const bool backward = i % 2 == 0;
-    const std::size_t restricted = random() % (units.size() + 1);
-    const BandedPattern<K, Lanes> pattern(units, restricted, random() % (K + 1));
+    const BandedPattern<K, Lanes> pattern(units, anyLimit(random, units.size(), K));
     accepted +=
         readWords<K, Lanes>(units, pattern, backward ? pattern.closedStart() : pattern.start(),
                             backward, letters, random, memory);
@@ -262,8 +267,7 @@ void expectSwaps() {
   for (int i = 0; i < kQueries && !::testing::Test::HasFailure(); ++i) {
     const std::size_t letters = 1 + random() % kLabels.size();
     const auto units = anyQuery(random, anyLength(random), letters, false);
-    const std::size_t restricted = random() % (units.size() + 1);
-    const SwapPattern<K> pattern(units, i % 2 == 0, restricted, random() % (K + 1));
+    const SwapPattern<K> pattern(units, i % 2 == 0, anyLimit(random, units.size(), K));
     accepted += readWords<K, 1>(units, pattern, pattern.start(), false, letters, random, memory);
   }
   EXPECT_GT(accepted, kQueries * kWords / 20) << "words that tell something";
@@ -277,7 +281,7 @@ TEST(LazyAutomatonTest, WithSwaps) {
 
 TEST(LazyAutomatonTest, MakesEachStateOnce) {
   const std::vector<QueryUnit> units(200, {.label = 1});
-  const BandedPattern<2> pattern(units, 0, 2);
+  const BandedPattern<2> pattern(units, {0, 2});
   AutomatonMemory memory;
   LazyAutomaton<2, 1, BandedPattern<2>> automaton(pattern, false, memory);
   automaton.begin();

@@ -52,7 +52,8 @@ class LazyAutomaton {
   /// The state after one code unit that can only be an insertion.
   Number afterInsertion() {
     const std::uint64_t set =
-        B::closed(B::inLanes(std::uint64_t{1} << (B::kColumns + K - 1))) & _pattern.validAt(1);
+        _pattern.closedAt(B::inLanes(std::uint64_t{1} << (B::kColumns + K - 1)), 1) &
+        _pattern.validAt(1);
     return set == 0 ? kDead : numberOf(1, set, distanceOf(1, {set, set}));
   }
 
@@ -126,7 +127,8 @@ class LazyAutomaton {
   Step stepOf(std::uint64_t set, std::size_t depth, std::uint16_t label) const noexcept {
     const std::uint64_t byEdit = _pattern.editedAt(set, depth);
     const std::uint64_t match = _pattern.matchedAt(set, depth, label);
-    return {(byEdit | B::closed(match)) & _pattern.validAt(depth + 1), byEdit | match};
+    return {(byEdit | _pattern.closedAt(match, depth + 1)) & _pattern.validAt(depth + 1),
+            byEdit | match};
   }
 
   [[gnu::noinline]] Number make(std::size_t step, Number from, std::size_t depth,
@@ -198,7 +200,7 @@ class LazyAutomaton {
   /// The labels that lead on from a set of states without an edit.
   std::uint64_t matchingChildren(std::size_t depth, std::uint64_t set) const {
     std::uint64_t children = 0;
-    for (std::uint64_t columns = _pattern.matchableColumns(set); columns != 0;
+    for (std::uint64_t columns = _pattern.matchableColumns(set, depth); columns != 0;
          columns &= columns - 1) {
       children |= _pattern.childBits(depth, static_cast<unsigned>(std::countr_zero(columns)));
     }

@@ -90,7 +90,7 @@ void forEachWordAlong(const SearchImage& image, bool backward,
 }
 
 /// Two walks, each with few edits in the half of the query that it reads first; see
-/// ImageSearch.cpp. A swap across the middle is allowed to both. Walks along the whole query count
+/// ImageSearch.cpp. Walks along the whole query count
 /// the least edits that their limits allow, so a word that both meet has the lesser of its two
 /// counts: with all edits in reach of one half, that is the distance.
 template <unsigned K>
@@ -103,7 +103,7 @@ void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units,
   const auto memory = image.lendWalkMemory();
   using Walk = BandedWalk<K, 1, SwapPattern<K>>;
   if (units.size() < kMinSplitLength) {
-    const SwapPattern<K> whole(units, swaps, 0, K);
+    const SwapPattern<K> whole(units, swaps, {0, K});
     Walk(image, image.forward(), false, whole, *memory).run(whole.start(), accept);
     return;
   }
@@ -111,8 +111,8 @@ void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units,
   constexpr unsigned kInSecond = K - kInFirst - 1;
   const std::size_t half = (units.size() + kInFirst - kInSecond) / 2;
   const std::vector<QueryUnit> reversed(units.rbegin(), units.rend());
-  const SwapPattern<K> first(units, swaps, half, kInFirst);
-  const SwapPattern<K> second(reversed, swaps, units.size() - half, kInSecond);
+  const SwapPattern<K> first(units, swaps, {half, kInFirst, true});
+  const SwapPattern<K> second(reversed, swaps, {units.size() - half, kInSecond, false});
   Walk(image, image.forward(), false, first, *memory).run(first.start(), accept);
   Walk(image, image.backward(), true, second, *memory).run(second.start(), accept);
 }

@@ -31,6 +31,15 @@ inline std::vector<QueryUnit> unitsOf(const SearchImage& image, std::u16string_v
   return units;
 }
 
+/// How many edits the code units at the head of a query may be passed with. What stands at their
+/// border, code units inserted behind the last of them and its swap with the next, counts as theirs
+/// or as nobody's.
+struct HeadLimit {
+  std::size_t units = 0;
+  unsigned edits = 0;
+  bool holdsBorder = false;
+};
+
 /// What the automata of a query within K edits know of it: which sets of states may be after so
 /// many code units of a word, and which of its own code units stand where. Column c after d code
 /// units stands for d + c - K code units of the query; a step looks at those behind the first
@@ -49,6 +58,9 @@ class QueryPattern {
   /// units.
   std::uint64_t validAt(std::size_t depth) const noexcept { return _states[depth].valid; }
   std::uint64_t acceptingAt(std::size_t depth) const noexcept { return _states[depth].accepting; }
+
+  /// Those of them to which replacing or leaving out a code unit of the query may lead.
+  std::uint64_t passedAt(std::size_t depth) const noexcept { return _states[depth].passed; }
 
   /// Bit c: whether the query has that label behind column c, after at most length() + K code
   /// units; nowhere for 0.
@@ -72,11 +84,17 @@ class QueryPattern {
   }
 
  protected:
+  /// Per depth, see validAt() and passedAt().
+  struct Allowed {
+    std::uint64_t valid;
+    std::uint64_t passed;
+  };
+
   /// The units must live as long as this does. `starts`: bit 0 of each row of states that a query
-  /// can end in. `validOf(inside, before)` gives the states that may be of those in the columns
+  /// can end in. `allowedOf(inside, before)` gives the states that may be of those in the columns
   /// `inside`; `before(p)` gives the columns of less than p code units of the query.
-  template <typename ValidOf>
-  QueryPattern(std::span<const QueryUnit> units, std::uint64_t starts, ValidOf validOf)
+  template <typename AllowedOf>
+  QueryPattern(std::span<const QueryUnit> units, std::uint64_t starts, AllowedOf allowedOf)
       : _units(units) {
     const std::size_t depths = units.size() + K + 2;
     if (depths > _fewStates.size()) {
@@ -88,7 +106,8 @@ class QueryPattern {
       const auto before = [shift = static_cast<std::int64_t>(depth) - static_cast<std::int64_t>(K)](
                               std::int64_t p) { return below(p - shift); };
       const std::uint64_t inside = before(length + 1) & ~before(0);
-      _states[depth] = {validOf(inside, before), (inside & ~before(length)) * starts};
+      const Allowed allowed = allowedOf(inside, before);
+      _states[depth] = {allowed.valid, allowed.passed, (inside & ~before(length)) * starts};
     }
     if (units.size() + Window <= 64) {
       for (std::size_t p = 0; p < units.size(); ++p) {
@@ -111,6 +130,7 @@ class QueryPattern {
   /// Per depth.
   struct States {
     std::uint64_t valid;
+    std::uint64_t passed;
     std::uint64_t accepting;
   };
 
