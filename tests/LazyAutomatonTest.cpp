@@ -175,7 +175,7 @@ class Reader {
   void expectBehind(std::uint32_t state, std::size_t depth, const Labels& word,
                     std::optional<std::uint32_t> ofWhole) const {
     if (!word.empty()) {
-      EXPECT_EQ(_automaton.distanceBehind(state, word.size(),
+      EXPECT_EQ(_automaton.distanceBehind(state, depth, word.size(),
                                           [&word](std::size_t at) { return word[at]; }),
                 ofWhole.value_or(Automaton::kNotAccepted));
     }

@@ -8,6 +8,7 @@
 
 #include "wordcatcher/fuzzy/BandedAutomaton.h"
 #include "wordcatcher/fuzzy/BandedWalk.h"
+#include "wordcatcher/fuzzy/LazyAutomaton.h"
 
 namespace wordcatcher {
 
@@ -15,6 +16,9 @@ namespace {
 
 constexpr char16_t kAny = u'*';
 constexpr char16_t kEmptyMove = u'_';
+
+template <unsigned K, unsigned Lanes>
+using Walk = BandedWalk<LazyAutomaton<K, Lanes, BandedPattern<K, Lanes>>>;
 
 /// Beyond this many edits the rows no longer fit into 64 bits.
 constexpr std::int64_t kMaxBandedDistance = 4;
@@ -123,8 +127,8 @@ void searchByHalves(const SearchImage& image, const Query& query, HitList& hits)
   const BandedPattern<K, kLanes> first(query.units, {half, kInFirst, true});
   const BandedPattern<K, kLanes> second(reversed, {length - half, kInSecond, false});
   const auto memory = image.lendWalkMemory();
-  BandedWalk<K, kLanes> forward(image, image.forward(), false, first, *memory);
-  BandedWalk<K, kLanes> backward(image, image.backward(), true, second, *memory);
+  Walk<K, kLanes> forward(image, image.forward(), false, first, *memory);
+  Walk<K, kLanes> backward(image, image.backward(), true, second, *memory);
   if constexpr (kLanes == 2) {
     const auto accept = [&hits](std::uint32_t word, std::uint32_t distance, std::size_t size) {
       hits.add(word, distance, size);
@@ -153,14 +157,14 @@ void searchBanded(const SearchImage& image, const Query& query, HitList& hits) {
   }
   const BandedPattern<K> pattern(query.units, {0, K});
   const auto memory = image.lendWalkMemory();
-  BandedWalk<K, 1> walk(image, image.forward(), false, pattern, *memory);
+  Walk<K, 1> walk(image, image.forward(), false, pattern, *memory);
   const auto accept = [&hits](std::uint32_t word, std::uint32_t distance, std::size_t size) {
     hits.add(word, distance, size);
   };
-  if (query.beginsWithEmptyMove) {
-    walk.runAfterInsertion(accept);
-  } else {
+  if (!query.beginsWithEmptyMove) {
     walk.run(pattern.start(), accept);
+  } else if constexpr (K > 0) {
+    walk.runAfterInsertion(accept);
   }
 }
 

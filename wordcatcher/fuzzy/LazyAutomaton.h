@@ -22,12 +22,13 @@
 
 namespace wordcatcher {
 
-/// `Pattern` is a BandedPattern or a SwapPattern. With two lanes a word is accepted when lane 0
-/// accepts it, at the distance in lane 1, if that accepts it, too: forward as from the start;
+/// `QueryPattern` is a BandedPattern or a SwapPattern. With two lanes a word is accepted when lane
+/// 0 accepts it, at the distance in lane 1, if that accepts it, too: forward as from the start;
 /// backward so that nothing is left out behind the last code unit read, which is the word's first.
-template <unsigned K, unsigned Lanes, typename Pattern>
+template <unsigned K, unsigned Lanes, typename QueryPattern>
 class LazyAutomaton {
  public:
+  using Pattern = QueryPattern;
   using B = typename Pattern::B;
   using Number = std::uint32_t;
   using State = AutomatonMemory::State;
@@ -45,6 +46,9 @@ class LazyAutomaton {
     std::fill_n(_memory.steps.begin(), kClasses, kDead);
     _memory.slots.assign(kFewestSlots, 0);
   }
+
+  /// Before places after so many code units are read, those after 0 first.
+  void enter(std::size_t) noexcept {}
 
   /// The state of a set of states of the pattern's after `depth` code units, at which no word ends.
   Number at(std::size_t depth, std::uint64_t set) { return numberOf(depth, set, kNotAccepted); }
@@ -69,12 +73,36 @@ class LazyAutomaton {
     return next(from, std::min(depth, _pattern.length() + K), label);
   }
 
+  /// The labels of the children, as bits of their sets, that can lead on from a state. This and the
+  /// next two are asked of states after so many code units as the places that are read, or one
+  /// more.
+  std::uint64_t wanted(Number state, std::size_t) const noexcept {
+    return _memory.states[state].wanted;
+  }
+
+  /// Whether words that have so many code units more can be of a length that is accepted.
+  bool fits(Number state, std::size_t, std::uint8_t shortest, std::uint8_t longest) const noexcept {
+    const State& at = _memory.states[state];
+    return (static_cast<int>(shortest <= at.mostRest) &
+            static_cast<int>(longest >= at.leastRest)) != 0;
+  }
+
+  /// The distance of a word that ends, or kNotAccepted.
+  std::uint32_t distance(Number state, std::size_t) const noexcept {
+    return _memory.states[state].distance;
+  }
+
+  /// The same, after any number of code units.
+  std::uint32_t distanceAnywhere(Number state, std::size_t) const noexcept {
+    return _memory.states[state].distance;
+  }
+
   /// The distance of a word that goes on to `length` code units, `labelAt(depth)`, or kNotAccepted.
   /// Makes no states: what is left of a word is mostly like that of no other.
   template <typename LabelAt>
-  std::uint32_t distanceBehind(Number from, std::size_t length, LabelAt labelAt) const {
+  std::uint32_t distanceBehind(Number from, std::size_t depth, std::size_t length,
+                               LabelAt labelAt) const {
     const State& state = _memory.states[from];
-    std::size_t depth = state.depth;
     if (depth == length) {
       return state.distance;
     }
