@@ -139,7 +139,8 @@ class Reader {
         EXPECT_TRUE(!goesOn || word[depth] == 0 || (_automaton[state].wanted & bit) != 0);
         const auto next = _automaton.nextAnywhere(state, depth, word[depth]);
         EXPECT_EQ(next != Automaton::kDead, goesOn);
-        EXPECT_EQ(_automaton.next(state, depth, word[depth]), next) << "made";
+        EXPECT_EQ(_automaton.next(_automaton.level(depth), state, depth, word[depth]), next)
+            << "made";
         state = next;
       }
     }
@@ -289,7 +290,7 @@ TEST(LazyAutomatonTest, MakesEachStateOnce) {
   for (int round = 0; round < 2; ++round) {
     auto state = automaton.at(0, pattern.start());
     for (std::size_t depth = 0; depth < units.size(); ++depth) {
-      state = automaton.next(state, depth, 1);
+      state = automaton.next(automaton.level(depth), state, depth, 1);
     }
     EXPECT_EQ(automaton[state].distance, 0U);
     EXPECT_TRUE(round == 0 || memory.states.size() == known);

@@ -92,24 +92,24 @@ class Both {
     for (std::size_t depth = 0; depth <= word.size(); ++depth) {
       _automaton.enter(depth);
       EXPECT_EQ(_automaton.distanceBehind(state, depth, word.size(), labelAt), distance) << depth;
-      EXPECT_EQ(_automaton.distance(state, depth), _automaton.distanceAnywhere(state, depth));
+      const auto level = _automaton.level(depth);
+      EXPECT_EQ(level.distance(state), _automaton.distanceAnywhere(state, depth));
       const auto rest =
           static_cast<std::uint8_t>(std::min<std::size_t>(word.size() - depth, image::kLengthCap));
-      EXPECT_TRUE(!isAccepted || _automaton.fits(state, depth, rest, rest)) << depth;
+      EXPECT_TRUE(!isAccepted || level.fits(state, rest, rest) == 1U) << depth;
       if (depth == word.size()) {
-        EXPECT_EQ(_automaton.distance(state, depth), distance);
+        EXPECT_EQ(level.distance(state), distance);
         return;
       }
       const auto next = _automaton.nextAnywhere(state, depth, word[depth]);
-      EXPECT_EQ(_automaton.next(state, depth, word[depth]), next);
+      EXPECT_EQ(_automaton.next(level, state, depth, word[depth]), next);
       EXPECT_TRUE(next != Automaton::kDead || !isAccepted) << depth;
       const std::uint64_t bit = std::uint64_t{1} << image::labelBit(word[depth]);
-      EXPECT_TRUE(!isAccepted || word[depth] == 0 || (_automaton.wanted(state, depth) & bit) != 0)
-          << depth;
+      EXPECT_TRUE(!isAccepted || word[depth] == 0 || (level.wanted(state) & bit) != 0) << depth;
       if (next == Automaton::kDead) {
         // As LazyAutomaton, it is not asked about what is behind.
-        EXPECT_FALSE(_automaton.fits(next, depth + 1, 0, UINT8_MAX));
-        EXPECT_EQ(_automaton.wanted(next, depth + 1), 0U);
+        EXPECT_EQ(_automaton.level(depth + 1).fits(next, 0, UINT8_MAX), 0U);
+        EXPECT_EQ(_automaton.level(depth + 1).wanted(next), 0U);
         return;
       }
       state = next;

@@ -74,6 +74,7 @@ class BandedWalk {
  public:
   using Pattern = typename Automaton::Pattern;
   using Number = typename Automaton::Number;
+  using Level = typename Automaton::Level;
 
   /// All must live as long as this does; of walks with the same memory one is run after the other.
   BandedWalk(const SearchImage& image, const SearchImage::Tree& tree, bool backward,
@@ -99,7 +100,7 @@ class BandedWalk {
   void runAfterInsertion(Accept accept) {
     begin();
     const TreeSlot& root = _tree.slots[0];
-    reachAll(root.children & ~kEnd, root.index(), 0,
+    reachAll(root.children & ~kEnd, root.index(), _automaton.level(1),
              [state = _automaton.afterInsertion()](std::uint16_t) { return state; });
     sortOut(1);
     goOn();
@@ -135,8 +136,10 @@ class BandedWalk {
       for (const auto& ending : _memory.endings) {
         readEnding(ending, depth);
       }
+      const auto here = _automaton.level(depth);
+      const auto next = _automaton.level(depth + 1);
       for (const auto& place : _memory.level) {
-        expand(place, depth);
+        expand(place, depth, here, next);
         if (_memory.reached.size() >= kSortedAtOnce) {
           sortOut(depth + 1);
         }
@@ -181,75 +184,76 @@ class BandedWalk {
     return _tree.slots.data() + first;
   }
 
-  void expand(const WalkMemory::Place& place, std::size_t depth) {
-    const std::uint64_t wanted = place.children & _automaton.wanted(place.state, depth);
+  void expand(const WalkMemory::Place& place, std::size_t depth, const Level& here,
+              const Level& next) {
+    const std::uint64_t wanted = place.children & here.wanted(place.state);
     const auto step = [&](std::uint16_t label) {
-      return _automaton.next(place.state, depth, label);
+      return _automaton.next(here, place.state, depth, label);
     };
     if (wanted == place.children) {
-      reachAll(place.children, place.first, depth, step);
+      reachAll(place.children, place.first, next, step);
     } else {
-      reachSome(place.children, wanted, place.first, depth, step);
+      reachSome(place.children, wanted, place.first, next, step);
     }
   }
 
   /// The places behind the edges to all children.
   template <typename Step>
-  void reachAll(std::uint64_t children, std::size_t first, std::size_t depth, Step step) {
+  void reachAll(std::uint64_t children, std::size_t first, const Level& next, Step step) {
     const std::uint64_t common = children & ~kRare;
     const std::size_t count = bitCount(common);
     _budget.spendSlots(count);
     const TreeSlot* slot = childrenAt(first, count);
     WalkMemory::Reached* end = _memory.reached.roomFor(count);
     for (std::uint64_t bits = common; bits != 0; bits &= bits - 1, ++slot) {
-      end = reach(*slot, step(static_cast<std::uint16_t>(std::countr_zero(bits))), depth, end);
+      end = reach(*slot, step(static_cast<std::uint16_t>(std::countr_zero(bits))), next, end);
     }
     _memory.reached.endAt(end);
     if ((children & kRare) != 0) {
-      reachRare(first + count, depth, step);
+      reachRare(first + count, next, step);
     }
   }
 
   /// The places behind the edges to some of them.
   template <typename Step>
-  void reachSome(std::uint64_t children, std::uint64_t wanted, std::size_t first, std::size_t depth,
+  void reachSome(std::uint64_t children, std::uint64_t wanted, std::size_t first, const Level& next,
                  Step step) {
     const std::uint64_t common = children & ~kRare;
     for (std::uint64_t bits = common & wanted; bits != 0; bits &= bits - 1) {
       const std::size_t child = first + bitCount(common & ((bits & -bits) - 1));
       reachOne(*childrenAt(child, 1), step(static_cast<std::uint16_t>(std::countr_zero(bits))),
-               depth);
+               next);
     }
     if ((wanted & kRare) != 0) {
-      reachRare(first + bitCount(common), depth, step);
+      reachRare(first + bitCount(common), next, step);
     }
   }
 
   template <typename Step>
-  void reachRare(std::size_t child, std::size_t depth, Step step) {
+  void reachRare(std::size_t child, const Level& next, Step step) {
     for (;; ++child) {
       const TreeSlot& slot = *childrenAt(child, 1);
       if (slot.label < image::kRareBit) {
         _image.throwDamaged("a tree leads out of its section");
       }
-      reachOne(slot, step(slot.label), depth);
+      reachOne(slot, step(slot.label), next);
       if (slot.isLastChild()) {
         return;
       }
     }
   }
 
-  void reachOne(const TreeSlot& slot, Number state, std::size_t depth) {
+  void reachOne(const TreeSlot& slot, Number state, const Level& next) {
     _budget.spendSlots(1);
-    _memory.reached.endAt(reach(slot, state, depth, _memory.reached.roomFor(1)));
+    _memory.reached.endAt(reach(slot, state, next, _memory.reached.roomFor(1)));
   }
 
-  /// A place behind one after `depth` code units is kept if words behind it are of a length that
-  /// can still be accepted. None is in the dead state.
-  WalkMemory::Reached* reach(const TreeSlot& slot, Number state, std::size_t depth,
+  /// A place of the next level is kept if words behind it are of a length that can still be
+  /// accepted. None is in the dead state.
+  WalkMemory::Reached* reach(const TreeSlot& slot, Number state, const Level& next,
                              WalkMemory::Reached* end) const {
     *end = {slot.children, slot.target, state};
-    return end + (_automaton.fits(state, depth + 1, slot.shortest, slot.longest) ? 1 : 0);
+    return end + next.fits(state, slot.shortest, slot.longest);
   }
 
   /// Adds the places reached to the next level, after so many code units, and reads the leaves.
@@ -259,19 +263,20 @@ class BandedWalk {
     WalkMemory::Ending* endingsEnd = _memory.nextEndings.roomFor(count);
     WalkMemory::Reached* leavesEnd = _memory.leaves.roomFor(count);
     const auto slots = _tree.slots;
+    const auto level = _automaton.level(depth);
     for (const auto& reached : _memory.reached) {
       const std::uint32_t index = reached.target & TreeSlot::kIndex;
       const unsigned isLeaf = reached.target / TreeSlot::kLeaf;
       const auto ends = static_cast<std::uint32_t>(reached.children & kEnd);
-      const unsigned isWanted =
-          (reached.children & _automaton.wanted(reached.state, depth)) != 0 ? 1 : 0;
-      const std::uint32_t distance = _automaton.distance(reached.state, depth);
+      const std::uint64_t wanted = level.wanted(reached.state);
+      const unsigned isWanted = (reached.children & wanted) != 0 ? 1 : 0;
+      const std::uint32_t distance = level.distance(reached.state);
       const unsigned isAccepted = distance != Automaton::kNotAccepted ? 1 : 0;
       // A leaf's flag makes this more than there are slots.
       const std::uint32_t child = reached.target & (TreeSlot::kLeaf | TreeSlot::kIndex);
       __builtin_prefetch(slots.data() + (child < slots.size() ? child : 0));
       *leavesEnd = reached;
-      leavesEnd += isLeaf;
+      leavesEnd += isLeaf & (image::mayHold(reached.children, wanted | isAccepted) ? 1 : 0);
       *levelEnd = {reached.children & ~kEnd, index + ends, reached.state};
       levelEnd += isWanted & ~isLeaf;
       *endingsEnd = {index, distance};
@@ -336,6 +341,10 @@ class BandedWalk {
       for (; (codes & Tails::kCodeMask) != 0; codes >>= Tails::kCodeBits, ++position) {
         const auto label = static_cast<std::uint16_t>(codes & Tails::kCodeMask);
         reached[position + 1] = _automaton.nextAnywhere(reached[position], depth + position, label);
+        // Amid other words it takes longer to go on behind the label than to read on.
+        if (words == 1 && reached[position + 1] == Automaton::kDead) {
+          return;
+        }
       }
       const std::uint32_t distance =
           _automaton.distanceAnywhere(reached[position], depth + position);

@@ -61,8 +61,31 @@ class LazyAutomaton {
     return set == 0 ? kDead : numberOf(1, set, distanceOf(1, {set, set}));
   }
 
-  /// The state behind a code unit read in another, which is after `depth` code units.
-  Number next(Number from, std::size_t depth, std::uint16_t label) {
+  /// What is asked of states after so many code units as the places that are read, or one more.
+  class Level {
+   public:
+    explicit Level(const AutomatonMemory& memory) : _memory(memory) {}
+
+    /// The labels of the children, as bits of their sets, that can lead on from a state.
+    std::uint64_t wanted(Number state) const noexcept { return _memory.states[state].wanted; }
+
+    /// 1 if words that have so many code units more can be of a length that is accepted, else 0.
+    unsigned fits(Number state, std::uint8_t shortest, std::uint8_t longest) const noexcept {
+      const State& at = _memory.states[state];
+      return static_cast<unsigned>(shortest <= at.mostRest) &
+             static_cast<unsigned>(longest >= at.leastRest);
+    }
+
+    /// The distance of a word that ends, or kNotAccepted.
+    std::uint32_t distance(Number state) const noexcept { return _memory.states[state].distance; }
+
+   private:
+    const AutomatonMemory& _memory;
+  };
+  Level level(std::size_t) const noexcept { return Level(_memory); }
+
+  /// The state behind a code unit read in another, which is after `depth` code units, the level's.
+  Number next(const Level&, Number from, std::size_t depth, std::uint16_t label) {
     const std::size_t step = from * kClasses + classOf(depth, label);
     const Number to = _memory.steps[step];
     return to != kUnknown ? to : make(step, from, depth, label);
@@ -70,29 +93,10 @@ class LazyAutomaton {
 
   /// The same, also beyond the depths of all states but the dead one.
   Number nextAnywhere(Number from, std::size_t depth, std::uint16_t label) {
-    return next(from, std::min(depth, _pattern.length() + K), label);
+    return next(level(depth), from, std::min(depth, _pattern.length() + K), label);
   }
 
-  /// The labels of the children, as bits of their sets, that can lead on from a state. This and the
-  /// next two are asked of states after so many code units as the places that are read, or one
-  /// more.
-  std::uint64_t wanted(Number state, std::size_t) const noexcept {
-    return _memory.states[state].wanted;
-  }
-
-  /// Whether words that have so many code units more can be of a length that is accepted.
-  bool fits(Number state, std::size_t, std::uint8_t shortest, std::uint8_t longest) const noexcept {
-    const State& at = _memory.states[state];
-    return (static_cast<int>(shortest <= at.mostRest) &
-            static_cast<int>(longest >= at.leastRest)) != 0;
-  }
-
-  /// The distance of a word that ends, or kNotAccepted.
-  std::uint32_t distance(Number state, std::size_t) const noexcept {
-    return _memory.states[state].distance;
-  }
-
-  /// The same, after any number of code units.
+  /// The distance of a word that ends, after any number of code units, or kNotAccepted.
   std::uint32_t distanceAnywhere(Number state, std::size_t) const noexcept {
     return _memory.states[state].distance;
   }

@@ -93,10 +93,9 @@ void forEachWordAlong(const SearchImage& image, bool backward,
 
 template <typename Automaton, typename Accept>
 void walk(const SearchImage& image, bool backward, const typename Automaton::Pattern& pattern,
-          Accept accept) {
-  const auto memory = image.lendWalkMemory();
+          WalkMemory& memory, Accept accept) {
   const auto& tree = backward ? image.backward() : image.forward();
-  BandedWalk<Automaton>(image, tree, backward, pattern, *memory).run(pattern.start(), accept);
+  BandedWalk<Automaton>(image, tree, backward, pattern, memory).run(pattern.start(), accept);
 }
 
 /// Two walks, each with few edits in the half of the query that it reads first; see
@@ -112,30 +111,32 @@ void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units,
   const auto accept = [&found](std::uint32_t word, std::uint32_t edits, std::size_t) {
     found.push_back({word, edits});
   };
+  const auto memory = image.lendWalkMemory();
   const bool isWhole = units.size() < kMinSplitLength;
   const std::size_t half = (units.size() + kInFirst - kInSecond) / 2;
   const std::vector<QueryUnit> reversed(units.rbegin(), units.rend());
   if constexpr (K <= 2) {
     using Automaton = TableAutomaton<K>;
     using Pattern = TablePattern<K>;
+    static_assert(kInFirst == SwapTable<K>::kInFirst && kInSecond == SwapTable<K>::kInSecond);
     const auto& table = SwapTable<K>::ofFirst(swaps);
     if (isWhole) {
-      walk<Automaton>(image, false, Pattern(units, table), accept);
+      walk<Automaton>(image, false, Pattern(units, table), *memory, accept);
       return;
     }
-    walk<Automaton>(image, false, Pattern(units, table, half), accept);
+    walk<Automaton>(image, false, Pattern(units, table, half), *memory, accept);
     const Pattern second(reversed, SwapTable<K>::ofSecond(swaps), units.size() - half);
-    walk<Automaton>(image, true, second, accept);
+    walk<Automaton>(image, true, second, *memory, accept);
   } else {
     using Automaton = LazyAutomaton<K, 1, SwapPattern<K>>;
     using Pattern = SwapPattern<K>;
     if (isWhole) {
-      walk<Automaton>(image, false, Pattern(units, swaps, {0, K}), accept);
+      walk<Automaton>(image, false, Pattern(units, swaps, {0, K}), *memory, accept);
       return;
     }
-    walk<Automaton>(image, false, Pattern(units, swaps, {half, kInFirst, true}), accept);
+    walk<Automaton>(image, false, Pattern(units, swaps, {half, kInFirst, true}), *memory, accept);
     const Pattern second(reversed, swaps, {units.size() - half, kInSecond, false});
-    walk<Automaton>(image, true, second, accept);
+    walk<Automaton>(image, true, second, *memory, accept);
   }
 }
 

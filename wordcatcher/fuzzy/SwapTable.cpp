@@ -71,6 +71,7 @@ SwapTable<K>::SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder) 
   const std::uint64_t begin = std::uint64_t{1} << K;
 
   std::array<NumberedSets, kStages> setsOf;
+  std::array<std::size_t, kStages> firsts = {};
   for (std::int64_t stage = kFirstStage; stage >= kLastStage; --stage) {
     // The first stage and the next share their sets, and the last one is followed by itself.
     auto& sets = setsOf[indexOf(stage == kFirstStage ? stage - 1 : stage)];
@@ -80,7 +81,7 @@ SwapTable<K>::SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder) 
       _starts[indexOf(stage)] =
           sets.numberOf(pattern.closedAt(begin, depth) & pattern.validAt(depth));
     }
-    _firsts[indexOf(stage)] = _states.size();
+    firsts[indexOf(stage)] = _states.size();
     for (std::size_t number = 0; number < sets.size(); ++number) {
       const std::uint64_t set = sets[number];
       State state = stateOf<K>(set);
@@ -98,6 +99,9 @@ SwapTable<K>::SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder) 
       }
       _states.push_back(state);
     }
+  }
+  for (std::size_t i = 0; i < kStages; ++i) {
+    _stages[i] = {_states.data() + firsts[i], _steps.data() + firsts[i] * kMatchings};
   }
 }
 

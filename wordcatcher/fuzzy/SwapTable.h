@@ -12,6 +12,7 @@
 // Unlike those of a SwapPattern the sets may hold states behind the end of the query. From these
 // nothing is accepted, nor do they keep a walk alive that the others would not.
 
+#include <algorithm>
 #include <array>
 #include <cstddef>
 #include <cstdint>
@@ -66,15 +67,15 @@ class SwapTable {
     }
   };
 
+  SwapTable(const SwapTable&) = delete;
+  SwapTable& operator=(const SwapTable&) = delete;
+
   /// The table of the first walk, in which the head holds its border, or of the second. Made when
   /// it is first asked for. Safe for any number of threads.
   static const SwapTable& ofFirst(bool swaps);
   static const SwapTable& ofSecond(bool swaps);
 
-  Stage stage(std::int64_t stage) const noexcept {
-    const std::size_t first = _firsts[indexOf(stage)];
-    return {_states.data() + first, _steps.data() + first * kMatchings};
-  }
+  const Stage& stage(std::int64_t stage) const noexcept { return _stages[indexOf(stage)]; }
 
   /// The set before anything is read; the stage is at least 0, or kLastStage for no limit.
   Number start(std::int64_t stage) const noexcept { return _starts[indexOf(stage)]; }
@@ -85,14 +86,11 @@ class SwapTable {
   static const SwapTable& made();
 
   static std::size_t indexOf(std::int64_t stage) noexcept {
-    return static_cast<std::size_t>((stage < kLastStage    ? kLastStage
-                                     : stage > kFirstStage ? kFirstStage
-                                                           : stage) -
-                                    kLastStage);
+    return static_cast<std::size_t>(std::clamp(stage, kLastStage, kFirstStage) - kLastStage);
   }
   static constexpr std::size_t kStages = kFirstStage - kLastStage + 1;
 
-  std::array<std::size_t, kStages> _firsts = {};
+  std::array<Stage, kStages> _stages = {};
   std::array<Number, kStages> _starts = {};
   std::vector<State> _states;
   std::vector<Number> _steps;
