@@ -101,10 +101,9 @@ void expectLimits(std::size_t length, std::uint16_t letters) {
   const auto words = labelsUpTo(length + 1, letters);
   std::size_t accepted = 0;
   for (const auto& query : labelsUpTo(length, letters)) {
-    std::vector<QueryUnit> units;
-    for (const std::uint16_t label : query) {
-      units.push_back({.label = label});
-    }
+    std::vector<QueryUnit> units(query.size());
+    std::transform(query.begin(), query.end(), units.begin(),
+                   [](std::uint16_t label) { return QueryUnit{.label = label}; });
     for (std::size_t head = 0; head <= query.size(); ++head) {
       for (unsigned edits = 0; edits <= K; ++edits) {
         for (const bool holdsBorder : {false, true}) {

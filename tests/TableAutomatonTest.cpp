@@ -30,10 +30,9 @@ std::vector<Labels> labelsUpTo(std::size_t length, std::uint16_t letters) {
 }
 
 std::vector<QueryUnit> unitsOf(const Labels& query) {
-  std::vector<QueryUnit> units;
-  for (const std::uint16_t label : query) {
-    units.push_back({.label = label});
-  }
+  std::vector<QueryUnit> units(query.size());
+  std::transform(query.begin(), query.end(), units.begin(),
+                 [](std::uint16_t label) { return QueryUnit{.label = label}; });
   return units;
 }
 

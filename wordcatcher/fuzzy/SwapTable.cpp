@@ -75,7 +75,7 @@ SwapTable<K>::SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder) 
   for (std::int64_t stage = kFirstStage; stage >= kLastStage; --stage) {
     // The first stage and the next share their sets, and the last one is followed by itself.
     auto& sets = setsOf[indexOf(stage == kFirstStage ? stage - 1 : stage)];
-    auto& next = setsOf[indexOf(stage == kFirstStage ? stage - 1 : stage - 1)];
+    auto& next = setsOf[indexOf(stage - 1)];
     const auto depth = static_cast<std::size_t>(static_cast<std::int64_t>(kHead) - stage);
     if (stage >= 0 || stage == kLastStage) {
       _starts[indexOf(stage)] =
