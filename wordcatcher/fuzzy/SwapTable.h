@@ -42,8 +42,8 @@ class SwapTable {
   static constexpr unsigned kInFirst = K / 2;
   static constexpr unsigned kInSecond = K - kInFirst - 1;
 
-  /// Stages behind the head, up to those in which it is not in sight, and in which the next one is
-  /// like this.
+  /// From the last stage on no state is limited any more. From the first one back all are, and
+  /// after one more code unit as well.
   static constexpr std::int64_t kLastStage = -static_cast<std::int64_t>(K) - 1;
   static constexpr std::int64_t kFirstStage = std::int64_t{K} + 2;
 
