@@ -81,7 +81,8 @@ struct Literal {
     for (std::size_t depth = 0; depth < word.size(); ++depth) {
       const std::uint64_t byEdit = pattern.editedAt(sets.back(), depth);
       const std::uint64_t match = pattern.matchedAt(sets.back(), depth, word[depth]);
-      const std::uint64_t set = (byEdit | B::closed(match)) & pattern.validAt(depth + 1);
+      const std::uint64_t set =
+          (byEdit | pattern.closedAt(match, depth + 1)) & pattern.validAt(depth + 1);
       if ((set & B::kLane) == 0) {
         break;
       }
@@ -138,7 +139,8 @@ class Reader {
         EXPECT_TRUE(!goesOn || word[depth] == 0 || (_automaton[state].wanted & bit) != 0);
         const auto next = _automaton.nextAnywhere(state, depth, word[depth]);
         EXPECT_EQ(next != Automaton::kDead, goesOn);
-        EXPECT_EQ(_automaton.next(state, depth, word[depth]), next) << "made";
+        EXPECT_EQ(_automaton.next(_automaton.level(depth), state, depth, word[depth]), next)
+            << "made";
         state = next;
       }
     }
@@ -174,7 +176,7 @@ class Reader {
   void expectBehind(std::uint32_t state, std::size_t depth, const Labels& word,
                     std::optional<std::uint32_t> ofWhole) const {
     if (!word.empty()) {
-      EXPECT_EQ(_automaton.distanceBehind(state, word.size(),
+      EXPECT_EQ(_automaton.distanceBehind(state, depth, word.size(),
                                           [&word](std::size_t at) { return word[at]; }),
                 ofWhole.value_or(Automaton::kNotAccepted));
     }
@@ -206,6 +208,11 @@ std::size_t anyLength(Random& random) {
   }
 }
 
+HeadLimit anyLimit(Random& random, std::size_t length, unsigned mostEdits) {
+  return {random() % (length + 1), static_cast<unsigned>(random() % (mostEdits + 1)),
+          random() % 2 == 0};
+}
+
 constexpr int kQueries = 400;
 constexpr int kWords = 20;
 
@@ -231,8 +238,7 @@ void expectBanded() {
     const std::size_t letters = 1 + random() % kLabels.size();
     const auto units = anyQuery(random, anyLength(random), letters, i % 3 == 0);
     const bool backward = i % 2 == 0;
-    const std::size_t restricted = random() % (units.size() + 1);
-    const BandedPattern<K, Lanes> pattern(units, restricted, random() % (K + 1));
+    const BandedPattern<K, Lanes> pattern(units, anyLimit(random, units.size(), K));
     accepted +=
         readWords<K, Lanes>(units, pattern, backward ? pattern.closedStart() : pattern.start(),
                             backward, letters, random, memory);
@@ -262,8 +268,7 @@ void expectSwaps() {
   for (int i = 0; i < kQueries && !::testing::Test::HasFailure(); ++i) {
     const std::size_t letters = 1 + random() % kLabels.size();
     const auto units = anyQuery(random, anyLength(random), letters, false);
-    const std::size_t restricted = random() % (units.size() + 1);
-    const SwapPattern<K> pattern(units, i % 2 == 0, restricted, random() % (K + 1));
+    const SwapPattern<K> pattern(units, i % 2 == 0, anyLimit(random, units.size(), K));
     accepted += readWords<K, 1>(units, pattern, pattern.start(), false, letters, random, memory);
   }
   EXPECT_GT(accepted, kQueries * kWords / 20) << "words that tell something";
@@ -277,7 +282,7 @@ TEST(LazyAutomatonTest, WithSwaps) {
 
 TEST(LazyAutomatonTest, MakesEachStateOnce) {
   const std::vector<QueryUnit> units(200, {.label = 1});
-  const BandedPattern<2> pattern(units, 0, 2);
+  const BandedPattern<2> pattern(units, {0, 2});
   AutomatonMemory memory;
   LazyAutomaton<2, 1, BandedPattern<2>> automaton(pattern, false, memory);
   automaton.begin();
@@ -285,7 +290,7 @@ TEST(LazyAutomatonTest, MakesEachStateOnce) {
   for (int round = 0; round < 2; ++round) {
     auto state = automaton.at(0, pattern.start());
     for (std::size_t depth = 0; depth < units.size(); ++depth) {
-      state = automaton.next(state, depth, 1);
+      state = automaton.next(automaton.level(depth), state, depth, 1);
     }
     EXPECT_EQ(automaton[state].distance, 0U);
     EXPECT_TRUE(round == 0 || memory.states.size() == known);

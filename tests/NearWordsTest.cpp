@@ -76,6 +76,10 @@ class Words {
     return matches;
   }
 
+  std::vector<NearWord> near(std::u16string_view query, std::uint32_t most) const {
+    return nearWords(*_image, query, most, true);
+  }
+
   void expectExact(std::u16string_view query) const {
     const auto found = exactWord(*_image, query);
     const auto expected = std::lower_bound(_words.begin(), _words.end(), query);
@@ -230,6 +234,44 @@ std::u16string withEdits(std::u16string word, int edits, std::u16string_view let
     }
   }
   return word;
+}
+
+TEST(NearWordsTest, AHundredThousandLetters) {
+  // Too long for the table of the textbook, and for any walk that is not linear in the word.
+  std::mt19937 random(14);  // NOLINT(cert-msc32-c,cert-msc51-cpp): the same every time
+  std::u16string word;
+  while (word.size() < 100'000) {
+    word += static_cast<char16_t>(u'a' + random() % 20);
+  }
+  std::vector<std::u16string> words = {word};
+  std::vector<std::uint32_t> edits = {0};
+  for (const std::size_t place : {std::size_t{0}, word.size() / 2, word.size() - 1}) {
+    auto other = word;
+    other[place] = u'x';
+    words.push_back(other);
+    edits.push_back(1);
+    other.insert(word.size() / 2, 1, u'y');
+    words.push_back(other);
+    edits.push_back(2);
+    other.erase(word.size() - 10, 1);
+    words.push_back(other);
+    edits.push_back(3);
+  }
+  const Words world(words);
+  for (std::uint32_t most = 0; most <= kMostEdits; ++most) {
+    std::vector<std::uint32_t> expected;
+    for (const auto& each : world.all()) {
+      const auto place = std::find(words.begin(), words.end(), each) - words.begin();
+      if (edits[static_cast<std::size_t>(place)] <= most) {
+        expected.push_back(edits[static_cast<std::size_t>(place)]);
+      }
+    }
+    std::vector<std::uint32_t> found;
+    for (const auto& near : world.near(word, most)) {
+      found.push_back(near.edits);
+    }
+    EXPECT_EQ(found, expected) << most;
+  }
 }
 
 TEST(NearWordsTest, LongWords) {

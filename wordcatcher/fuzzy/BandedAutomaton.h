@@ -52,37 +52,27 @@ struct Band {
   static constexpr std::uint64_t kStarts = inLanes(rowStarts(0, K + 1));
   static constexpr std::uint64_t kBelowLastRow = inLanes(rowStarts(0, K) * kRow);
 
-  /// The states that have room for so many more rows up, and columns up.
-  template <unsigned Moves>
-  static constexpr std::uint64_t kRoomFor = inLanes(rowStarts(0, K + 1 - Moves) * (kRow >> Moves));
+  /// The states below the last row that have room for one more column.
+  static constexpr std::uint64_t kRoom = inLanes(rowStarts(0, K) * (kRow >> 1));
 
-  /// Adds what `Moves` missing code units lead to.
-  template <unsigned Moves>
-  static constexpr std::uint64_t withMissing(std::uint64_t states) {
-    return states | (states & kRoomFor<Moves>) << (Moves * (kColumns + 1));
-  }
-
-  /// Adds what missing code units lead to, any number of them.
-  static constexpr std::uint64_t closed(std::uint64_t states) {
-    if constexpr (K > 0) {
-      states = withMissing<1>(states);
-    }
-    if constexpr (K > 1) {
-      states = withMissing < K == 2 ? 1 : 2 > (states);
-    }
-    if constexpr (K > 3) {
-      states = withMissing<K - 3>(states);
+  /// Adds what missing code units lead to, any number of them, each to one of the states `passed`.
+  static constexpr std::uint64_t closed(std::uint64_t states, std::uint64_t passed) {
+    for (unsigned missing = 0; missing < K; ++missing) {
+      states |= ((states & kRoom) << (kColumns + 1)) & passed;
     }
     return states;
   }
 
-  /// What reading any one code unit leads to by an edit. Closed when `states` are: a code unit that
-  /// is missing behind the edit may as well be missing before it.
-  static constexpr std::uint64_t edited(std::uint64_t states) {
+  /// What reading any one code unit leads to by an edit; in place of one of the query's, to one of
+  /// the states `passed`. Closed when `states` are: a code unit that is missing behind the edit may
+  /// as well be missing before it.
+  static constexpr std::uint64_t edited(std::uint64_t states, std::uint64_t passed) {
     if constexpr (K == 0) {
       return 0;
     } else {
-      return ((states & kBelowLastRow) | ((states >> 1) & kRoomFor<1>)) << kColumns;
+      const std::uint64_t inserted = ((states >> 1) & kRoom) << kColumns;
+      const std::uint64_t replaced = (states & kBelowLastRow) << kColumns;
+      return inserted | (replaced & passed);
     }
   }
 
@@ -119,39 +109,49 @@ class BandedPattern : public QueryPattern<K, Band<K>::kColumns> {
  public:
   using B = Band<K, Lanes>;
 
-  /// In lane 0 `restricted` code units at the head may only be passed with at most `edits` edits.
-  /// The units must live as long as this does.
-  BandedPattern(std::span<const QueryUnit> units, std::size_t restricted, unsigned edits)
-      : Base(units, B::kStarts, [=](std::uint64_t inside, auto before) {
-          const std::uint64_t head = inside & before(static_cast<std::int64_t>(restricted));
-          return (inside * B::kStarts) & ~(head * B::rowStarts(edits + 1, K + 1));
-        }) {}
+  /// The head's limit holds in lane 0. The units must live as long as this does.
+  BandedPattern(std::span<const QueryUnit> units, HeadLimit limit)
+      : Base(units, B::kStarts,
+             [limit](std::uint64_t inside, auto before) -> typename Base::Allowed {
+               const auto head = static_cast<std::int64_t>(limit.units);
+               const std::uint64_t tooMany = B::rowStarts(limit.edits + 1, K + 1);
+               const std::uint64_t whole = inside * B::kStarts;
+               const std::uint64_t passed = whole & ~((inside & before(head + 1)) * tooMany);
+               return {limit.holdsBorder ? passed : whole & ~((inside & before(head)) * tooMany),
+                       passed};
+             }) {}
 
   /// The states before anything is read: nothing is accounted for, and leaving out the head of the
   /// query is not allowed yet.
   std::uint64_t start() const noexcept { return B::inLanes(std::uint64_t{1} << K); }
 
   /// The same, with the head left out as well.
-  std::uint64_t closedStart() const noexcept { return B::closed(start()) & Base::validAt(0); }
+  std::uint64_t closedStart() const noexcept { return closedAt(start(), 0) & Base::validAt(0); }
 
   std::uint64_t step(std::uint64_t states, std::size_t depth, std::uint16_t label) const noexcept {
-    return (editedAt(states, depth) | B::closed(matchedAt(states, depth, label))) &
+    return (editedAt(states, depth) | closedAt(matchedAt(states, depth, label), depth + 1)) &
            Base::validAt(depth + 1);
+  }
+
+  /// Adds what missing code units lead to, after so many code units read.
+  std::uint64_t closedAt(std::uint64_t states, std::size_t depth) const noexcept {
+    return B::closed(states, Base::passedAt(depth));
   }
 
   /// The two parts of a step apart, neither masked by what is valid at the next depth. No missing
   /// code units follow the second.
   std::uint64_t editedAt(std::uint64_t states, std::size_t depth) const noexcept {
+    const std::uint64_t edited = B::edited(states, Base::passedAt(depth + 1));
     // The states before anything is read need not be closed.
-    return depth == 0 ? B::closed(B::edited(states)) : B::edited(states);
+    return depth == 0 ? closedAt(edited, 1) : edited;
   }
   std::uint64_t matchedAt(std::uint64_t states, std::size_t depth,
                           std::uint16_t label) const noexcept {
     return B::matched(states, Base::matching(depth, label));
   }
 
-  /// The columns behind which a code unit may match.
-  std::uint64_t matchableColumns(std::uint64_t states) const noexcept {
+  /// The columns behind which a code unit may match, after so many code units read.
+  std::uint64_t matchableColumns(std::uint64_t states, std::size_t) const noexcept {
     return B::columnsOf(states);
   }
 

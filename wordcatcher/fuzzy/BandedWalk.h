@@ -16,8 +16,6 @@
 #include <utility>
 #include <vector>
 
-#include "wordcatcher/fuzzy/BandedAutomaton.h"
-#include "wordcatcher/fuzzy/LazyAutomaton.h"
 #include "wordcatcher/storage/LeafTails.h"
 #include "wordcatcher/storage/SearchImage.h"
 #include "wordcatcher/storage/WalkMemory.h"
@@ -66,17 +64,17 @@ class VisitBudget {
   std::uint64_t _units;
 };
 
-/// One walk; see LazyAutomaton for what it accepts.
+/// One walk. `Automaton` is a LazyAutomaton or a TableAutomaton; see there for what is accepted.
 ///
 /// Each level takes three passes: over the children of its places, of which those are kept at which
 /// the automaton is alive; over these, to tell leaves and places; and over the leaves. So each has
 /// few branches, and those that there are can mostly be foretold.
-template <unsigned K, unsigned Lanes, typename Pattern = BandedPattern<K, Lanes>>
+template <typename Automaton>
 class BandedWalk {
  public:
-  using B = typename Pattern::B;
-  using Automaton = LazyAutomaton<K, Lanes, Pattern>;
+  using Pattern = typename Automaton::Pattern;
   using Number = typename Automaton::Number;
+  using Level = typename Automaton::Level;
 
   /// All must live as long as this does; of walks with the same memory one is run after the other.
   BandedWalk(const SearchImage& image, const SearchImage::Tree& tree, bool backward,
@@ -88,9 +86,9 @@ class BandedWalk {
         _memory(memory),
         _budget(image, tree) {}
 
-  /// Calls `accept(word, distance, length)` for each word accepted.
-  template <typename Accept>
-  void run(std::uint64_t start, Accept accept) {
+  /// Calls `accept(word, distance, length)` for each word accepted. `start`: of the pattern.
+  template <typename Start, typename Accept>
+  void run(Start start, Accept accept) {
     begin();
     const TreeSlot& root = _tree.slots[0];
     _memory.level.add({root.children & ~kEnd, root.index(), _automaton.at(0, start)});
@@ -100,15 +98,13 @@ class BandedWalk {
   /// The walk of a query whose first code unit can only be an insertion.
   template <typename Accept>
   void runAfterInsertion(Accept accept) {
-    if constexpr (K > 0) {
-      begin();
-      const TreeSlot& root = _tree.slots[0];
-      reachAll(root.children & ~kEnd, root.index(),
-               [state = _automaton.afterInsertion()](std::uint16_t) { return state; });
-      sortOut(1);
-      goOn();
-      finish(1, accept);
-    }
+    begin();
+    const TreeSlot& root = _tree.slots[0];
+    reachAll(root.children & ~kEnd, root.index(), _automaton.level(1),
+             [state = _automaton.afterInsertion()](std::uint16_t) { return state; });
+    sortOut(1);
+    goOn();
+    finish(1, accept);
   }
 
  private:
@@ -121,6 +117,7 @@ class BandedWalk {
     std::uint32_t place;
     std::uint32_t word;
     Number state;
+    std::size_t depth;
   };
   static constexpr std::size_t kLeafWords = 64;
 
@@ -135,11 +132,14 @@ class BandedWalk {
   template <typename Accept>
   void finish(std::size_t depth, Accept& accept) {
     for (; _memory.level.size() + _memory.endings.size() > 0; ++depth) {
+      _automaton.enter(depth);
       for (const auto& ending : _memory.endings) {
         readEnding(ending, depth);
       }
+      const auto here = _automaton.level(depth);
+      const auto next = _automaton.level(depth + 1);
       for (const auto& place : _memory.level) {
-        expand(place, depth);
+        expand(place, depth, here, next);
         if (_memory.reached.size() >= kSortedAtOnce) {
           sortOut(depth + 1);
         }
@@ -184,74 +184,76 @@ class BandedWalk {
     return _tree.slots.data() + first;
   }
 
-  void expand(const WalkMemory::Place& place, std::size_t depth) {
-    const std::uint64_t wanted = place.children & _automaton[place.state].wanted;
+  void expand(const WalkMemory::Place& place, std::size_t depth, const Level& here,
+              const Level& next) {
+    const std::uint64_t wanted = place.children & here.wanted(place.state);
     const auto step = [&](std::uint16_t label) {
-      return _automaton.next(place.state, depth, label);
+      return _automaton.next(here, place.state, depth, label);
     };
     if (wanted == place.children) {
-      reachAll(place.children, place.first, step);
+      reachAll(place.children, place.first, next, step);
     } else {
-      reachSome(place.children, wanted, place.first, step);
+      reachSome(place.children, wanted, place.first, next, step);
     }
   }
 
   /// The places behind the edges to all children.
   template <typename Step>
-  void reachAll(std::uint64_t children, std::size_t first, Step step) {
+  void reachAll(std::uint64_t children, std::size_t first, const Level& next, Step step) {
     const std::uint64_t common = children & ~kRare;
     const std::size_t count = bitCount(common);
     _budget.spendSlots(count);
     const TreeSlot* slot = childrenAt(first, count);
     WalkMemory::Reached* end = _memory.reached.roomFor(count);
     for (std::uint64_t bits = common; bits != 0; bits &= bits - 1, ++slot) {
-      end = reach(*slot, step(static_cast<std::uint16_t>(std::countr_zero(bits))), end);
+      end = reach(*slot, step(static_cast<std::uint16_t>(std::countr_zero(bits))), next, end);
     }
     _memory.reached.endAt(end);
     if ((children & kRare) != 0) {
-      reachRare(first + count, step);
+      reachRare(first + count, next, step);
     }
   }
 
   /// The places behind the edges to some of them.
   template <typename Step>
-  void reachSome(std::uint64_t children, std::uint64_t wanted, std::size_t first, Step step) {
+  void reachSome(std::uint64_t children, std::uint64_t wanted, std::size_t first, const Level& next,
+                 Step step) {
     const std::uint64_t common = children & ~kRare;
     for (std::uint64_t bits = common & wanted; bits != 0; bits &= bits - 1) {
       const std::size_t child = first + bitCount(common & ((bits & -bits) - 1));
-      reachOne(*childrenAt(child, 1), step(static_cast<std::uint16_t>(std::countr_zero(bits))));
+      reachOne(*childrenAt(child, 1), step(static_cast<std::uint16_t>(std::countr_zero(bits))),
+               next);
     }
     if ((wanted & kRare) != 0) {
-      reachRare(first + bitCount(common), step);
+      reachRare(first + bitCount(common), next, step);
     }
   }
 
   template <typename Step>
-  void reachRare(std::size_t child, Step step) {
+  void reachRare(std::size_t child, const Level& next, Step step) {
     for (;; ++child) {
       const TreeSlot& slot = *childrenAt(child, 1);
       if (slot.label < image::kRareBit) {
         _image.throwDamaged("a tree leads out of its section");
       }
-      reachOne(slot, step(slot.label));
+      reachOne(slot, step(slot.label), next);
       if (slot.isLastChild()) {
         return;
       }
     }
   }
 
-  void reachOne(const TreeSlot& slot, Number state) {
+  void reachOne(const TreeSlot& slot, Number state, const Level& next) {
     _budget.spendSlots(1);
-    _memory.reached.endAt(reach(slot, state, _memory.reached.roomFor(1)));
+    _memory.reached.endAt(reach(slot, state, next, _memory.reached.roomFor(1)));
   }
 
-  /// A place is kept if words behind it are of a length that can still be accepted. None is in the
-  /// dead state.
-  WalkMemory::Reached* reach(const TreeSlot& slot, Number state, WalkMemory::Reached* end) const {
-    const auto& at = _automaton[state];
+  /// A place of the next level is kept if words behind it are of a length that can still be
+  /// accepted. None is in the dead state.
+  WalkMemory::Reached* reach(const TreeSlot& slot, Number state, const Level& next,
+                             WalkMemory::Reached* end) const {
     *end = {slot.children, slot.target, state};
-    return end + (static_cast<int>(slot.shortest <= at.mostRest) &
-                  static_cast<int>(slot.longest >= at.leastRest));
+    return end + next.fits(state, slot.shortest, slot.longest);
   }
 
   /// Adds the places reached to the next level, after so many code units, and reads the leaves.
@@ -261,21 +263,23 @@ class BandedWalk {
     WalkMemory::Ending* endingsEnd = _memory.nextEndings.roomFor(count);
     WalkMemory::Reached* leavesEnd = _memory.leaves.roomFor(count);
     const auto slots = _tree.slots;
+    const auto level = _automaton.level(depth);
     for (const auto& reached : _memory.reached) {
-      const auto& state = _automaton[reached.state];
       const std::uint32_t index = reached.target & TreeSlot::kIndex;
       const unsigned isLeaf = reached.target / TreeSlot::kLeaf;
       const auto ends = static_cast<std::uint32_t>(reached.children & kEnd);
-      const unsigned isWanted = (reached.children & state.wanted) != 0 ? 1 : 0;
-      const unsigned isAccepted = state.distance != Automaton::kNotAccepted ? 1 : 0;
+      const std::uint64_t wanted = level.wanted(reached.state);
+      const unsigned isWanted = (reached.children & wanted) != 0 ? 1 : 0;
+      const std::uint32_t distance = level.distance(reached.state);
+      const unsigned isAccepted = distance != Automaton::kNotAccepted ? 1 : 0;
       // A leaf's flag makes this more than there are slots.
       const std::uint32_t child = reached.target & (TreeSlot::kLeaf | TreeSlot::kIndex);
       __builtin_prefetch(slots.data() + (child < slots.size() ? child : 0));
       *leavesEnd = reached;
-      leavesEnd += isLeaf;
+      leavesEnd += isLeaf & (image::mayHold(reached.children, wanted | isAccepted) ? 1 : 0);
       *levelEnd = {reached.children & ~kEnd, index + ends, reached.state};
       levelEnd += isWanted & ~isLeaf;
-      *endingsEnd = {index, state.distance};
+      *endingsEnd = {index, distance};
       endingsEnd += isAccepted & ends & ~isLeaf;
     }
     _memory.nextLevel.endAt(levelEnd);
@@ -317,7 +321,7 @@ class BandedWalk {
       } else {
         __builtin_prefetch(&_tree.order[place]);
       }
-      _leafWords[_leafWordCount++] = {place, 0, leaf.state};
+      _leafWords[_leafWordCount++] = {place, 0, leaf.state, depth};
       if (_leafWordCount == kLeafWords) {
         readLeafWords();
       }
@@ -337,8 +341,13 @@ class BandedWalk {
       for (; (codes & Tails::kCodeMask) != 0; codes >>= Tails::kCodeBits, ++position) {
         const auto label = static_cast<std::uint16_t>(codes & Tails::kCodeMask);
         reached[position + 1] = _automaton.nextAnywhere(reached[position], depth + position, label);
+        // Amid other words it takes longer to go on behind the label than to read on.
+        if (words == 1 && reached[position + 1] == Automaton::kDead) {
+          return;
+        }
       }
-      const std::uint32_t distance = _automaton[reached[position]].distance;
+      const std::uint32_t distance =
+          _automaton.distanceAnywhere(reached[position], depth + position);
       if (distance != Automaton::kNotAccepted) {
         addFound(place, distance, depth + position);
       }
@@ -375,13 +384,14 @@ class BandedWalk {
     const auto labels = _image.labelsOf(leaf.word);
     _budget.spendUnits(labels.size());
     const std::size_t length = labels.size();
-    if (length < _automaton[leaf.state].depth) {
+    if (length < leaf.depth) {
       return;
     }
+    const auto labelAt = [this, &labels, length](std::size_t depth) {
+      return _backward ? labels[length - 1 - depth] : labels[depth];
+    };
     const std::uint32_t distance =
-        _automaton.distanceBehind(leaf.state, length, [this, &labels, length](std::size_t depth) {
-          return _backward ? labels[length - 1 - depth] : labels[depth];
-        });
+        _automaton.distanceBehind(leaf.state, leaf.depth, length, labelAt);
     if (distance != Automaton::kNotAccepted) {
       addFound(leaf.place, distance, length);
     }

@@ -8,6 +8,7 @@
 
 #include "wordcatcher/fuzzy/BandedAutomaton.h"
 #include "wordcatcher/fuzzy/BandedWalk.h"
+#include "wordcatcher/fuzzy/LazyAutomaton.h"
 
 namespace wordcatcher {
 
@@ -15,6 +16,9 @@ namespace {
 
 constexpr char16_t kAny = u'*';
 constexpr char16_t kEmptyMove = u'_';
+
+template <unsigned K, unsigned Lanes>
+using Walk = BandedWalk<LazyAutomaton<K, Lanes, BandedPattern<K, Lanes>>>;
 
 /// Beyond this many edits the rows no longer fit into 64 bits.
 constexpr std::int64_t kMaxBandedDistance = 4;
@@ -105,11 +109,12 @@ std::optional<std::uint32_t> judge(const SearchImage& image, const BandedPattern
 }
 
 /// Of K edits at least one half of the query carries few: K / 2 in the first or the rest less one
-/// in the second. Two walks, each with few edits in the half that it reads first, meet every word
-/// within K edits and visit far fewer places than one walk that allows all edits everywhere. They
-/// meet some at a greater cost than need be, and some that the automaton does not accept, since
-/// it cannot leave out the head of the query. So the whole automaton goes along in a lane of its
-/// own; where there is no room for it, each word is judged by itself.
+/// in the second, where what is inserted between them counts as in the first. Two walks, each with
+/// few edits in the half that it reads first, meet every word within K edits and visit far fewer
+/// places than one walk that allows all edits everywhere. They meet some at a greater cost than
+/// need be, and some that the automaton does not accept, since it cannot leave out the head of the
+/// query. So the whole automaton goes along in a lane of its own; where there is no room for it,
+/// each word is judged by itself.
 template <unsigned K>
 void searchByHalves(const SearchImage& image, const Query& query, HitList& hits) {
   constexpr unsigned kLanes = 2 * Band<K>::kLaneBits <= 64 ? 2 : 1;
@@ -119,11 +124,11 @@ void searchByHalves(const SearchImage& image, const Query& query, HitList& hits)
   // Where the halves differ in edits, the one that allows more is the longer one.
   const std::size_t half = (length + kInFirst - kInSecond) / 2;
   const std::vector<QueryUnit> reversed(query.units.rbegin(), query.units.rend());
-  const BandedPattern<K, kLanes> first(query.units, half, kInFirst);
-  const BandedPattern<K, kLanes> second(reversed, length - half, kInSecond);
+  const BandedPattern<K, kLanes> first(query.units, {half, kInFirst, true});
+  const BandedPattern<K, kLanes> second(reversed, {length - half, kInSecond, false});
   const auto memory = image.lendWalkMemory();
-  BandedWalk<K, kLanes> forward(image, image.forward(), false, first, *memory);
-  BandedWalk<K, kLanes> backward(image, image.backward(), true, second, *memory);
+  Walk<K, kLanes> forward(image, image.forward(), false, first, *memory);
+  Walk<K, kLanes> backward(image, image.backward(), true, second, *memory);
   if constexpr (kLanes == 2) {
     const auto accept = [&hits](std::uint32_t word, std::uint32_t distance, std::size_t size) {
       hits.add(word, distance, size);
@@ -131,7 +136,7 @@ void searchByHalves(const SearchImage& image, const Query& query, HitList& hits)
     forward.run(first.start(), accept);
     backward.run(second.closedStart(), accept);
   } else {
-    const BandedPattern<K> whole(query.units, 0, K);
+    const BandedPattern<K> whole(query.units, {0, K});
     const auto accept = [&](std::uint32_t word, std::uint32_t, std::size_t size) {
       if (const auto distance = judge<K>(image, whole, word)) {
         hits.add(word, *distance, size);
@@ -150,16 +155,16 @@ void searchBanded(const SearchImage& image, const Query& query, HitList& hits) {
     }
     return;
   }
-  const BandedPattern<K> pattern(query.units, 0, K);
+  const BandedPattern<K> pattern(query.units, {0, K});
   const auto memory = image.lendWalkMemory();
-  BandedWalk<K, 1> walk(image, image.forward(), false, pattern, *memory);
+  Walk<K, 1> walk(image, image.forward(), false, pattern, *memory);
   const auto accept = [&hits](std::uint32_t word, std::uint32_t distance, std::size_t size) {
     hits.add(word, distance, size);
   };
-  if (query.beginsWithEmptyMove) {
-    walk.runAfterInsertion(accept);
-  } else {
+  if (!query.beginsWithEmptyMove) {
     walk.run(pattern.start(), accept);
+  } else if constexpr (K > 0) {
+    walk.runAfterInsertion(accept);
   }
 }
 

@@ -22,12 +22,13 @@
 
 namespace wordcatcher {
 
-/// `Pattern` is a BandedPattern or a SwapPattern. With two lanes a word is accepted when lane 0
-/// accepts it, at the distance in lane 1, if that accepts it, too: forward as from the start;
+/// `QueryPattern` is a BandedPattern or a SwapPattern. With two lanes a word is accepted when lane
+/// 0 accepts it, at the distance in lane 1, if that accepts it, too: forward as from the start;
 /// backward so that nothing is left out behind the last code unit read, which is the word's first.
-template <unsigned K, unsigned Lanes, typename Pattern>
+template <unsigned K, unsigned Lanes, typename QueryPattern>
 class LazyAutomaton {
  public:
+  using Pattern = QueryPattern;
   using B = typename Pattern::B;
   using Number = std::uint32_t;
   using State = AutomatonMemory::State;
@@ -46,18 +47,45 @@ class LazyAutomaton {
     _memory.slots.assign(kFewestSlots, 0);
   }
 
+  /// Before places after so many code units are read, those after 0 first.
+  void enter(std::size_t) noexcept {}
+
   /// The state of a set of states of the pattern's after `depth` code units, at which no word ends.
   Number at(std::size_t depth, std::uint64_t set) { return numberOf(depth, set, kNotAccepted); }
 
   /// The state after one code unit that can only be an insertion.
   Number afterInsertion() {
     const std::uint64_t set =
-        B::closed(B::inLanes(std::uint64_t{1} << (B::kColumns + K - 1))) & _pattern.validAt(1);
+        _pattern.closedAt(B::inLanes(std::uint64_t{1} << (B::kColumns + K - 1)), 1) &
+        _pattern.validAt(1);
     return set == 0 ? kDead : numberOf(1, set, distanceOf(1, {set, set}));
   }
 
-  /// The state behind a code unit read in another, which is after `depth` code units.
-  Number next(Number from, std::size_t depth, std::uint16_t label) {
+  /// What is asked of states after so many code units as the places that are read, or one more.
+  class Level {
+   public:
+    explicit Level(const AutomatonMemory& memory) : _memory(memory) {}
+
+    /// The labels of the children, as bits of their sets, that can lead on from a state.
+    std::uint64_t wanted(Number state) const noexcept { return _memory.states[state].wanted; }
+
+    /// 1 if words that have so many code units more can be of a length that is accepted, else 0.
+    unsigned fits(Number state, std::uint8_t shortest, std::uint8_t longest) const noexcept {
+      const State& at = _memory.states[state];
+      return static_cast<unsigned>(shortest <= at.mostRest) &
+             static_cast<unsigned>(longest >= at.leastRest);
+    }
+
+    /// The distance of a word that ends, or kNotAccepted.
+    std::uint32_t distance(Number state) const noexcept { return _memory.states[state].distance; }
+
+   private:
+    const AutomatonMemory& _memory;
+  };
+  Level level(std::size_t) const noexcept { return Level(_memory); }
+
+  /// The state behind a code unit read in another, which is after `depth` code units, the level's.
+  Number next(const Level&, Number from, std::size_t depth, std::uint16_t label) {
     const std::size_t step = from * kClasses + classOf(depth, label);
     const Number to = _memory.steps[step];
     return to != kUnknown ? to : make(step, from, depth, label);
@@ -65,15 +93,20 @@ class LazyAutomaton {
 
   /// The same, also beyond the depths of all states but the dead one.
   Number nextAnywhere(Number from, std::size_t depth, std::uint16_t label) {
-    return next(from, std::min(depth, _pattern.length() + K), label);
+    return next(level(depth), from, std::min(depth, _pattern.length() + K), label);
+  }
+
+  /// The distance of a word that ends, after any number of code units, or kNotAccepted.
+  std::uint32_t distanceAnywhere(Number state, std::size_t) const noexcept {
+    return _memory.states[state].distance;
   }
 
   /// The distance of a word that goes on to `length` code units, `labelAt(depth)`, or kNotAccepted.
   /// Makes no states: what is left of a word is mostly like that of no other.
   template <typename LabelAt>
-  std::uint32_t distanceBehind(Number from, std::size_t length, LabelAt labelAt) const {
+  std::uint32_t distanceBehind(Number from, std::size_t depth, std::size_t length,
+                               LabelAt labelAt) const {
     const State& state = _memory.states[from];
-    std::size_t depth = state.depth;
     if (depth == length) {
       return state.distance;
     }
@@ -126,7 +159,8 @@ class LazyAutomaton {
   Step stepOf(std::uint64_t set, std::size_t depth, std::uint16_t label) const noexcept {
     const std::uint64_t byEdit = _pattern.editedAt(set, depth);
     const std::uint64_t match = _pattern.matchedAt(set, depth, label);
-    return {(byEdit | B::closed(match)) & _pattern.validAt(depth + 1), byEdit | match};
+    return {(byEdit | _pattern.closedAt(match, depth + 1)) & _pattern.validAt(depth + 1),
+            byEdit | match};
   }
 
   [[gnu::noinline]] Number make(std::size_t step, Number from, std::size_t depth,
@@ -198,7 +232,7 @@ class LazyAutomaton {
   /// The labels that lead on from a set of states without an edit.
   std::uint64_t matchingChildren(std::size_t depth, std::uint64_t set) const {
     std::uint64_t children = 0;
-    for (std::uint64_t columns = _pattern.matchableColumns(set); columns != 0;
+    for (std::uint64_t columns = _pattern.matchableColumns(set, depth); columns != 0;
          columns &= columns - 1) {
       children |= _pattern.childBits(depth, static_cast<unsigned>(std::countr_zero(columns)));
     }

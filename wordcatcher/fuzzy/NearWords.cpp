@@ -4,7 +4,9 @@
 #include <bit>
 
 #include "wordcatcher/fuzzy/BandedWalk.h"
+#include "wordcatcher/fuzzy/LazyAutomaton.h"
 #include "wordcatcher/fuzzy/SwapAutomaton.h"
+#include "wordcatcher/fuzzy/TableAutomaton.h"
 #include "wordcatcher/storage/LeafTails.h"
 
 namespace wordcatcher {
@@ -98,32 +100,53 @@ Reached forEachWordAlong(const SearchImage& image, bool backward,
   }
 }
 
+template <typename Automaton, typename Accept>
+void walk(const SearchImage& image, bool backward, const typename Automaton::Pattern& pattern,
+          WalkMemory& memory, Accept accept) {
+  const auto& tree = backward ? image.backward() : image.forward();
+  BandedWalk<Automaton>(image, tree, backward, pattern, memory).run(pattern.start(), accept);
+}
+
 /// Two walks, each with few edits in the half of the query that it reads first; see
-/// ImageSearch.cpp. A swap across the middle is allowed to both. Walks along the whole query count
-/// the least edits that their limits allow, so a word that both meet has the lesser of its two
-/// counts: with all edits in reach of one half, that is the distance.
+/// ImageSearch.cpp. Walks along the whole query count the least edits that their limits allow, so a
+/// word that both meet has the lesser of its two counts: with all edits in reach of one half, that
+/// is the distance.
 template <unsigned K>
 void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units, bool swaps,
                   std::vector<NearWord>& found) {
   constexpr std::size_t kMinSplitLength = 2 + 2 * std::size_t{K};
+  constexpr unsigned kInFirst = K / 2;
+  constexpr unsigned kInSecond = K - kInFirst - 1;
   const auto accept = [&found](std::uint32_t word, std::uint32_t edits, std::size_t) {
     found.push_back({word, edits});
   };
   const auto memory = image.lendWalkMemory();
-  using Walk = BandedWalk<K, 1, SwapPattern<K>>;
-  if (units.size() < kMinSplitLength) {
-    const SwapPattern<K> whole(units, swaps, 0, K);
-    Walk(image, image.forward(), false, whole, *memory).run(whole.start(), accept);
-    return;
-  }
-  constexpr unsigned kInFirst = K / 2;
-  constexpr unsigned kInSecond = K - kInFirst - 1;
+  const bool isWhole = units.size() < kMinSplitLength;
   const std::size_t half = (units.size() + kInFirst - kInSecond) / 2;
   const std::vector<QueryUnit> reversed(units.rbegin(), units.rend());
-  const SwapPattern<K> first(units, swaps, half, kInFirst);
-  const SwapPattern<K> second(reversed, swaps, units.size() - half, kInSecond);
-  Walk(image, image.forward(), false, first, *memory).run(first.start(), accept);
-  Walk(image, image.backward(), true, second, *memory).run(second.start(), accept);
+  if constexpr (K <= 2) {
+    using Automaton = TableAutomaton<K>;
+    using Pattern = TablePattern<K>;
+    static_assert(kInFirst == SwapTable<K>::kInFirst && kInSecond == SwapTable<K>::kInSecond);
+    const auto& table = SwapTable<K>::ofFirst(swaps);
+    if (isWhole) {
+      walk<Automaton>(image, false, Pattern(units, table), *memory, accept);
+      return;
+    }
+    walk<Automaton>(image, false, Pattern(units, table, half), *memory, accept);
+    const Pattern second(reversed, SwapTable<K>::ofSecond(swaps), units.size() - half);
+    walk<Automaton>(image, true, second, *memory, accept);
+  } else {
+    using Automaton = LazyAutomaton<K, 1, SwapPattern<K>>;
+    using Pattern = SwapPattern<K>;
+    if (isWhole) {
+      walk<Automaton>(image, false, Pattern(units, swaps, {0, K}), *memory, accept);
+      return;
+    }
+    walk<Automaton>(image, false, Pattern(units, swaps, {half, kInFirst, true}), *memory, accept);
+    const Pattern second(reversed, swaps, {units.size() - half, kInSecond, false});
+    walk<Automaton>(image, true, second, *memory, accept);
+  }
 }
 
 }  // namespace

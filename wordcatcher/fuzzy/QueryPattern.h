@@ -31,24 +31,41 @@ inline std::vector<QueryUnit> unitsOf(const SearchImage& image, std::u16string_v
   return units;
 }
 
-/// What the automata of a query within K edits know of it: which sets of states may be after so
-/// many code units of a word, and which of its own code units stand where. Column c after d code
-/// units stands for d + c - K code units of the query; a step looks at those behind the first
-/// `Window` columns. Linear in the query to make.
+/// How many edits the code units at the head of a query may be passed with. What stands at their
+/// border, code units inserted behind the last of them and its swap with the next, counts as theirs
+/// or as nobody's.
+struct HeadLimit {
+  std::size_t units = 0;
+  unsigned edits = 0;
+  bool holdsBorder = false;
+};
+
+/// Which code units of a query stand where, as the automata within K edits want to know it. Column
+/// c after d code units of a word stands for d + c - K code units of the query; a step looks at
+/// those behind the first `Window` columns. Linear in the query to make.
 template <unsigned K, unsigned Window>
-class QueryPattern {
+class QueryLabels {
  public:
   static constexpr unsigned kWindow = Window;
 
-  QueryPattern(const QueryPattern&) = delete;
-  QueryPattern& operator=(const QueryPattern&) = delete;
+  /// The units must live as long as this does.
+  explicit QueryLabels(std::span<const QueryUnit> units) : _units(units) {
+    if (units.size() + Window <= 64) {
+      for (std::size_t p = 0; p < units.size(); ++p) {
+        const std::uint64_t bit = std::uint64_t{1} << (p + K);
+        if (units[p].any) {
+          _any |= bit;
+        } else if (units[p].label != 0 && units[p].label < image::kRareBit) {
+          _table[units[p].label] |= bit;
+        }
+      }
+      _hasTable = true;
+    }
+  }
+  QueryLabels(const QueryLabels&) = delete;
+  QueryLabels& operator=(const QueryLabels&) = delete;
 
   std::size_t length() const noexcept { return _units.size(); }
-
-  /// The states that may be, and those at the end of the query, after at most length() + K + 1 code
-  /// units.
-  std::uint64_t validAt(std::size_t depth) const noexcept { return _states[depth].valid; }
-  std::uint64_t acceptingAt(std::size_t depth) const noexcept { return _states[depth].accepting; }
 
   /// Bit c: whether the query has that label behind column c, after at most length() + K code
   /// units; nowhere for 0.
@@ -72,51 +89,10 @@ class QueryPattern {
   }
 
  protected:
-  /// The units must live as long as this does. `starts`: bit 0 of each row of states that a query
-  /// can end in. `validOf(inside, before)` gives the states that may be of those in the columns
-  /// `inside`; `before(p)` gives the columns of less than p code units of the query.
-  template <typename ValidOf>
-  QueryPattern(std::span<const QueryUnit> units, std::uint64_t starts, ValidOf validOf)
-      : _units(units) {
-    const std::size_t depths = units.size() + K + 2;
-    if (depths > _fewStates.size()) {
-      _manyStates.resize(depths);
-      _states = _manyStates.data();
-    }
-    const auto length = static_cast<std::int64_t>(units.size());
-    for (std::size_t depth = 0; depth < depths; ++depth) {
-      const auto before = [shift = static_cast<std::int64_t>(depth) - static_cast<std::int64_t>(K)](
-                              std::int64_t p) { return below(p - shift); };
-      const std::uint64_t inside = before(length + 1) & ~before(0);
-      _states[depth] = {validOf(inside, before), (inside & ~before(length)) * starts};
-    }
-    if (units.size() + Window <= 64) {
-      for (std::size_t p = 0; p < units.size(); ++p) {
-        const std::uint64_t bit = std::uint64_t{1} << (p + K);
-        if (units[p].any) {
-          _any |= bit;
-        } else if (units[p].label != 0 && units[p].label < image::kRareBit) {
-          _table[units[p].label] |= bit;
-        }
-      }
-      _hasTable = true;
-    }
-  }
-  ~QueryPattern() = default;
+  ~QueryLabels() = default;
 
  private:
-  static constexpr std::int64_t kColumns = 2 * K + 1;
   static constexpr std::uint64_t kRow = (std::uint64_t{1} << Window) - 1;
-
-  /// Per depth.
-  struct States {
-    std::uint64_t valid;
-    std::uint64_t accepting;
-  };
-
-  static std::uint64_t below(std::int64_t column) noexcept {
-    return column <= 0 ? 0 : (std::uint64_t{1} << (column < kColumns ? column : kColumns)) - 1;
-  }
 
   QueryUnit unitAt(std::size_t depth, unsigned column) const noexcept {
     const std::size_t p = depth + column - K;  // before the query it wraps around
@@ -138,13 +114,71 @@ class QueryPattern {
   }
 
   std::span<const QueryUnit> _units;
-  std::array<States, 48> _fewStates;
-  std::vector<States> _manyStates;
-  States* _states = _fewStates.data();
   // For queries that fit: bit p + K of a label's row says that it is the query's code unit p.
   std::uint64_t _table[image::kRareBit] = {};
   std::uint64_t _any = 0;  // likewise for those that match any
   bool _hasTable = false;
+};
+
+/// What the automata of a query within K edits know of it: beside its labels, which sets of states
+/// may be after so many code units of a word. Linear in the query to make.
+template <unsigned K, unsigned Window>
+class QueryPattern : public QueryLabels<K, Window> {
+ public:
+  /// The states that may be, and those at the end of the query, after at most length() + K + 1 code
+  /// units.
+  std::uint64_t validAt(std::size_t depth) const noexcept { return _states[depth].valid; }
+  std::uint64_t acceptingAt(std::size_t depth) const noexcept { return _states[depth].accepting; }
+
+  /// Those of them to which replacing or leaving out a code unit of the query may lead.
+  std::uint64_t passedAt(std::size_t depth) const noexcept { return _states[depth].passed; }
+
+ protected:
+  /// Per depth, see validAt() and passedAt().
+  struct Allowed {
+    std::uint64_t valid;
+    std::uint64_t passed;
+  };
+
+  /// The units must live as long as this does. `starts`: bit 0 of each row of states that a query
+  /// can end in. `allowedOf(inside, before)` gives the states that may be of those in the columns
+  /// `inside`; `before(p)` gives the columns of less than p code units of the query.
+  template <typename AllowedOf>
+  QueryPattern(std::span<const QueryUnit> units, std::uint64_t starts, AllowedOf allowedOf)
+      : QueryLabels<K, Window>(units) {
+    const std::size_t depths = units.size() + K + 2;
+    if (depths > _fewStates.size()) {
+      _manyStates.resize(depths);
+      _states = _manyStates.data();
+    }
+    const auto length = static_cast<std::int64_t>(units.size());
+    for (std::size_t depth = 0; depth < depths; ++depth) {
+      const auto before = [shift = static_cast<std::int64_t>(depth) - static_cast<std::int64_t>(K)](
+                              std::int64_t p) { return below(p - shift); };
+      const std::uint64_t inside = before(length + 1) & ~before(0);
+      const Allowed allowed = allowedOf(inside, before);
+      _states[depth] = {allowed.valid, allowed.passed, (inside & ~before(length)) * starts};
+    }
+  }
+  ~QueryPattern() = default;
+
+ private:
+  static constexpr std::int64_t kColumns = 2 * K + 1;
+
+  /// Per depth.
+  struct States {
+    std::uint64_t valid;
+    std::uint64_t passed;
+    std::uint64_t accepting;
+  };
+
+  static std::uint64_t below(std::int64_t column) noexcept {
+    return column <= 0 ? 0 : (std::uint64_t{1} << (column < kColumns ? column : kColumns)) - 1;
+  }
+
+  std::array<States, 48> _fewStates;
+  std::vector<States> _manyStates;
+  States* _states = _fewStates.data();
 };
 
 }  // namespace wordcatcher

@@ -37,12 +37,17 @@ struct SwapBand {
   static constexpr std::uint64_t inLanes(std::uint64_t lane) { return lane; }
 
   /// Adds what missing code units lead to; no code unit is missing amid a swap.
-  static constexpr std::uint64_t closed(std::uint64_t states) {
-    return Plain::closed(states & kPlain) | (states & ~kPlain);
+  static constexpr std::uint64_t closed(std::uint64_t states, std::uint64_t passed) {
+    return Plain::closed(states & kPlain, passed) | (states & ~kPlain);
   }
 
-  static constexpr std::uint64_t edited(std::uint64_t states) {
-    return Plain::edited(states & kPlain);
+  static constexpr std::uint64_t edited(std::uint64_t states, std::uint64_t passed) {
+    return Plain::edited(states & kPlain, passed);
+  }
+
+  /// The swaps that can begin in a set of states.
+  static constexpr std::uint64_t entered(std::uint64_t states) {
+    return ((states & kSwapRows & ~kSwapStarts) >> 1) << kPlainBits;
   }
 
   /// What reading a code unit leads to without an edit, or by a swap; bit c of `matching` says that
@@ -54,9 +59,7 @@ struct SwapBand {
       constexpr std::uint64_t kLastColumn = kSwapStarts << (kColumns - 1);
       const std::uint64_t swapped = (states >> kPlainBits) & (here * kSwapStarts) & ~kLastColumn;
       next |= swapped << (1 + kColumns);
-      const std::uint64_t entering =
-          states & ((matching >> 1) * kSwapStarts) & kSwapRows & ~kSwapStarts;
-      next |= (entering >> 1) << kPlainBits;
+      next |= entered(states & ((matching >> 1) * kSwapStarts));
     }
     return next;
   }
@@ -94,38 +97,45 @@ class SwapPattern : public QueryPattern<K, SwapBand<K>::kColumns + 1> {
  public:
   using B = SwapBand<K>;
 
-  /// `restricted` code units at the head may only be passed with at most `edits` edits; a swap of
-  /// the last of them with the one behind is not held against them. The units must live as long as
-  /// this does.
-  SwapPattern(std::span<const QueryUnit> units, bool swaps, std::size_t restricted, unsigned edits)
+  /// The units must live as long as this does.
+  SwapPattern(std::span<const QueryUnit> units, bool swaps, HeadLimit limit)
       : Base(units, Plain::kStarts,
-             [=, head = static_cast<std::int64_t>(restricted)](std::uint64_t inside, auto before) {
-               const std::uint64_t plain =
-                   (inside * Plain::kStarts) &
-                   ~((inside & before(head)) * Plain::rowStarts(edits + 1, K + 1));
+             [swaps, limit](std::uint64_t inside, auto before) -> typename Base::Allowed {
+               const auto head = static_cast<std::int64_t>(limit.units);
+               const std::int64_t border = limit.holdsBorder ? 1 : 0;
+               const std::uint64_t tooMany = Plain::rowStarts(limit.edits + 1, K + 1);
+               const std::uint64_t whole = inside * Plain::kStarts;
+               const std::uint64_t plain = whole & ~((inside & before(head + border)) * tooMany);
                const std::uint64_t swapping =
                    (inside * B::kSwapStarts) &
-                   ~((inside & before(head - 1)) * Plain::rowStarts(edits, K));
-               return plain | (swaps ? swapping << B::kPlainBits : 0);
+                   ~((inside & before(head - 1 + border)) * Plain::rowStarts(limit.edits, K));
+               return {plain | (swaps ? swapping << B::kPlainBits : 0),
+                       whole & ~((inside & before(head + 1)) * tooMany)};
              }) {}
 
   std::uint64_t start() const noexcept {
-    return B::closed(std::uint64_t{1} << K) & Base::validAt(0);
+    return closedAt(std::uint64_t{1} << K, 0) & Base::validAt(0);
+  }
+
+  /// See BandedPattern.
+  std::uint64_t closedAt(std::uint64_t states, std::size_t depth) const noexcept {
+    return B::closed(states, Base::passedAt(depth));
   }
 
   /// The two parts of a step; see BandedPattern.
-  std::uint64_t editedAt(std::uint64_t states, std::size_t) const noexcept {
-    return B::edited(states);
+  std::uint64_t editedAt(std::uint64_t states, std::size_t depth) const noexcept {
+    return B::edited(states, Base::passedAt(depth + 1));
   }
   std::uint64_t matchedAt(std::uint64_t states, std::size_t depth,
                           std::uint16_t label) const noexcept {
     return B::matched(states, Base::matching(depth, label));
   }
 
-  /// The columns behind which a code unit may match, or complete a swap. Where one may begin, an
-  /// edit leads on as well.
-  std::uint64_t matchableColumns(std::uint64_t states) const noexcept {
-    return B::columnsOf(states) | B::swapColumnsOf(states);
+  /// The columns behind which a code unit may match, begin a swap or complete one.
+  std::uint64_t matchableColumns(std::uint64_t states, std::size_t depth) const noexcept {
+    // A swap that begins has moved one column down, and has read the code unit behind the next.
+    const std::uint64_t entered = B::entered(states) & Base::validAt(depth + 1);
+    return B::columnsOf(states) | B::swapColumnsOf(states) | B::swapColumnsOf(entered) << 2;
   }
 
  private:

@@ -29,7 +29,7 @@ class WordJudge {
       : _image(image),
         _maxDistance(static_cast<std::uint32_t>(maxDistance)),
         _units(unitsOf(image, query)),
-        _pattern(_units, 0, kMaxDistance) {}
+        _pattern(_units, {0, kMaxDistance}) {}
 
   /// As searchImage() finds it. Linear in the word. Throws Error (damaged).
   std::optional<std::uint32_t> distanceOf(std::uint32_t word) const {

@@ -78,6 +78,13 @@ inline std::uint64_t leafWords(const TreeSlot& leaf) { return leafWords(leaf.chi
 inline bool hasTails(std::uint64_t children) { return children >> LeafTails::kCountShift != 0; }
 inline bool hasTails(const TreeSlot& leaf) { return hasTails(leaf.children); }
 
+/// Whether a leaf may hold a word whose tail begins with one of a set of codes, of which 0 is that
+/// of no tail. Leaves with several words, and those without tails, always may.
+inline bool mayHold(std::uint64_t children, std::uint64_t codes) {
+  const std::uint64_t isNotAlone = (children >> LeafTails::kCountShift) ^ 1;
+  return (isNotAlone | (codes >> (children & LeafTails::kCodeMask) & 1)) != 0;
+}
+
 }  // namespace wordcatcher::image
 
 #endif

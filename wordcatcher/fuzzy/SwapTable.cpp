@@ -1,0 +1,128 @@
+#include "wordcatcher/fuzzy/SwapTable.h"
+
+#include <bit>
+#include <limits>
+#include <span>
+#include <unordered_map>
+
+#include "wordcatcher/fuzzy/SwapAutomaton.h"
+
+namespace wordcatcher {
+
+namespace {
+
+/// The sets of states of a stage by number; number 0 is the empty set, the dead state.
+class NumberedSets {
+ public:
+  std::size_t size() const noexcept { return _sets.size(); }
+  std::uint64_t operator[](std::size_t number) const { return _sets[number]; }
+
+  std::uint8_t numberOf(std::uint64_t set) {
+    const auto [place, isNew] = _numbers.try_emplace(set, static_cast<std::uint8_t>(_sets.size()));
+    if (isNew) {
+      _sets.push_back(set);
+    }
+    return place->second;
+  }
+
+ private:
+  std::vector<std::uint64_t> _sets = {0};
+  std::unordered_map<std::uint64_t, std::uint8_t> _numbers = {{0, 0}};
+};
+
+template <unsigned K>
+typename SwapTable<K>::State stateOf(std::uint64_t set) {
+  using B = SwapBand<K>;
+  typename SwapTable<K>::State state = {};
+  state.distances.fill(SwapTable<K>::kNotAccepted);
+  if (set == 0) {
+    // No word is that short.
+    state.mostRest = std::numeric_limits<std::int32_t>::min() / 2;
+    return state;
+  }
+  std::uint64_t most = 0;
+  std::uint64_t least = 0;
+  for (unsigned edits = 0; edits <= K; ++edits) {
+    most |= B::rowOf(set, edits) << edits;
+    least |= B::rowOf(set, edits) << (K - edits);
+  }
+  // A state in column c has c - K of the r code units less before it; see also LazyAutomaton.
+  constexpr std::int32_t kEdits = K;
+  state.leastRest = kEdits - (std::bit_width(least) - 1);
+  state.mostRest = 2 * kEdits - std::countr_zero(most);
+  for (unsigned column = 0; column < SwapTable<K>::kColumns; ++column) {
+    const std::uint64_t accepted = set & (Band<K>::kStarts << column);
+    if (accepted != 0) {
+      state.distances[column] = static_cast<std::uint8_t>(B::distanceOf(accepted));
+    }
+  }
+  return state;
+}
+
+}  // namespace
+
+// All of it is read off the pattern of a query in which every stage is so far from both ends that
+// these make no difference.
+template <unsigned K>
+SwapTable<K>::SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder) {
+  constexpr std::size_t kHead = 3 * K + 5;
+  const std::vector<QueryUnit> units(2 * kHead);
+  const SwapPattern<K> pattern(units, swaps, {kHead, editsOfHead, headHoldsBorder});
+  const std::uint64_t begin = std::uint64_t{1} << K;
+
+  std::array<NumberedSets, kStages> setsOf;
+  std::array<std::size_t, kStages> firsts = {};
+  for (std::int64_t stage = kFirstStage; stage >= kLastStage; --stage) {
+    // The first stage and the next share their sets, and the last one is followed by itself.
+    auto& sets = setsOf[indexOf(stage == kFirstStage ? stage - 1 : stage)];
+    auto& next = setsOf[indexOf(stage - 1)];
+    const auto depth = static_cast<std::size_t>(static_cast<std::int64_t>(kHead) - stage);
+    if (stage >= 0 || stage == kLastStage) {
+      _starts[indexOf(stage)] =
+          sets.numberOf(pattern.closedAt(begin, depth) & pattern.validAt(depth));
+    }
+    firsts[indexOf(stage)] = _states.size();
+    for (std::size_t number = 0; number < sets.size(); ++number) {
+      const std::uint64_t set = sets[number];
+      State state = stateOf<K>(set);
+      for (std::size_t columns = 0; columns < kMatchings; ++columns) {
+        const std::uint64_t byMatch = pattern.closedAt(B::matched(set, columns), depth + 1);
+        const Number to =
+            next.numberOf((pattern.editedAt(set, depth) | byMatch) & pattern.validAt(depth + 1));
+        _steps.push_back(to);
+        if (to != kDead && std::has_single_bit(columns)) {
+          state.wanted = static_cast<std::uint8_t>(state.wanted | columns);
+        }
+      }
+      if (_steps[_steps.size() - kMatchings] != kDead) {
+        state.wanted = kMatchings;
+      }
+      _states.push_back(state);
+    }
+  }
+  for (std::size_t i = 0; i < kStages; ++i) {
+    _stages[i] = {_states.data() + firsts[i], _steps.data() + firsts[i] * kMatchings};
+  }
+}
+
+template <unsigned K>
+template <bool Swaps, bool IsFirst>
+const SwapTable<K>& SwapTable<K>::made() {
+  static const SwapTable table(Swaps, IsFirst ? kInFirst : kInSecond, IsFirst);
+  return table;
+}
+
+template <unsigned K>
+const SwapTable<K>& SwapTable<K>::ofFirst(bool swaps) {
+  return swaps ? made<true, true>() : made<false, true>();
+}
+
+template <unsigned K>
+const SwapTable<K>& SwapTable<K>::ofSecond(bool swaps) {
+  return swaps ? made<true, false>() : made<false, false>();
+}
+
+template class SwapTable<1>;
+template class SwapTable<2>;
+
+}  // namespace wordcatcher
