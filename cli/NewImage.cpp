@@ -66,29 +66,45 @@ std::uint64_t NewImage::write(IndexBuilder& builder) {
 
 void NewImage::discardForGood() {
   std::unique_lock lock(_returning);
-  // Writing goes on meanwhile, and may just be about to make its second file beside the target.
+  // Writing goes on meanwhile. It may just be about to make its second file beside the target, or
+  // to rename the first one, which it has closed: for that moment it looks like another run's file.
   constexpr auto kOneStep = std::chrono::milliseconds(10);
-  while (discardOnce()) {
+  constexpr int kSteps = 20;
+  // A file made while the directory is read may be missed, so that one look without any is not
+  // enough.
+  constexpr int kQuietSteps = 2;
+  int quiet = 0;
+  for (int step = 0; step < kSteps && quiet < kQuietSteps; ++step) {
+    const Met met = discardOnce();
+    quiet = met == Met::nothing ? quiet + 1 : 0;
+    if (met == Met::ours) {
+      step = 0;
+    }
     std::this_thread::sleep_for(kOneStep);
   }
   lock.release();
 }
 
-/// Whether there was anything to take away.
-bool NewImage::discardOnce() const {
-  bool found = false;
+/// What there was; what was ours is taken away.
+NewImage::Met NewImage::discardOnce() const {
+  Met met = Met::nothing;
   const fs::path target(_target);
   const std::string stem = '.' + target.filename().string().substr(0, kCommonNameBytes);
   visitFiles(target.has_parent_path() ? target.parent_path() : ".", [&](const fs::path& path) {
     const std::string extension = path.extension();
     struct stat status {};
-    if ((extension == ".tmp" || extension == ".old") &&
-        path.filename().string().starts_with(stem) && lstat(path.c_str(), &status) == 0 &&
-        S_ISREG(status.st_mode) && isOurs(status)) {
-      found |= unlink(path.c_str()) == 0;
+    if ((extension != ".tmp" && extension != ".old") ||
+        !path.filename().string().starts_with(stem) || lstat(path.c_str(), &status) != 0 ||
+        !S_ISREG(status.st_mode)) {
+      return;
+    }
+    if (isOurs(status) && unlink(path.c_str()) == 0) {
+      met = Met::ours;
+    } else if (met == Met::nothing) {
+      met = Met::others;
     }
   });
-  return found;
+  return met;
 }
 
 bool NewImage::isOurs(const struct stat& status) const {

@@ -15,8 +15,9 @@ namespace wordcatcher::cli {
 /// The image file that an indexing run writes, and how to take back what an interrupted one leaves
 /// beside it: the library writes to ".NAME-HEX.tmp", and for a moment gives the old image the
 /// second name ".NAME-HEX.old". Only this run's files go: the one that the process has open, and
-/// the one that is the old image. A file that an interrupt meets in the microseconds in which the
-/// library has it closed and not yet renamed stays; nobody reads it and anybody may delete it.
+/// the one that is the old image. For some microseconds the library has the new file closed and not
+/// yet renamed; an interrupt gives it 0.2 seconds then, whereupon the new image stands in its
+/// place. What stays even so nobody reads, and anybody may delete.
 ///
 /// Thread safety: discardForGood() may come from another thread at any time.
 class NewImage {
@@ -30,7 +31,9 @@ class NewImage {
   void discardForGood();
 
  private:
-  bool discardOnce() const;
+  enum class Met { nothing, others, ours };
+
+  Met discardOnce() const;
   bool isOurs(const struct stat& status) const;
 
   std::string _target;

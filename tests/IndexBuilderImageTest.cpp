@@ -327,14 +327,24 @@ TEST(KilledBuilderTest, ReadersSeeTheOldIndexOrTheNewOneWhole) {
       (std::chrono::steady_clock::now() - begin) / 10);
   Readers readers(path);
 
-  // Up to a few commits, which take longer beside the readers than alone; but within bounds on a
-  // busy machine.
-  constexpr std::int64_t kLongestDelay = 60'000;
-  std::uniform_int_distribution<std::int64_t> delay(
-      0, std::min<std::int64_t>(commitTime.count() * 4, kLongestDelay));
-  std::mt19937 random{std::random_device()()};
   std::array<int, 2> left{};
-  for (int kill = 0; kill < kKills; ++kill) {
+  const auto bothWereMet = [&left, &readers] {
+    const auto& answers = readers.shared().answers;
+    return left[0] > 0 && left[1] > 0 && answers[0] > 0 && answers[1] > 0;
+  };
+  // Up to a few commits, which take longer beside the readers than alone. On a busy machine nobody
+  // knows how long, so that the delays grow until both indexes were left behind and met.
+  constexpr std::int64_t kLongestDelay = 2'000'000;
+  constexpr auto kPatience = std::chrono::seconds(120);
+  std::int64_t longest = std::min<std::int64_t>(commitTime.count() * 4, 60'000);
+  std::mt19937 random{std::random_device()()};
+  const auto end = std::chrono::steady_clock::now() + kPatience;
+  for (int kill = 0; kill < kKills || (!bothWereMet() && std::chrono::steady_clock::now() < end);
+       ++kill) {
+    if (kill % 20 == 19 && !bothWereMet()) {
+      longest = std::min(2 * longest, kLongestDelay);
+    }
+    std::uniform_int_distribution<std::int64_t> delay(0, longest);
     const pid_t builder = startProcess([&path] {
       for (std::size_t i = 0;; ++i) {
         buildMarked(path, i % 2);

@@ -16,7 +16,7 @@ import unittest
 PROGRAM, PAGES = (os.path.abspath(path) for path in sys.argv[1:3])
 BASH_COMPLETION = os.path.join(PAGES, "bash", "wordcatcher")
 
-PATIENCE = 30
+PATIENCE = 120  # seconds, on a busy machine too
 
 VERBS = ["index", "find", "explain", "query", "search", "info", "verify", "encode", "dot"]
 PATHS = [[], *([verb] for verb in VERBS), ["dot", "nfa"], ["dot", "dfa"], ["dot", "tree"]]

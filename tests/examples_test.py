@@ -21,7 +21,7 @@ class ExampleTest(unittest.TestCase):
 
     def run_it(self, *command, stdin=""):
         return subprocess.run(command, input=stdin, capture_output=True, text=True, cwd=self.root,
-                              env=dict(os.environ, PATH=PATH), timeout=60)
+                              env=dict(os.environ, PATH=PATH), timeout=120)
 
     def write(self, name, content):
         with open(os.path.join(self.root, name), "wb") as file:

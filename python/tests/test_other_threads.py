@@ -13,7 +13,7 @@ import pytest
 from wordcatcher import Index, IndexBuilder
 
 TURNS = 5
-LONG = 0.5  # seconds in which a thread that may run does so, on however busy a machine
+LONG = 3.0  # seconds in which a thread that may run does so, on however busy a machine
 NEVER = 1000.0
 TEXT = "bababu bagedi daduba kelopisa "
 SIZES = [2**power for power in range(5, 15)]
