@@ -6,9 +6,8 @@ if(WORDCATCHER_WERROR)
 endif()
 
 if(WORDCATCHER_SANITIZE)
-  # What is reported needs lines, and no more; much of the time of building goes into the rest, and
-  # into optimising what the sanitizers add.
-  add_compile_options(-fsanitize=${WORDCATCHER_SANITIZE} -fno-omit-frame-pointer -O1 -g1)
+  # A report needs lines alone; what else there is to debug with takes as long as compiling.
+  add_compile_options(-fsanitize=${WORDCATCHER_SANITIZE} -fno-omit-frame-pointer -g1)
   add_link_options(-fsanitize=${WORDCATCHER_SANITIZE})
   if(WORDCATCHER_SANITIZE MATCHES "undefined")
     add_compile_options(-fno-sanitize-recover=undefined)
