@@ -2,6 +2,7 @@
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
+#include <utility>
 
 namespace wordcatcher::cli {
 
@@ -25,7 +26,74 @@ void addRepeated(CLI::App& verb, const std::string& name, const CLI::callback_t&
       ->type_name("");
 }
 
+template <typename Number>
+void addRanged(CLI::App& verb, const std::string& name, Number& number, Number least,
+               Number largest, const std::string& description, const std::string& type) {
+  verb.add_option(name, number, description)
+      ->check(CLI::Range(least, largest))
+      ->type_name(type)
+      ->capture_default_str();
+}
+
 }  // namespace
+
+CLI::App& addVerb(CLI::App& parent, const std::string& name, const std::string& description,
+                  const std::string& footer) {
+  CLI::App& verb = *parent.add_subcommand(name, description);
+  verb.footer(footer);
+  return verb;
+}
+
+void requireVerb(CLI::App& verb) { verb.require_subcommand(1); }
+
+void whenNamed(CLI::App& verb, ChosenVerb& chosen, ChosenVerb run) {
+  verb.callback([&chosen, run = std::move(run)] { chosen = run; });
+}
+
+void whenNamed(CLI::App& verb, ChosenVerb& chosen, ChosenVerb run,
+               const std::function<void()>& check) {
+  verb.callback([&chosen, check, run = std::move(run)] {
+    check();
+    chosen = run;
+  });
+}
+
+void throwExcluded(const std::string& option, const std::string& other) {
+  throw CLI::ExcludesError(option, other);
+}
+
+CLI::Option* addFlag(CLI::App& verb, const std::string& name, bool& flag,
+                     const std::string& description) {
+  return verb.add_flag(name, flag, description);
+}
+
+void addVerboseFlag(CLI::App& verb, bool& verbose) {
+  addFlag(verb, "--verbose", verbose, "Show the tables' storage log on standard error");
+}
+
+void addNumberOption(CLI::App& verb, const std::string& name, std::int64_t& number,
+                     std::int64_t least, std::int64_t largest, const std::string& description,
+                     const std::string& type) {
+  addRanged(verb, name, number, least, largest, description, type);
+}
+
+void addNumberOption(CLI::App& verb, const std::string& name, unsigned& number, unsigned least,
+                     unsigned largest, const std::string& description, const std::string& type) {
+  addRanged(verb, name, number, least, largest, description, type);
+}
+
+CLI::Option* addChoice(CLI::App& verb, const std::string& name,
+                       const std::vector<std::string>& choices,
+                       const std::function<void(const std::string& choice)>& take,
+                       const std::string& description, const std::string& type) {
+  return verb.add_option_function<std::string>(name, take, description)
+      ->check(CLI::IsMember(choices))
+      ->type_name(type);
+}
+
+void exclude(CLI::Option* option, CLI::Option* other) { option->excludes(other); }
+
+void showDefault(CLI::Option* option, const std::string& value) { option->default_str(value); }
 
 std::vector<std::string> shieldedArguments(const std::vector<std::string>& arguments) {
   std::vector<std::string> shielded;

@@ -1,4 +1,3 @@
-#include <CLI/CLI.hpp>
 #include <cstdint>
 #include <memory>
 #include <string>
@@ -28,7 +27,7 @@ constexpr std::size_t kLongestWord = 64;
 constexpr std::size_t kMostStates = 500;
 constexpr std::size_t kMostWords = 200;
 
-constexpr const char* kFooter = R"(
+constexpr const char* kDotFooter = R"(
 Writes a graph in the language of Graphviz, whose "dot" draws it.
 
 Examples:
@@ -59,7 +58,7 @@ Examples:
   wordcatcher dot tree dogs.wci | dot -Tsvg > tree.svg
   wordcatcher dot tree dogs.wci go | dot -Tsvg > tree.svg)";
 
-struct Arguments {
+struct DotArguments {
   std::string word;
   std::int64_t maxDistance = 0;
   std::string index;
@@ -121,7 +120,7 @@ Graph drawn(const Automaton& automaton, const std::string& title, const Targets&
   return graph;
 }
 
-LevenshteinNFA nfaOf(const Arguments& arguments) {
+LevenshteinNFA nfaOf(const DotArguments& arguments) {
   const auto word = decoded(arguments.word, "WORD");
   if (word.size() > kLongestWord) {
     throw Failure("WORD has more than " + std::to_string(kLongestWord) +
@@ -130,11 +129,11 @@ LevenshteinNFA nfaOf(const Arguments& arguments) {
   return LXFuzzyIndex::_LXcreateNFAWithWord_withMaxDistance(word, arguments.maxDistance);
 }
 
-std::string titleOf(const Arguments& arguments) {
+std::string titleOf(const DotArguments& arguments) {
   return inQuotes(arguments.word) + " within " + counted(arguments.maxDistance, "edit");
 }
 
-ExitCode runNfa(const Arguments& arguments) {
+ExitCode runNfa(const DotArguments& arguments) {
   const auto nfa = nfaOf(arguments);
   checkCanBeRead(nfa.size());
   return print(drawn(nfa, titleOf(arguments), [&nfa](const auto& state, const auto& symbol) {
@@ -146,7 +145,7 @@ ExitCode runNfa(const Arguments& arguments) {
   }));
 }
 
-ExitCode runDfa(const Arguments& arguments) {
+ExitCode runDfa(const DotArguments& arguments) {
   const auto dfa = LXFuzzyIndex::_LXcreateDFAFromNFA(nfaOf(arguments));
   checkCanBeRead(dfa.size());
   return print(drawn(dfa, titleOf(arguments), [&dfa](const auto& state, const auto& symbol) {
@@ -162,7 +161,7 @@ void drawBelow(Graph& graph, std::size_t node, const WordTree& tree) {
   }
 }
 
-ExitCode runTree(const Arguments& arguments) {
+ExitCode runTree(const DotArguments& arguments) {
   checkIndexComesFirst(arguments.index, {arguments.prefix});
   const auto prefix = decoded(arguments.prefix, "PREFIX");
   const WordTree tree =
@@ -174,38 +173,34 @@ ExitCode runTree(const Arguments& arguments) {
   return print(graph);
 }
 
-void addAutomaton(CLI::App& dot, const std::shared_ptr<Arguments>& arguments, const char* name,
+void addAutomaton(CLI::App& dot, const std::shared_ptr<DotArguments>& arguments, const char* name,
                   const char* description, const char* footer, ChosenVerb& chosen,
-                  ExitCode (*run)(const Arguments&)) {
-  auto* const verb = dot.add_subcommand(name, description);
-  addArgument(*verb, "WORD", arguments->word, "The word");
-  addNumber(*verb, "K", arguments->maxDistance, kLargestDistance, "Edits");
-  verb->footer(footer);
-  verb->callback(
-      [arguments, run, &chosen] { chosen = [arguments, run] { return run(*arguments); }; });
+                  ExitCode (*run)(const DotArguments&)) {
+  CLI::App& verb = addVerb(dot, name, description, footer);
+  addArgument(verb, "WORD", arguments->word, "The word");
+  addNumber(verb, "K", arguments->maxDistance, kLargestDistance, "Edits");
+  whenNamed(verb, chosen, [arguments, run] { return run(*arguments); });
 }
 
-void addTree(CLI::App& dot, const std::shared_ptr<Arguments>& arguments, ChosenVerb& chosen) {
-  auto* const verb = dot.add_subcommand("tree", "The prefix tree of an index");
-  verb->add_flag("--verbose", arguments->verbose, "Show the tables' storage log on standard error");
-  addArgument(*verb, "INDEX", arguments->index,
+void addTree(CLI::App& dot, const std::shared_ptr<DotArguments>& arguments, ChosenVerb& chosen) {
+  CLI::App& verb = addVerb(dot, "tree", "The prefix tree of an index", kTreeFooter);
+  addVerboseFlag(verb, arguments->verbose);
+  addArgument(verb, "INDEX", arguments->index,
               "A search image, or the directory of a classic index");
-  addOptionalArgument(*verb, "PREFIX", arguments->prefix, "What the words to draw begin with");
-  verb->footer(kTreeFooter);
-  verb->callback([arguments, &chosen] { chosen = [arguments] { return runTree(*arguments); }; });
+  addOptionalArgument(verb, "PREFIX", arguments->prefix, "What the words to draw begin with");
+  whenNamed(verb, chosen, [arguments] { return runTree(*arguments); });
 }
 
 }  // namespace
 
 void addDotVerb(CLI::App& program, ChosenVerb& chosen) {
-  auto* const dot = program.add_subcommand("dot", "Draw automata and the words of an index");
-  const auto arguments = std::make_shared<Arguments>();
-  addAutomaton(*dot, arguments, "nfa", "The automaton of the strings near a word", kNfaFooter,
+  CLI::App& dot = addVerb(program, "dot", "Draw automata and the words of an index", kDotFooter);
+  const auto arguments = std::make_shared<DotArguments>();
+  addAutomaton(dot, arguments, "nfa", "The automaton of the strings near a word", kNfaFooter,
                chosen, runNfa);
-  addAutomaton(*dot, arguments, "dfa", "The same, deterministic", kDfaFooter, chosen, runDfa);
-  addTree(*dot, arguments, chosen);
-  dot->require_subcommand(1);
-  dot->footer(kFooter);
+  addAutomaton(dot, arguments, "dfa", "The same, deterministic", kDfaFooter, chosen, runDfa);
+  addTree(dot, arguments, chosen);
+  requireVerb(dot);
 }
 
 }  // namespace wordcatcher::cli

@@ -1,4 +1,3 @@
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <nlohmann/json.hpp>
 #include <string>
@@ -6,6 +5,7 @@
 
 #include "cli/Arguments.h"
 #include "cli/Failure.h"
+#include "cli/Joined.h"
 #include "cli/Output.h"
 #include "cli/Questions.h"
 #include "cli/Verbs.h"
@@ -18,7 +18,7 @@ namespace {
 
 using Json = nlohmann::ordered_json;
 
-constexpr const char* kFooter = R"(
+constexpr const char* kEncodeFooter = R"(
 Prints the codes of each TEXT, or of each line of standard input: a line of one code a
 word, a space between them. Words that sound alike have equal codes. A word of which
 no letter sounds has none.
@@ -30,7 +30,7 @@ Examples:
   wordcatcher encode 'Catherine Schmidt' 'Kathryn Shmit'
   wordcatcher encode --json < names.txt)";
 
-struct Arguments {
+struct EncodeArguments {
   bool json = false;
   std::vector<std::string> texts;
 };
@@ -47,13 +47,13 @@ std::vector<std::string> codesOf(const std::u16string& translation) {
   return codes;
 }
 
-ExitCode runEncode(const Arguments& arguments) {
+ExitCode runEncode(const EncodeArguments& arguments) {
   const Questions questions(arguments.texts, false);
   KXMetaphone encoder;
   questions.answerEach([&](const InputLine& question, Output& output) {
     const auto codes = codesOf(encoder.translate(question.text));
     output.write(arguments.json ? Json{{"text", question.utf8}, {"codes", codes}}.dump() + '\n'
-                                : CLI::detail::join(codes, " ") + '\n');
+                                : joined(codes, " ") + '\n');
     return true;
   });
   // Nothing is looked for, so that no text, and a text without codes, is no miss.
@@ -63,12 +63,11 @@ ExitCode runEncode(const Arguments& arguments) {
 }  // namespace
 
 void addEncodeVerb(CLI::App& program, ChosenVerb& chosen) {
-  auto* const verb = program.add_subcommand("encode", "Print the codes of how words sound");
-  const auto arguments = std::make_shared<Arguments>();
-  verb->add_flag("--json", arguments->json, "Print a JSON object a text");
-  addTexts(*verb, "TEXT", arguments->texts, "Texts");
-  verb->footer(kFooter);
-  verb->callback([arguments, &chosen] { chosen = [arguments] { return runEncode(*arguments); }; });
+  CLI::App& verb = addVerb(program, "encode", "Print the codes of how words sound", kEncodeFooter);
+  const auto arguments = std::make_shared<EncodeArguments>();
+  addFlag(verb, "--json", arguments->json, "Print a JSON object a text");
+  addTexts(verb, "TEXT", arguments->texts, "Texts");
+  whenNamed(verb, chosen, [arguments] { return runEncode(*arguments); });
 }
 
 }  // namespace wordcatcher::cli

@@ -1,4 +1,3 @@
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <optional>
 #include <string>
@@ -15,7 +14,7 @@ namespace wordcatcher::cli {
 
 namespace {
 
-constexpr const char* kFooter = R"(
+constexpr const char* kExplainFooter = R"(
 Tells why "wordcatcher find" gives VALUE its cost for TEXT, word by word, or which
 limit keeps it out. VALUE is what is printed for a match, as in "golden retriever{ 7 }".
 With --query it tells how the distance of "wordcatcher query" comes about instead,
@@ -28,7 +27,7 @@ Examples:
   wordcatcher explain --max-cost 2 dogs.wci 'a goldan retriver' 'golden gate bridge'
   wordcatcher explain --query --json dogs.wci 'a goldan retriver' 'golden retriever')";
 
-struct Arguments {
+struct ExplainArguments {
   FindOptions options;
   std::optional<MatchingMode> mode;
   bool query = false;
@@ -54,7 +53,7 @@ auto waitedFor(const Explain& explain) {
   return explain();
 }
 
-ExitCode runExplain(const Arguments& arguments) {
+ExitCode runExplain(const ExplainArguments& arguments) {
   checkIndexComesFirst(arguments.index, {arguments.text, arguments.value});
   const Index index = openIndex(arguments.index, arguments.mode, arguments.verbose);
   return arguments.query
@@ -69,27 +68,26 @@ ExitCode runExplain(const Arguments& arguments) {
 }  // namespace
 
 void addExplainVerb(CLI::App& program, ChosenVerb& chosen) {
-  auto* const verb =
-      program.add_subcommand("explain", "Tell why a phrase is found in a text, or why not");
-  const auto arguments = std::make_shared<Arguments>();
+  CLI::App& verb = addVerb(program, "explain", "Tell why a phrase is found in a text, or why not",
+                           kExplainFooter);
+  const auto arguments = std::make_shared<ExplainArguments>();
   auto* const query =
-      verb->add_flag("--query", arguments->query, "Explain the distance of \"wordcatcher query\"");
+      addFlag(verb, "--query", arguments->query, "Explain the distance of \"wordcatcher query\"");
   for (const auto& options :
-       {addListOptions(*verb, arguments->options), addMatchOptions(*verb, arguments->options)}) {
+       {addListOptions(verb, arguments->options), addMatchOptions(verb, arguments->options)}) {
     for (auto* const option : options) {
-      option->excludes(query);
+      exclude(option, query);
     }
   }
-  verb->add_flag("--json", arguments->json, "Print a JSON object");
-  addModeOption(*verb, arguments->mode,
+  addFlag(verb, "--json", arguments->json, "Print a JSON object");
+  addModeOption(verb, arguments->mode,
                 "the index's own, or " + nameOf(kDefaultMode) + " for a directory");
-  verb->add_flag("--verbose", arguments->verbose, "Show the tables' storage log on standard error");
-  addArgument(*verb, "INDEX", arguments->index,
+  addVerboseFlag(verb, arguments->verbose);
+  addArgument(verb, "INDEX", arguments->index,
               "A search image, or the directory of a classic index");
-  addArgument(*verb, "TEXT", arguments->text, "The text that was searched");
-  addArgument(*verb, "VALUE", arguments->value, "The value to explain, as a match shows it");
-  verb->footer(kFooter);
-  verb->callback([arguments, &chosen] { chosen = [arguments] { return runExplain(*arguments); }; });
+  addArgument(verb, "TEXT", arguments->text, "The text that was searched");
+  addArgument(verb, "VALUE", arguments->value, "The value to explain, as a match shows it");
+  whenNamed(verb, chosen, [arguments] { return runExplain(*arguments); });
 }
 
 }  // namespace wordcatcher::cli

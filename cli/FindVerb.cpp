@@ -1,4 +1,3 @@
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <nlohmann/json.hpp>
 #include <optional>
@@ -23,7 +22,7 @@ using Json = nlohmann::ordered_json;
 
 constexpr unsigned kMostThreads = 64;
 
-constexpr const char* kFooter = R"(
+constexpr const char* kFindFooter = R"(
 Each match is a line: its cost, a TAB, its value, a TAB, and where it is in the text:
 begin-end in bytes from 0, the end being behind its last byte. The best match comes
 first. Its cost is the edits of its words, and 2 for each word that only the text or
@@ -53,7 +52,7 @@ Examples:
   wordcatcher find --overlaps longest --min-words 2 --limit 3 dogs.wci < texts.txt
   wordcatcher find --max-cost 4 --edits 0,0,1 dogs.wci 'golden gatt brigde')";
 
-struct Arguments {
+struct FindArguments {
   FindOptions options;
   std::optional<MatchingMode> mode;
   unsigned threads = 1;
@@ -110,7 +109,8 @@ std::string truncationNote(const FindOptions& options) {
          " phrases: give it in shorter pieces, or give a larger --max-postings.";
 }
 
-TextAnswer answerTo(const std::string& text, const FindResult& result, const Arguments& arguments) {
+TextAnswer answerTo(const std::string& text, const FindResult& result,
+                    const FindArguments& arguments) {
   const bool matched = !result.matches.empty();
   if (arguments.json) {
     return {jsonLine(text, result), "", matched};
@@ -125,7 +125,7 @@ TextAnswer answerTo(const std::string& text, const FindResult& result, const Arg
           result.truncated ? truncationNote(arguments.options) : std::string(), matched};
 }
 
-ExitCode runFind(const Arguments& arguments) {
+ExitCode runFind(const FindArguments& arguments) {
   checkIndexComesFirst(arguments.index, arguments.texts);
   const Index index = openIndex(arguments.index, arguments.mode, arguments.verbose);
   return answerInOrder(
@@ -136,45 +136,43 @@ ExitCode runFind(const Arguments& arguments) {
       arguments.threads);
 }
 
-void addOutputOptions(CLI::App& verb, Arguments& arguments) {
-  auto* const json = verb.add_flag("--json", arguments.json, "Print a JSON object a text");
-  auto* const color =
-      verb.add_option("--color", arguments.color,
-                      "Whether to show the text with its found words in colour")
-          ->check(CLI::IsMember(std::vector<std::string>{"auto", "always", "never"}))
-          ->type_name("WHEN")
-          ->capture_default_str();
-  verb.add_flag("--highlight", arguments.highlight, "The same as --color always")
-      ->excludes(color)
-      ->excludes(json);
-  verb.add_option("--threads", arguments.threads, "Texts that are answered at once")
-      ->check(CLI::Range(1U, kMostThreads))
-      ->type_name("N")
-      ->capture_default_str();
+void addOutputOptions(CLI::App& verb, FindArguments& arguments) {
+  auto* const json = addFlag(verb, "--json", arguments.json, "Print a JSON object a text");
+  auto* const color = addChoice(
+      verb, "--color", {"auto", "always", "never"},
+      [&arguments](const std::string& when) { arguments.color = when; },
+      "Whether to show the text with its found words in colour", "WHEN");
+  showDefault(color, arguments.color);
+  auto* const highlight =
+      addFlag(verb, "--highlight", arguments.highlight, "The same as --color always");
+  exclude(highlight, color);
+  exclude(highlight, json);
+  addNumberOption(verb, "--threads", arguments.threads, 1, kMostThreads,
+                  "Texts that are answered at once", "N");
 }
 
 }  // namespace
 
 void addFindVerb(CLI::App& program, ChosenVerb& chosen) {
-  auto* const verb =
-      program.add_subcommand("find", "Find the phrases that texts hold, the best ones first");
-  const auto arguments = std::make_shared<Arguments>();
-  addListOptions(*verb, arguments->options);
-  addMatchOptions(*verb, arguments->options);
-  addOutputOptions(*verb, *arguments);
-  addModeOption(*verb, arguments->mode,
+  CLI::App& verb = addVerb(program, "find", "Find the phrases that texts hold, the best ones first",
+                           kFindFooter);
+  const auto arguments = std::make_shared<FindArguments>();
+  addListOptions(verb, arguments->options);
+  addMatchOptions(verb, arguments->options);
+  addOutputOptions(verb, *arguments);
+  addModeOption(verb, arguments->mode,
                 "the index's own, or " + nameOf(kDefaultMode) + " for a directory");
-  verb->add_flag("--verbose", arguments->verbose, "Show the tables' storage log on standard error");
-  addArgument(*verb, "INDEX", arguments->index,
+  addVerboseFlag(verb, arguments->verbose);
+  addArgument(verb, "INDEX", arguments->index,
               "A search image, or the directory of a classic index");
-  addTexts(*verb, "TEXT", arguments->texts, "Texts");
-  verb->footer(kFooter);
-  verb->callback([arguments, &chosen] {
-    if (arguments->json && arguments->color == "always") {
-      throw CLI::ExcludesError("--json", "--color always");
-    }
-    chosen = [arguments] { return runFind(*arguments); };
-  });
+  addTexts(verb, "TEXT", arguments->texts, "Texts");
+  whenNamed(
+      verb, chosen, [arguments] { return runFind(*arguments); },
+      [arguments] {
+        if (arguments->json && arguments->color == "always") {
+          throwExcluded("--json", "--color always");
+        }
+      });
 }
 
 }  // namespace wordcatcher::cli

@@ -14,6 +14,7 @@
 #include "cli/LockWatcher.h"
 #include "cli/TableLog.h"
 #include "wordcatcher/Error.h"
+#include "wordcatcher/storage/TableFile.h"
 
 namespace wordcatcher::cli {
 
@@ -21,7 +22,6 @@ namespace {
 
 // A table file begins with 256 pairs of 32-bit little-endian numbers: where a hash table begins and
 // how many slots of 8 bytes it has.
-constexpr std::size_t kHeaderBytes = 2048;
 constexpr std::size_t kPairBytes = 8;
 constexpr std::uint64_t kSlotBytes = 8;
 

@@ -1,4 +1,3 @@
-#include <CLI/CLI.hpp>
 #include <chrono>
 #include <iostream>
 #include <memory>
@@ -18,7 +17,7 @@ namespace wordcatcher::cli {
 
 namespace {
 
-constexpr const char* kFooter = R"(
+constexpr const char* kIndexFooter = R"(
 Input is UTF-8, one phrase a line, optionally followed by a TAB and fields:
   golden retriever<TAB>7
 A query then shows the phrase as "golden retriever{ 7 }", and without fields as
@@ -37,7 +36,7 @@ Examples:
   wordcatcher index --mode text titles.wci titles.txt
   wordcatcher index --tables dogs names.txt)";
 
-struct Arguments {
+struct IndexArguments {
   std::optional<MatchingMode> mode;
   bool tables = false;
   bool verbose = false;
@@ -45,7 +44,7 @@ struct Arguments {
   std::vector<std::string> files;
 };
 
-ExitCode runIndex(const Arguments& arguments) {
+ExitCode runIndex(const IndexArguments& arguments) {
   const auto start = std::chrono::steady_clock::now();
   const IndexingTask task{arguments.target, arguments.files, arguments.mode.value_or(kDefaultMode),
                           arguments.verbose};
@@ -63,16 +62,15 @@ ExitCode runIndex(const Arguments& arguments) {
 }  // namespace
 
 void addIndexVerb(CLI::App& program, ChosenVerb& chosen) {
-  auto* const verb = program.add_subcommand("index", "Write an index of phrases");
-  const auto arguments = std::make_shared<Arguments>();
-  addModeOption(*verb, arguments->mode, nameOf(kDefaultMode));
-  verb->add_flag("--tables", arguments->tables, "Write the tables of a classic index");
-  verb->add_flag("--verbose", arguments->verbose, "Show the tables' storage log on standard error");
-  addArgument(*verb, "OUT", arguments->target, "The index to write");
-  addArguments(*verb, "FILE", arguments->files,
+  CLI::App& verb = addVerb(program, "index", "Write an index of phrases", kIndexFooter);
+  const auto arguments = std::make_shared<IndexArguments>();
+  addModeOption(verb, arguments->mode, nameOf(kDefaultMode));
+  addFlag(verb, "--tables", arguments->tables, "Write the tables of a classic index");
+  addVerboseFlag(verb, arguments->verbose);
+  addArgument(verb, "OUT", arguments->target, "The index to write");
+  addArguments(verb, "FILE", arguments->files,
                "Files of phrases, \"-\" for standard input; without any, standard input");
-  verb->footer(kFooter);
-  verb->callback([arguments, &chosen] { chosen = [arguments] { return runIndex(*arguments); }; });
+  whenNamed(verb, chosen, [arguments] { return runIndex(*arguments); });
 }
 
 }  // namespace wordcatcher::cli

@@ -1,4 +1,3 @@
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <nlohmann/json.hpp>
 #include <optional>
@@ -17,7 +16,7 @@ namespace {
 
 using Json = nlohmann::ordered_json;
 
-constexpr const char* kFooter = R"(
+constexpr const char* kInfoFooter = R"(
 Prints a line for each: the mode, the phrases added, the distinct words (in text mode
 whole phrases, in phonetic mode codes) and data strings, the bytes, the generation,
 which each run of "wordcatcher index" makes anew, and the version of the format.
@@ -33,7 +32,7 @@ Examples:
   wordcatcher info dogs.wci
   wordcatcher info --json dogs.wci)";
 
-struct Arguments {
+struct InfoArguments {
   bool json = false;
   std::string index;
 };
@@ -64,7 +63,7 @@ std::string plainLines(const Json& description) {
   return lines;
 }
 
-ExitCode runInfo(const Arguments& arguments) {
+ExitCode runInfo(const InfoArguments& arguments) {
   const Json description = describe(arguments.index);
   Output output;
   output.write(arguments.json ? description.dump() + '\n' : plainLines(description));
@@ -75,13 +74,12 @@ ExitCode runInfo(const Arguments& arguments) {
 }  // namespace
 
 void addInfoVerb(CLI::App& program, ChosenVerb& chosen) {
-  auto* const verb = program.add_subcommand("info", "Tell what an index holds");
-  const auto arguments = std::make_shared<Arguments>();
-  verb->add_flag("--json", arguments->json, "Print a JSON object");
-  addArgument(*verb, "INDEX", arguments->index,
+  CLI::App& verb = addVerb(program, "info", "Tell what an index holds", kInfoFooter);
+  const auto arguments = std::make_shared<InfoArguments>();
+  addFlag(verb, "--json", arguments->json, "Print a JSON object");
+  addArgument(verb, "INDEX", arguments->index,
               "A search image, or the directory of a classic index");
-  verb->footer(kFooter);
-  verb->callback([arguments, &chosen] { chosen = [arguments] { return runInfo(*arguments); }; });
+  whenNamed(verb, chosen, [arguments] { return runInfo(*arguments); });
 }
 
 }  // namespace wordcatcher::cli

@@ -1,10 +1,11 @@
 #include "cli/Modes.h"
 
-#include <CLI/CLI.hpp>
 #include <algorithm>
 #include <array>
 #include <string>
 #include <vector>
+
+#include "cli/Arguments.h"
 
 namespace wordcatcher::cli {
 
@@ -49,11 +50,9 @@ MatchingMode modeNamed(const std::string& name) {
 
 void addModeOption(CLI::App& verb, std::optional<MatchingMode>& mode,
                    const std::string& withoutIt) {
-  verb.add_option_function<std::string>(
-          "--mode", [&mode](const std::string& name) { mode = modeNamed(name); },
-          description(withoutIt))
-      ->check(CLI::IsMember(names()))
-      ->type_name("MODE");
+  addChoice(
+      verb, "--mode", names(), [&mode](const std::string& name) { mode = modeNamed(name); },
+      description(withoutIt), "MODE");
 }
 
 std::string nameOf(MatchingMode mode) {

@@ -18,9 +18,9 @@ namespace fs = std::filesystem;
 constexpr std::size_t kCommonNameBytes = 100;
 
 // Links to the files that this process has open.
-constexpr const char* kDescriptors = "/proc/self/fd";
+constexpr const char* kOpenFiles = "/proc/self/fd";
 
-bool sameFile(const struct stat& a, const struct stat& b) {
+bool isSameFile(const struct stat& a, const struct stat& b) {
   return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
 }
 
@@ -36,9 +36,9 @@ void visitFiles(const fs::path& directory, const Visit& visit) {
 
 bool isOpen(const struct stat& status) {
   bool found = false;
-  visitFiles(kDescriptors, [&](const fs::path& descriptor) {
+  visitFiles(kOpenFiles, [&](const fs::path& descriptor) {
     struct stat open {};
-    found |= stat(descriptor.c_str(), &open) == 0 && sameFile(open, status);
+    found |= stat(descriptor.c_str(), &open) == 0 && isSameFile(open, status);
   });
   return found;
 }
@@ -108,7 +108,7 @@ NewImage::Met NewImage::discardOnce() const {
 }
 
 bool NewImage::isOurs(const struct stat& status) const {
-  return (_old && sameFile(*_old, status)) || isOpen(status);
+  return (_old && isSameFile(*_old, status)) || isOpen(status);
 }
 
 }  // namespace wordcatcher::cli

@@ -8,14 +8,13 @@
 #include <cerrno>
 
 #include "cli/Failure.h"
+#include "wordcatcher/storage/TableFile.h"
 
 namespace wordcatcher::cli {
 
 namespace {
 
 constexpr mode_t kDirectoryPermissions = 0777;
-constexpr mode_t kFilePermissions = 0666;
-constexpr std::size_t kHeaderBytes = 2048;
 
 [[noreturn]] void throwCannotWrite(const std::string& path, const std::string& reason) {
   throw Failure("Cannot write " + inQuotes(path) + " (" + reason +
@@ -95,7 +94,7 @@ void NewTables::createDirectory() {
 /// Creates an empty table file; false if one that can be written stands there.
 bool NewTables::createTable(const std::string& path) {
   int descriptor =
-      open(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, kFilePermissions);
+      open(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, kPermissions);
   const bool created = descriptor >= 0;
   if (!created && errno == EEXIST) {
     descriptor = open(path.c_str(), O_RDWR | O_NOFOLLOW | O_CLOEXEC | O_NONBLOCK);

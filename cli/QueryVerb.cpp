@@ -1,4 +1,3 @@
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <nlohmann/json.hpp>
 #include <optional>
@@ -20,7 +19,7 @@ namespace {
 
 using Json = nlohmann::ordered_json;
 
-constexpr const char* kFooter = R"(
+constexpr const char* kQueryFooter = R"(
 Each match is a line: its distance, a TAB, its value, the nearest first and equally
 near ones by their UTF-16 code units. Several TEXTs, and the lines of standard
 input, each stand as a heading above their matches. Empty lines count as texts.
@@ -42,7 +41,7 @@ Examples:
   wordcatcher query titles.wci 'the grate gatsby'
   wordcatcher query --mode phonetic names/ 'Kathryn Shmit')";
 
-struct Arguments {
+struct QueryArguments {
   std::optional<MatchingMode> mode;
   bool json = false;
   bool verbose = false;
@@ -81,7 +80,7 @@ std::string plainLines(const Index::QueryResult& result) {
   return lines;
 }
 
-ExitCode runQuery(const Arguments& arguments) {
+ExitCode runQuery(const QueryArguments& arguments) {
   const Questions questions(arguments.texts, !arguments.json);
   checkIndexComesFirst(arguments.index, arguments.texts);
   const Index index = openIndex(arguments.index, arguments.mode, arguments.verbose);
@@ -96,18 +95,17 @@ ExitCode runQuery(const Arguments& arguments) {
 }  // namespace
 
 void addQueryVerb(CLI::App& program, ChosenVerb& chosen) {
-  auto* const verb =
-      program.add_subcommand("query", "Find the indexed phrases that occur in texts");
-  const auto arguments = std::make_shared<Arguments>();
-  addModeOption(*verb, arguments->mode,
+  CLI::App& verb =
+      addVerb(program, "query", "Find the indexed phrases that occur in texts", kQueryFooter);
+  const auto arguments = std::make_shared<QueryArguments>();
+  addModeOption(verb, arguments->mode,
                 "the index's own, or " + nameOf(kDefaultMode) + " for a directory");
-  verb->add_flag("--json", arguments->json, "Print a JSON object a text");
-  verb->add_flag("--verbose", arguments->verbose, "Show the tables' storage log on standard error");
-  addArgument(*verb, "INDEX", arguments->index,
+  addFlag(verb, "--json", arguments->json, "Print a JSON object a text");
+  addVerboseFlag(verb, arguments->verbose);
+  addArgument(verb, "INDEX", arguments->index,
               "A search image, or the directory of a classic index");
-  addTexts(*verb, "TEXT", arguments->texts, "Texts");
-  verb->footer(kFooter);
-  verb->callback([arguments, &chosen] { chosen = [arguments] { return runQuery(*arguments); }; });
+  addTexts(verb, "TEXT", arguments->texts, "Texts");
+  whenNamed(verb, chosen, [arguments] { return runQuery(*arguments); });
 }
 
 }  // namespace wordcatcher::cli

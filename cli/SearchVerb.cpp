@@ -1,4 +1,3 @@
-#include <CLI/CLI.hpp>
 #include <cstdint>
 #include <memory>
 #include <nlohmann/json.hpp>
@@ -9,6 +8,7 @@
 #include "cli/Answers.h"
 #include "cli/Arguments.h"
 #include "cli/Failure.h"
+#include "cli/Joined.h"
 #include "cli/OpenIndex.h"
 #include "cli/Output.h"
 #include "cli/Questions.h"
@@ -23,11 +23,11 @@ using Json = nlohmann::ordered_json;
 constexpr std::int64_t kDefaultDistance = 2;
 
 // What the library takes: more edits than that make any word near any other.
-constexpr std::int64_t kLargestDistance = 16;
+constexpr std::int64_t kFarthest = 16;
 
 constexpr const char* kDataSeparator = " | ";
 
-constexpr const char* kFooter = R"(
+constexpr const char* kSearchFooter = R"(
 Finds the stored words (in text mode, the whole phrases) that are within K edits of a
 WORD, those with more data first, then the nearer, the shorter. Each match is a line:
 its value, a TAB, its distance, a TAB, its data strings joined by " | ". Several
@@ -43,7 +43,7 @@ Examples:
   wordcatcher search --max-distance 1 --json dogs.wci goldan retriver
   wordcatcher search dogs.wci < words.txt)";
 
-struct Arguments {
+struct SearchArguments {
   std::int64_t maxDistance = kDefaultDistance;
   bool json = false;
   bool verbose = false;
@@ -68,12 +68,12 @@ std::string plainLines(const Index::SearchResult& result) {
   std::string lines;
   for (const auto& match : result.matches) {
     lines += match.value + '\t' + std::to_string(match.distance) + '\t' +
-             CLI::detail::join(match.data, kDataSeparator) + '\n';
+             joined(match.data, kDataSeparator) + '\n';
   }
   return lines;
 }
 
-ExitCode runSearch(const Arguments& arguments) {
+ExitCode runSearch(const SearchArguments& arguments) {
   const Questions questions(arguments.words, !arguments.json);
   checkIndexComesFirst(arguments.index, arguments.words);
   const Index index = openIndex(arguments.index, std::nullopt, arguments.verbose);
@@ -87,19 +87,17 @@ ExitCode runSearch(const Arguments& arguments) {
 }  // namespace
 
 void addSearchVerb(CLI::App& program, ChosenVerb& chosen) {
-  auto* const verb = program.add_subcommand("search", "Look words up in the fuzzy index itself");
-  const auto arguments = std::make_shared<Arguments>();
-  verb->add_option("--max-distance", arguments->maxDistance, "Edits that a match may need")
-      ->check(CLI::Range(std::int64_t{0}, kLargestDistance))
-      ->type_name("K in [0 - " + std::to_string(kLargestDistance) + "]")
-      ->capture_default_str();
-  verb->add_flag("--json", arguments->json, "Print a JSON object a word");
-  verb->add_flag("--verbose", arguments->verbose, "Show the tables' storage log on standard error");
-  addArgument(*verb, "INDEX", arguments->index,
+  CLI::App& verb =
+      addVerb(program, "search", "Look words up in the fuzzy index itself", kSearchFooter);
+  const auto arguments = std::make_shared<SearchArguments>();
+  addNumberOption(verb, "--max-distance", arguments->maxDistance, 0, kFarthest,
+                  "Edits that a match may need", "K in [0 - " + std::to_string(kFarthest) + "]");
+  addFlag(verb, "--json", arguments->json, "Print a JSON object a word");
+  addVerboseFlag(verb, arguments->verbose);
+  addArgument(verb, "INDEX", arguments->index,
               "A search image, or the directory of a classic index");
-  addTexts(*verb, "WORD", arguments->words, "Words");
-  verb->footer(kFooter);
-  verb->callback([arguments, &chosen] { chosen = [arguments] { return runSearch(*arguments); }; });
+  addTexts(verb, "WORD", arguments->words, "Words");
+  whenNamed(verb, chosen, [arguments] { return runSearch(*arguments); });
 }
 
 }  // namespace wordcatcher::cli

@@ -1,4 +1,3 @@
-#include <CLI/CLI.hpp>
 #include <memory>
 #include <optional>
 #include <string>
@@ -14,7 +13,7 @@ namespace wordcatcher::cli {
 
 namespace {
 
-constexpr const char* kFooter = R"(
+constexpr const char* kVerifyFooter = R"(
 Reads all of a search image and checks its checksums and that everything in it fits
 together. Prints one line when the image is whole; otherwise the exit code is 2, and
 standard error says what is wrong. Of a classic index it is checked that the tables
@@ -42,11 +41,10 @@ ExitCode runVerify(const std::string& name) {
 }  // namespace
 
 void addVerifyVerb(CLI::App& program, ChosenVerb& chosen) {
-  auto* const verb = program.add_subcommand("verify", "Check that an index is whole");
+  CLI::App& verb = addVerb(program, "verify", "Check that an index is whole", kVerifyFooter);
   const auto name = std::make_shared<std::string>();
-  addArgument(*verb, "INDEX", *name, "A search image, or the directory of a classic index");
-  verb->footer(kFooter);
-  verb->callback([name, &chosen] { chosen = [name] { return runVerify(*name); }; });
+  addArgument(verb, "INDEX", *name, "A search image, or the directory of a classic index");
+  whenNamed(verb, chosen, [name] { return runVerify(*name); });
 }
 
 }  // namespace wordcatcher::cli

@@ -10,7 +10,7 @@ namespace {
 
 using std::chrono::steady_clock;
 
-constexpr std::chrono::milliseconds kLookEvery{100};
+constexpr std::chrono::milliseconds kWaitAtMost{100};
 
 }  // namespace
 
@@ -47,7 +47,7 @@ void WaitingNote::pause() {
 /// Looks rather than being woken, so that beginning and pausing cost next to nothing.
 void WaitingNote::tick(const std::stop_token& stop) {
   std::unique_lock lock(_mutex);
-  while (!_wake.wait_for(lock, stop, kLookEvery, [] { return false; }) && !stop.stop_requested()) {
+  while (!_wake.wait_for(lock, stop, kWaitAtMost, [] { return false; }) && !stop.stop_requested()) {
     if (!_since) {
       continue;
     }

@@ -6,7 +6,8 @@ if(WORDCATCHER_WERROR)
 endif()
 
 if(WORDCATCHER_SANITIZE)
-  add_compile_options(-fsanitize=${WORDCATCHER_SANITIZE} -fno-omit-frame-pointer -g)
+  # A report needs lines alone; what else there is to debug with takes as long as compiling.
+  add_compile_options(-fsanitize=${WORDCATCHER_SANITIZE} -fno-omit-frame-pointer -g1)
   add_link_options(-fsanitize=${WORDCATCHER_SANITIZE})
   if(WORDCATCHER_SANITIZE MATCHES "undefined")
     add_compile_options(-fno-sanitize-recover=undefined)

@@ -157,7 +157,7 @@ OpenIndex unpickled(const py::tuple& parts) {
   return open(parts[0], parts[1].cast<bool>(), parts[2].cast<std::string>(), parts[3], parts[4]);
 }
 
-std::string shown(const OpenIndex& self) {
+std::string shownIndex(const OpenIndex& self) {
   const auto info = self.index().info();
   return "<wordcatcher.Index " + std::string(py::repr(pathText(self.source().path))) +
          ", mode=" + std::string(py::repr(py::str(nameOf(info.mode)))) +
@@ -334,7 +334,7 @@ void bindIndex(py::module_& module) {
   type.def_property_readonly(
       "path", [](const OpenIndex& self) { return pathText(self.source().path); },
       "The absolute path that was opened; os.fsencode() gives its bytes.");
-  type.def("__repr__", &shown);
+  type.def("__repr__", &shownIndex);
   definePickle(type, &pickled, &unpickled);
 }
 

@@ -70,7 +70,7 @@ struct Found {
 };
 
 /// An index of some words of the world: ascending places.
-using Index = std::vector<std::size_t>;
+using Places = std::vector<std::size_t>;
 
 class SmallWorldTest : public ::testing::Test {
  protected:
@@ -85,7 +85,7 @@ class SmallWorldTest : public ::testing::Test {
       wordAt[words[word]] = word;
     }
     queries = allQueries();
-    Index whole(words.size());
+    Places whole(words.size());
     for (std::size_t word = 0; word < words.size(); ++word) {
       whole[word] = word;
     }
@@ -93,7 +93,7 @@ class SmallWorldTest : public ::testing::Test {
   }
 
   /// What the literal walk finds through tables of these words, for every question.
-  static std::vector<std::vector<Found>> literalAnswers(const Index& index) {
+  static std::vector<std::vector<Found>> literalAnswers(const Places& index) {
     const TemporaryDirectory directory;
     PLXDFA tree(directory.path());
     tree.setMode(2);
@@ -122,7 +122,7 @@ class SmallWorldTest : public ::testing::Test {
   }
 
   /// The part of the world's answers that lies in an index.
-  static std::vector<Found> partOf(const std::vector<Found>& found, const Index& index) {
+  static std::vector<Found> partOf(const std::vector<Found>& found, const Places& index) {
     std::uint32_t held = 0;
     for (const std::size_t word : index) {
       held |= std::uint32_t{1} << word;
@@ -133,7 +133,7 @@ class SmallWorldTest : public ::testing::Test {
     return part;
   }
 
-  static std::shared_ptr<const SearchImage> imageOf(const Index& index) {
+  static std::shared_ptr<const SearchImage> imageOf(const Places& index) {
     SearchImageWriter writer(0);
     for (const std::size_t word : index) {
       writer.addWord(words[word]);
@@ -145,7 +145,7 @@ class SmallWorldTest : public ::testing::Test {
   }
 
   /// Asks every question of an index; the number of words found.
-  static std::size_t compare(const Index& index) {
+  static std::size_t compare(const Places& index) {
     const auto image = imageOf(index);
     std::size_t matches = 0;
     auto answer = answers.begin();
@@ -166,7 +166,7 @@ class SmallWorldTest : public ::testing::Test {
   }
 
   /// `size` different words.
-  static Index randomIndex(std::mt19937& random, std::size_t size) {
+  static Places randomIndex(std::mt19937& random, std::size_t size) {
     std::set<std::size_t> chosen;
     while (chosen.size() < size) {
       chosen.insert(random() % words.size());
@@ -188,7 +188,7 @@ std::vector<std::vector<Found>> SmallWorldTest::answers;
 TEST_F(SmallWorldTest, ThePartOfAnIndexIsWhatTheWalkFindsInIt) {
   std::mt19937 random(1);  // NOLINT(cert-msc32-c,cert-msc51-cpp): the same every time
   for (const std::size_t size : {1U, 3U, 12U}) {
-    const Index index = randomIndex(random, size);
+    const Places index = randomIndex(random, size);
     const auto found = literalAnswers(index);
     ASSERT_EQ(found.size(), answers.size());
     for (std::size_t i = 0; i < found.size(); ++i) {
@@ -198,7 +198,7 @@ TEST_F(SmallWorldTest, ThePartOfAnIndexIsWhatTheWalkFindsInIt) {
 }
 
 TEST_F(SmallWorldTest, AllWordsAtOnce) {
-  Index whole(words.size());
+  Places whole(words.size());
   for (std::size_t word = 0; word < words.size(); ++word) {
     whole[word] = word;
   }

@@ -1,7 +1,7 @@
-#include <CLI/CLI.hpp>
 #include <string>
 #include <vector>
 
+#include "cli/Joined.h"
 #include "cli/pages/Command.h"
 
 namespace wordcatcher::cli {
@@ -68,7 +68,7 @@ std::string pathOf(const Command& command) {
 }
 
 std::string assigned(const std::string& variable, const std::vector<std::string>& words) {
-  return variable + "='" + CLI::detail::join(words, " ") + "'";
+  return variable + "='" + joined(words, " ") + "'";
 }
 
 /// What the command takes, as a branch of a case.
@@ -104,8 +104,8 @@ std::string choices(const Command& command) {
   for (const auto& option : command.options) {
     for (const auto& name : option.names) {
       if (!option.choices.empty()) {
-        text += "    '" + pathOf(command) + ' ' + name + "') echo '" +
-                CLI::detail::join(option.choices, " ") + "' ;;\n";
+        text += "    '" + pathOf(command) + ' ' + name + "') echo '" + joined(option.choices, " ") +
+                "' ;;\n";
       }
     }
   }

@@ -6,6 +6,8 @@
 #include <regex>
 #include <utility>
 
+#include "cli/Joined.h"
+
 namespace wordcatcher::cli {
 
 namespace {
@@ -59,7 +61,7 @@ bool Command::Argument::isPath() const {
 }
 
 std::string Command::joined(const std::string& separator) const {
-  return CLI::detail::join(path, separator);
+  return cli::joined(path, separator);
 }
 
 Command readCommand(const CLI::App& app, std::vector<std::string> parents) {

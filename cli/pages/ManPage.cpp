@@ -1,8 +1,8 @@
-#include <CLI/CLI.hpp>
 #include <cctype>
 #include <sstream>
 #include <string_view>
 
+#include "cli/Joined.h"
 #include "cli/pages/Command.h"
 #include "wordcatcher/Version.h"
 
@@ -121,7 +121,7 @@ std::string described(const Command::Option& option) {
   }
   // Where there is more to say about the choices, the description lists them.
   if (!option.choices.empty() && option.description.find('\n') == std::string::npos) {
-    text += ".br\nOne of " + escaped(CLI::detail::join(option.choices, ", ")) + ".\n";
+    text += ".br\nOne of " + escaped(joined(option.choices, ", ")) + ".\n";
   }
   if (!option.range.empty()) {
     text += ".br\nFrom " + escaped(option.range) + ".\n";

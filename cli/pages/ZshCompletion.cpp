@@ -1,6 +1,6 @@
-#include <CLI/CLI.hpp>
 #include <string>
 
+#include "cli/Joined.h"
 #include "cli/pages/Command.h"
 
 namespace wordcatcher::cli {
@@ -27,7 +27,7 @@ std::string function(const Command& command) { return '_' + command.joined("_");
 std::string specified(const Command::Option& option) {
   // A space where choices would be: a value that cannot be completed.
   const std::string choices =
-      option.choices.empty() ? " " : '(' + CLI::detail::join(option.choices, " ") + ')';
+      option.choices.empty() ? " " : '(' + joined(option.choices, " ") + ')';
   const std::string value = option.value.empty() ? "" : ':' + option.value + ':' + choices;
   std::string text;
   for (const auto& name : option.names) {

@@ -14,8 +14,8 @@ namespace wordcatcher {
 
 namespace {
 
-constexpr char16_t kAny = u'*';
-constexpr char16_t kEmptyMove = u'_';
+constexpr char16_t kAnyUnit = u'*';
+constexpr char16_t kEmptyUnit = u'_';
 
 template <unsigned K, unsigned Lanes>
 using Walk = BandedWalk<LazyAutomaton<K, Lanes, BandedPattern<K, Lanes>>>;
@@ -38,11 +38,11 @@ struct Query {
 /// so that where a query begins with it, the first code unit of every word is an insertion.
 Query prepared(const SearchImage& image, std::u16string_view text) {
   Query query;
-  query.beginsWithEmptyMove = !text.empty() && text.front() == kEmptyMove;
+  query.beginsWithEmptyMove = !text.empty() && text.front() == kEmptyUnit;
   for (const char16_t unit : text) {
-    if (unit == kAny) {
+    if (unit == kAnyUnit) {
       query.units.push_back({.any = true});
-    } else if (unit != kEmptyMove) {
+    } else if (unit != kEmptyUnit) {
       query.units.push_back({.label = image.labelOf(unit)});
     }
   }

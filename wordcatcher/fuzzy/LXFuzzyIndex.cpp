@@ -5,19 +5,12 @@
 
 #include "wordcatcher/fuzzy/ImageSearch.h"
 #include "wordcatcher/fuzzy/TableImage.h"
+#include "wordcatcher/storage/TableFile.h"
 #include "wordcatcher/text/TextForm.h"
 #include "wordcatcher/text/Unicode.h"
 #include "wordcatcher/text/WordSegmenter.h"
 
 namespace wordcatcher {
-
-namespace {
-
-// The modes that open the tables.
-constexpr std::int32_t kReading = 1;
-constexpr std::int32_t kWriting = 2;
-
-}  // namespace
 
 LXFuzzyIndex::LXFuzzyIndex() : _segmenter(std::make_unique<WordSegmenter>()) {}
 

@@ -210,8 +210,8 @@ std::optional<std::string> digitObjection(const Paired& paired,
       return "A word that holds a digit " +
              (other.limit == 0 ? "must be the same"
                                : "may have up to " + counted(other.limit, "edit")) +
-             ", and " + quoted(word.word) + " is " + counted(other.edits, "edit") + " from " +
-             quoted(other.word) + '.';
+             ", and " + inQuotes(word.word) + " is " + counted(other.edits, "edit") + " from " +
+             inQuotes(other.word) + '.';
     }
   }
   return std::nullopt;

@@ -17,6 +17,7 @@
 #include "wordcatcher/matcher/SpanShortcut.h"
 #include "wordcatcher/phonetic/KXMetaphone.h"
 #include "wordcatcher/storage/SearchImage.h"
+#include "wordcatcher/storage/TableFile.h"
 #include "wordcatcher/text/CodeUnitOrder.h"
 #include "wordcatcher/text/PhraseLength.h"
 #include "wordcatcher/text/Unicode.h"
@@ -24,8 +25,6 @@
 namespace wordcatcher {
 
 namespace {
-
-constexpr std::int32_t kReading = 1;
 
 // As the classic matcher's.
 constexpr std::int64_t kWordDistance = 2;
@@ -71,10 +70,9 @@ void checkThere(const std::string& prefix) {
 
 /// Only the locks tell that no other process is still writing, so this waits until they were taken.
 void checkFinished(const std::string& prefix) {
-  constexpr off_t kHeaderBytes = 2048;
   for (const auto& table : tablesAt(prefix)) {
     struct stat status = {};
-    if (stat(table.c_str(), &status) != 0 || status.st_size < kHeaderBytes) {
+    if (stat(table.c_str(), &status) != 0 || status.st_size < off_t{kHeaderBytes}) {
       throw Error(ErrorCode::notAnIndex, table + " is no finished table; index again.");
     }
   }
@@ -284,7 +282,7 @@ std::string Index::State::absenceOf(std::string_view value) const {
   const FindText words = cut(phraseOf(value), options.edits);
   const auto nearest = findPhrases(*image, words, options, joinsWords(mode, options)).matches;
   return "The index holds no such data string; give one just as find prints it" +
-         (nearest.empty() ? "." : ", such as " + quoted(nearest.front().value) + '.');
+         (nearest.empty() ? "." : ", such as " + inQuotes(nearest.front().value) + '.');
 }
 
 QueryExplanation Index::explainQuery(std::string_view text, std::string_view value) const {

@@ -17,7 +17,7 @@ constexpr std::uint64_t kWordMode = 0;
 constexpr std::uint64_t kWholeTextMode = 1;
 constexpr std::uint64_t kPhoneticMode = 2;
 
-constexpr std::int64_t kWholeTextDistance = 3;
+constexpr std::int64_t kClassicTextDistance = 3;
 
 }  // namespace
 
@@ -61,7 +61,7 @@ void KXWordcatcher::index_withData(std::u16string_view text,
 
 std::optional<QueryResult> KXWordcatcher::query(std::u16string_view text) {
   if (_options == kWholeTextMode) {
-    return _index ? _index->search_withMaxDistance(text, kWholeTextDistance)
+    return _index ? _index->search_withMaxDistance(text, kClassicTextDistance)
                   : std::vector<LXFuzzyMatch>();
   }
   if (!_index || (_options != kWordMode && _options != kPhoneticMode)) {

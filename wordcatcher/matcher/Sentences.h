@@ -11,7 +11,7 @@ namespace wordcatcher {
 
 // What the sentences of explanations are made of.
 
-inline std::string quoted(std::string_view word) { return '"' + std::string(word) + '"'; }
+inline std::string inQuotes(std::string_view word) { return '"' + std::string(word) + '"'; }
 
 /// A number with its noun: 1 edit, 2 edits.
 template <std::integral Number>

@@ -9,7 +9,7 @@
 namespace wordcatcher {
 
 void SpanQueryTrace::leaveOut(std::u16string_view word, const char* reason) {
-  tell(quoted(displayUtf8(word)) + " is not looked up: it is " + reason + ".");
+  tell(inQuotes(displayUtf8(word)) + " is not looked up: it is " + reason + ".");
 }
 
 void SpanQueryTrace::lookUpAll() {
@@ -19,7 +19,7 @@ void SpanQueryTrace::lookUpAll() {
 
 void SpanQueryTrace::lookUp(std::u16string_view word, const std::vector<WordHit>& hits,
                             std::optional<std::int64_t> distance) {
-  const std::string text = quoted(displayUtf8(word));
+  const std::string text = inQuotes(displayUtf8(word));
   if (std::any_of(hits.begin(), hits.end(), [](const WordHit& hit) { return hit.values > 0; })) {
     _sets.push_back({text, distance});
   }
@@ -32,7 +32,7 @@ void SpanQueryTrace::lookUp(std::u16string_view word, const std::vector<WordHit>
     const auto values = _image.postingsOf(hit.word);
     return std::find(values.begin(), values.end(), _value) != values.end();
   });
-  tell(sentence + "; " + quoted(displayUtf8(_image.textOf(bringing->word))) + ", " +
+  tell(sentence + "; " + inQuotes(displayUtf8(_image.textOf(bringing->word))) + ", " +
        counted(*distance, "edit") + " away, carries the value.");
 }
 

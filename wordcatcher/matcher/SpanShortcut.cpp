@@ -22,7 +22,7 @@ constexpr std::size_t kManyWords = 64;
 // How many values of a word are asked whether another word brings them, too.
 constexpr std::size_t kWitnesses = 32;
 
-std::int64_t lengthOf(std::u16string_view text) { return static_cast<std::int64_t>(text.size()); }
+std::int64_t unitsOf(std::u16string_view text) { return static_cast<std::int64_t>(text.size()); }
 
 }  // namespace
 
@@ -72,14 +72,14 @@ bool SpanShortcut::cut(std::u16string_view text) {
     }
   }
   const bool isAnyLong = std::any_of(tokens.begin(), tokens.end(), [this](const auto& token) {
-    return lengthOf(token) > _limits.ignoredWordLength;
+    return unitsOf(token) > _limits.ignoredWordLength;
   });
   for (const auto& token : tokens) {
-    if (isAnyLong && lengthOf(token) <= _limits.ignoredWordLength) {
+    if (isAnyLong && unitsOf(token) <= _limits.ignoredWordLength) {
       continue;
     }
     _countedWords +=
-        !isAnyLong || lengthOf(token) > _limits.ignoredWordLengthForEditDistance ? 1 : 0;
+        !isAnyLong || unitsOf(token) > _limits.ignoredWordLengthForEditDistance ? 1 : 0;
     if (token.size() > _limits.maxWordUnits) {
       _truncated = true;
     } else {

@@ -17,7 +17,7 @@ namespace wordcatcher {
 namespace {
 
 /// As far as ICU counts, and so the most that a word of a text can have.
-constexpr std::size_t kMaxLength = std::numeric_limits<std::int32_t>::max();
+constexpr std::size_t kLongestWord = std::numeric_limits<std::int32_t>::max();
 
 std::u16string withoutPunctuation(std::u16string_view word) {
   std::u16string letters;
@@ -85,7 +85,7 @@ std::u16string KXMetaphone::translate(std::u16string_view text) {
 }
 
 std::u16string KXMetaphone::_translateWord(std::u16string_view word) {
-  if (word.size() > kMaxLength) {
+  if (word.size() > kLongestWord) {
     throw std::length_error(
         "A word must not be longer than 2,147,483,647 code units; leave it out or cut it.");
   }

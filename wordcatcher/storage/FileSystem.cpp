@@ -5,13 +5,9 @@
 
 #include <cstdio>
 
+#include "wordcatcher/storage/TableFile.h"
+
 namespace wordcatcher {
-
-namespace {
-
-constexpr mode_t kPermissions = 0666;
-
-}  // namespace
 
 int FileSystem::status(const std::string& path, struct stat& status) {
   return ::stat(path.c_str(), &status);

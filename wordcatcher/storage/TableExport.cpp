@@ -11,6 +11,7 @@
 
 #include "wordcatcher/Error.h"
 #include "wordcatcher/storage/PLXDFA.h"
+#include "wordcatcher/storage/TableFile.h"
 #include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher {
@@ -18,8 +19,6 @@ namespace wordcatcher {
 namespace {
 
 constexpr std::array kTableFiles = {"edgeTable.tdb", "dataTable.tdb", "finalTable.tdb"};
-
-constexpr mode_t kPermissions = 0666;
 
 [[noreturn]] void throwNotWritable(const std::string& path, const std::string& reason) {
   throw Error(ErrorCode::notWritable, "The table file " + path + " cannot be written (" + reason +

@@ -2,15 +2,10 @@
 
 #include <cdb.h>
 
+#include "wordcatcher/storage/TableFile.h"
 #include "wordcatcher/storage/TinyCDB.h"
 
 namespace wordcatcher {
-
-namespace {
-
-constexpr unsigned kHeaderBytes = 2048;
-
-}  // namespace
 
 TableScan::TableScan(const TinyCDB& table) noexcept : _cdb(table._cdb.get()) {
   cdb_seqinit(&_position, _cdb);

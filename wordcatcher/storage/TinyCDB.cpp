@@ -15,23 +15,16 @@
 #include <utility>
 
 #include "wordcatcher/log/LogLine.h"
+#include "wordcatcher/storage/TableFile.h"
 #include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher {
 
 namespace {
 
-constexpr std::int32_t kReading = 1;
-constexpr std::int32_t kWriting = 2;
-
 constexpr const char* kSetMode = "-[TinyCDB setMode:]";
 constexpr const char* kSetValue = "-[TinyCDB setValue:forKey:]";
 constexpr const char* kValuesFor = "-[TinyCDB valuesFor:]";
-
-constexpr mode_t kPermissions = 0666;
-
-// The table of contents at the start of every cdb file.
-constexpr unsigned kHeaderBytes = 2048;
 
 /// Opens a file and waits for its exclusive lock. errno afterwards is what open() left: a failure
 /// of the lock (a file system without locks) neither fails the call nor shows in it.
