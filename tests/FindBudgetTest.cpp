@@ -10,6 +10,7 @@
 #include "FindSupport.h"
 #include "MemoryCounter.h"
 #include "wordcatcher/Error.h"
+#include "wordcatcher/text/Unicode.h"
 
 namespace wordcatcher {
 namespace {
@@ -197,6 +198,27 @@ TEST(FindBudgetTest, ManyEqualWordsInManyPhrases) {
   EXPECT_LT(seconds, kManySeconds);
   EXPECT_LT(MemoryCounter::peak() - before, 200'000'000U);
   EXPECT_TRUE(found.truncated);
+}
+
+TEST(FindBudgetTest, ManyEqualWordsNearManyWords) {
+  Entries entries = {{"go-fish", "go-fish"}};
+  for (int i = 0; i < 1000; ++i) {
+    // A syllable of the Yi, which is a letter amid Latin ones.
+    const std::u16string unit(1, static_cast<char16_t>(0xA000 + i));
+    entries.emplace_back("buff" + toUtf8(unit).value() + "lo", std::to_string(i));
+    entries.emplace_back("white" + toUtf8(unit).value() + "bison", std::to_string(i));
+  }
+  const auto index = indexOf(entries);
+  for (const std::string& words : {rowOf("buffalo", 4000), rowOf("white bison", 2000)}) {
+    FindResult found;
+    MemoryCounter::restartPeak();
+    const std::size_t before = MemoryCounter::live();
+    const double seconds = secondsOf([&] { found = index.find("go-fish " + words); });
+    EXPECT_LT(seconds, kManySeconds);
+    EXPECT_LT(MemoryCounter::peak() - before, 200'000'000U);
+    EXPECT_TRUE(found.truncated);
+    EXPECT_EQ(found.matches.size(), 10U);
+  }
 }
 
 TEST(FindBudgetTest, WordsInEachOthersWay) {

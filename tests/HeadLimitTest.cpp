@@ -137,21 +137,23 @@ TEST(HeadLimitTest, OfEveryQueryOfThreeLetters) {
 
 /// However K edits lie, one of the two halves of a query keeps its limit: the first with its border
 /// or the second without.
-TEST(HeadLimitTest, OneOfTwoHalvesKeepsItsLimit) {
-  constexpr unsigned kEdits = 2;
+class HalvesTest : public ::testing::TestWithParam<unsigned> {};
+
+TEST_P(HalvesTest, OneKeepsItsLimit) {
+  const unsigned most = GetParam();
   const auto words = labelsUpTo(5, 2);
   for (const auto& query : words) {
     const Labels reversed(query.rbegin(), query.rend());
     for (const auto& word : words) {
       const Labels reversedWord(word.rbegin(), word.rend());
       for (std::size_t half = 0; half <= query.size(); ++half) {
-        for (unsigned inFirst = 0; inFirst < kEdits; ++inFirst) {
+        for (unsigned inFirst = 0; inFirst < most; ++inFirst) {
           for (const bool swaps : {false, true}) {
             const std::uint64_t edits = literalEdits(query, word, swaps, {0, kNever});
             const std::uint64_t first = literalEdits(query, word, swaps, {half, inFirst, true});
             const std::uint64_t second = literalEdits(
-                reversed, reversedWord, swaps, {query.size() - half, kEdits - inFirst - 1, false});
-            ASSERT_TRUE(edits > kEdits || std::min(first, second) == edits)
+                reversed, reversedWord, swaps, {query.size() - half, most - inFirst - 1, false});
+            ASSERT_TRUE(edits > most || std::min(first, second) == edits)
                 << ::testing::PrintToString(query) << ", " << ::testing::PrintToString(word);
           }
         }
@@ -159,6 +161,8 @@ TEST(HeadLimitTest, OneOfTwoHalvesKeepsItsLimit) {
     }
   }
 }
+
+INSTANTIATE_TEST_SUITE_P(Edits, HalvesTest, ::testing::Values(1, 2, 3, 4));
 
 }  // namespace
 }  // namespace wordcatcher

@@ -37,6 +37,34 @@ void publish(const std::string& path, MatchingMode mode) {
   builder.commit();
 }
 
+// Before any other test has asked: what all queries share is made by one of these threads.
+TEST(FirstQueryTest, OfManyThreadsAtOnce) {
+  const TemporaryDirectory directory;
+  const std::string path = directory.file("names.wci");
+  publish(path, MatchingMode::words);
+  const Index shared = Index::open(path);
+  std::atomic<int> ready = 0;
+  std::atomic<int> wrong = 0;
+  std::vector<std::thread> readers;
+  for (int i = 0; i < 8; ++i) {
+    readers.emplace_back([&, i] {
+      ++ready;
+      while (ready < 8) {
+        std::this_thread::yield();
+      }
+      // Words of one edit and of two.
+      FindOptions options;
+      options.transpositions = i % 2 == 0;
+      const auto matches = shared.find("Konrat Zsue", options).matches;
+      wrong += matches.size() == 1 && matches[0].value == "Konrad Zuse" ? 0 : 1;
+    });
+  }
+  for (auto& reader : readers) {
+    reader.join();
+  }
+  EXPECT_EQ(wrong, 0);
+}
+
 class IndexThreadsTest : public ::testing::TestWithParam<MatchingMode> {};
 
 TEST_P(IndexThreadsTest, ManyUseOneWhileAnotherPublishes) {

@@ -206,6 +206,13 @@ TEST(NearWordsTest, EveryImageOfAFewWords) {
     for (int question = 0; question < 20; ++question) {
       few.expectNear(words[random() % words.size()]);
     }
+    for (const auto& word : few.all()) {
+      few.expectExact(word);
+      few.expectJoined(word);
+      for (std::size_t gap = 0; gap < word.size(); ++gap) {
+        EXPECT_GE(few.expectBetween(word.substr(0, gap), word.substr(gap + 1)), 1U);
+      }
+    }
     for (auto near : few.all()) {
       near[random() % near.size()] = u'b';
       std::swap(near[random() % near.size()], near.back());

@@ -195,6 +195,16 @@ TEST(PairingTest, MoreWordsComeBeforeExactOnes) {
   EXPECT_EQ(found.score.exact, 0U);
 }
 
+TEST(PairingTest, AnOnlyWordJoinsWithTheNextBeforeItIsJoined) {
+  Pairing pairing(3);
+  // The text's words 0 and 1 are the phrase's word 0, or word 2 is its words 0 and 1.
+  const Solution found = solve(pairing, {{{0, 2, 1, 1}, {2, 1, 2, 1}}, {}});
+  ASSERT_EQ(found.pairs.size(), 1U);
+  EXPECT_EQ(found.pairs[0].option.position, 2U);
+  EXPECT_EQ(found.score.gain, 5U);
+  EXPECT_EQ(found.score.words, 2U);
+}
+
 TEST(PairingTest, ExactWordsComeBeforeTheirOrder) {
   Pairing pairing(4);
   // 1 + 1 edits side by side, or 0 + 2 apart.

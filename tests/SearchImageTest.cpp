@@ -428,6 +428,16 @@ TEST(HostileImageTest, ManyPlacesWithTheSameManyChildren) {
   image.set(SectionKind::forwardTree, slots);
   image.set(SectionKind::backwardTree, slots);
   const ImageBytes bytes = image.bytes();
+  const auto opened = SearchImage::fromBytes(bytes);
+  const std::u16string head(1, opened->unitOf(101));
+  const std::u16string tail(1, opened->unitOf(kBroad - 100));
+  EXPECT_EQ(errorOf([&] { wordsWithUnitBetween(*opened, head, tail); }), ErrorCode::damaged);
+  std::u16string manySteps;
+  for (int i = 0; i < 10; ++i) {
+    manySteps += tail;
+  }
+  EXPECT_EQ(errorOf([&] { exactWord(*opened, manySteps); }), ErrorCode::damaged);
+  EXPECT_EQ(errorOf([&] { wordsJoinedIn(*opened, manySteps, Seam::unit); }), ErrorCode::damaged);
   for (const std::u16string_view query : {u"***", u"*****", u"*********"}) {
     for (std::int64_t distance = 1; distance <= 4; ++distance) {
       const Outcome outcome = examine(bytes, query, distance);

@@ -61,8 +61,8 @@
 
    7. Threads. An index and a result may be used by any number of threads at once; a builder by one
       at a time. Giving back must be the last use. The library starts no thread, has no state of
-      its own but the log handler, never prints, never exits and takes no signals. A thread must not
-      be cancelled (pthread_cancel) or left (longjmp) inside a call.
+      its own that changes but the log handler, never prints, never exits and takes no signals. A
+   thread must not be cancelled (pthread_cancel) or left (longjmp) inside a call.
 
    8. No C++ exception leaves a function. Memory that runs out is WORDCATCHER_NO_MEMORY, and leaves
       everything as it was.

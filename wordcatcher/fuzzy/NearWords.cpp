@@ -26,79 +26,136 @@ std::vector<std::uint16_t> labelsOf(const SearchImage& image, std::u16string_vie
   return labels;
 }
 
-/// The child of a place behind an edge, or 0.
-std::size_t childOf(const SearchImage& image, const SearchImage::Tree& tree, const TreeSlot& place,
-                    std::uint16_t label) {
-  const unsigned bit = image::labelBit(label);
-  if ((place.children >> bit & 1U) == 0) {
-    return 0;
-  }
-  const std::uint64_t before = place.children & ((std::uint64_t{1} << bit) - 1);
-  std::size_t child = place.index() + static_cast<unsigned>(std::popcount(before));
-  for (;; ++child) {
-    if (child >= tree.slots.size()) {
-      image.throwDamaged("a tree leads out of its section");
-    }
-    if (tree.slots[child].label == label) {
-      return child;
-    }
-    if (tree.slots[child].label > label || tree.slots[child].isLastChild()) {
-      return 0;
-    }
-  }
-}
-
 /// A place of a tree, and how many labels lead there.
 struct Reached {
   std::size_t slot = 0;
   std::size_t depth = 0;
 };
 
-/// The word at a place among a tree's leaves.
-std::uint32_t leafWordAt(const SearchImage& image, const SearchImage::Tree& tree,
-                         std::size_t place) {
-  if (place >= image.wordCount()) {
-    image.throwDamaged("a tree has more leaves than words");
-  }
-  return tree.order.empty() ? static_cast<std::uint32_t>(place) : tree.order[place];
-}
+/// A tree read along labels. Where it is a tree, no place and no word is met more than twice by
+/// what one of these is made for; it ends a reading that meets more of them.
+class TreeReader {
+ public:
+  TreeReader(const SearchImage& image, bool backward)
+      : _image(image),
+        _backward(backward),
+        _tree(backward ? image.backward() : image.forward()),
+        _left(2 * (_tree.slots.size() + std::uint64_t{image.wordCount()})) {}
 
-/// Calls `visit(word, length)` for every word of the image that the labels begin with, or end with
-/// in the backward tree, where they stand in reverse; from a place on to which they lead, and up to
-/// the place that is given back: where the labels end, or no place is behind, or a leaf is reached.
-template <typename Visit>
-Reached forEachWordAlong(const SearchImage& image, bool backward,
-                         std::span<const std::uint16_t> labels, Reached from, Visit visit) {
-  const auto& tree = backward ? image.backward() : image.forward();
-  for (;; ++from.depth) {
-    const TreeSlot& place = tree.slots[from.slot];
-    if (from.depth > 0 && place.isLeaf()) {
-      for (std::size_t i = 0; i < image::leafWords(place); ++i) {
-        const std::uint32_t word = leafWordAt(image, tree, place.index() + i);
-        const auto own = image.labelsOf(word);
-        bool isAlong = own.size() <= labels.size();
-        for (std::size_t at = 0; isAlong && at < own.size(); ++at) {
-          isAlong = labels[at] == own[backward ? own.size() - 1 - at : at];
-        }
-        if (isAlong) {
-          visit(word, own.size());
-        }
-      }
-      return from;
+  const TreeSlot& at(const Reached& reached) const { return _tree.slots[reached.slot]; }
+
+  bool isAtLeaf(const Reached& reached) const { return reached.depth > 0 && at(reached).isLeaf(); }
+
+  /// Calls `visit(word, labels of the word)` for the words of a leaf.
+  template <typename Visit>
+  void forEachWordOf(const TreeSlot& leaf, Visit visit) {
+    for (std::size_t i = 0; i < image::leafWords(leaf); ++i) {
+      spend();
+      const std::uint32_t word = wordAt(leaf.index() + i);
+      visit(word, _image.labelsOf(word));
     }
-    if (const std::size_t end = childOf(image, tree, place, 0)) {
-      visit(leafWordAt(image, tree, tree.slots[end].index()), from.depth);
-    }
-    if (from.depth == labels.size() || labels[from.depth] == 0) {
-      return from;
-    }
-    const std::size_t child = childOf(image, tree, place, labels[from.depth]);
-    if (child == 0) {
-      return from;
-    }
-    from.slot = child;
   }
-}
+
+  /// Calls `visit(slot, label)` for the children of a place that is no leaf, but for the end of a
+  /// word.
+  template <typename Visit>
+  void forEachChildOf(const TreeSlot& place, Visit visit) {
+    if (place.children == 0) {
+      return;
+    }
+    for (std::size_t child = place.index();; ++child) {
+      const TreeSlot& slot = read(child);
+      if (slot.label != 0) {
+        visit(child, slot.label);
+      }
+      if (slot.isLastChild()) {
+        return;
+      }
+    }
+  }
+
+  /// Calls `visit(word, length)` for every word of the image that the labels begin with, or end
+  /// with in the backward tree, where they stand in reverse; from a place on to which they lead,
+  /// and up to the place that is given back: where the labels end, or no place is behind, or a leaf
+  /// is reached.
+  template <typename Visit>
+  Reached along(std::span<const std::uint16_t> labels, Reached from, Visit visit) {
+    for (;; ++from.depth) {
+      const TreeSlot& place = at(from);
+      if (isAtLeaf(from)) {
+        forEachWordOf(place, [&](std::uint32_t word, const SearchImage::Labels& own) {
+          bool isAlong = own.size() <= labels.size();
+          for (std::size_t i = 0; isAlong && i < own.size(); ++i) {
+            isAlong = labels[i] == own[_backward ? own.size() - 1 - i : i];
+          }
+          if (isAlong) {
+            visit(word, own.size());
+          }
+        });
+        return from;
+      }
+      if (const std::size_t end = childOf(place, 0)) {
+        visit(wordAt(_tree.slots[end].index()), from.depth);
+      }
+      if (from.depth == labels.size() || labels[from.depth] == 0) {
+        return from;
+      }
+      const std::size_t child = childOf(place, labels[from.depth]);
+      if (child == 0) {
+        return from;
+      }
+      from.slot = child;
+    }
+  }
+
+ private:
+  void spend() {
+    if (_left == 0) {
+      _image.throwDamaged("places of a tree overlap");
+    }
+    --_left;
+  }
+
+  const TreeSlot& read(std::size_t slot) {
+    if (slot >= _tree.slots.size()) {
+      _image.throwDamaged("a tree leads out of its section");
+    }
+    spend();
+    return _tree.slots[slot];
+  }
+
+  /// The child of a place behind an edge, or 0.
+  std::size_t childOf(const TreeSlot& place, std::uint16_t label) {
+    const unsigned bit = image::labelBit(label);
+    if ((place.children >> bit & 1U) == 0) {
+      return 0;
+    }
+    const std::uint64_t before = place.children & ((std::uint64_t{1} << bit) - 1);
+    std::size_t child = place.index() + static_cast<unsigned>(std::popcount(before));
+    for (;; ++child) {
+      const TreeSlot& slot = read(child);
+      if (slot.label == label) {
+        return child;
+      }
+      if (slot.label > label || slot.isLastChild()) {
+        return 0;
+      }
+    }
+  }
+
+  /// The word at a place among the leaves.
+  std::uint32_t wordAt(std::size_t place) const {
+    if (place >= _image.wordCount()) {
+      _image.throwDamaged("a tree has more leaves than words");
+    }
+    return _tree.order.empty() ? static_cast<std::uint32_t>(place) : _tree.order[place];
+  }
+
+  const SearchImage& _image;
+  bool _backward;
+  const SearchImage::Tree& _tree;
+  std::uint64_t _left;  // slots and words of leaves that may still be read
+};
 
 template <typename Automaton, typename Accept>
 void walk(const SearchImage& image, bool backward, const typename Automaton::Pattern& pattern,
@@ -185,7 +242,7 @@ std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view wo
 std::optional<std::uint32_t> exactWord(const SearchImage& image, std::u16string_view word) {
   const auto labels = labelsOf(image, word);
   std::optional<std::uint32_t> found;
-  forEachWordAlong(image, false, labels, {}, [&](std::uint32_t other, std::size_t length) {
+  TreeReader(image, false).along(labels, {}, [&](std::uint32_t other, std::size_t length) {
     if (length == labels.size()) {
       found = other;
     }
@@ -197,55 +254,34 @@ std::vector<std::uint32_t> wordsWithUnitBetween(const SearchImage& image, std::u
                                                 std::u16string_view tail) {
   auto labels = labelsOf(image, head);
   const std::size_t gap = labels.size();
-  std::vector<std::uint32_t> found;
-  const auto& tree = image.forward();
-  const auto reached =
-      forEachWordAlong(image, false, labels, {}, [](std::uint32_t, std::size_t) {});
-  const TreeSlot& place = tree.slots[reached.slot];
+  TreeReader reader(image, false);
+  const auto reached = reader.along(labels, {}, [](std::uint32_t, std::size_t) {});
+  const auto tailLabels = labelsOf(image, tail);
   labels.push_back(0);
-  for (const char16_t unit : tail) {
-    labels.push_back(image.labelOf(unit));
+  labels.insert(labels.end(), tailLabels.begin(), tailLabels.end());
+  std::vector<std::uint32_t> found;
+  if (reader.isAtLeaf(reached)) {
+    reader.forEachWordOf(reader.at(reached),
+                         [&](std::uint32_t word, const SearchImage::Labels& own) {
+                           bool isSame = own.size() == labels.size();
+                           for (std::size_t i = 0; isSame && i < own.size(); ++i) {
+                             isSame = i == gap || labels[i] == own[i];
+                           }
+                           if (isSame) {
+                             found.push_back(word);
+                           }
+                         });
+  } else if (reached.depth == gap) {
+    reader.forEachChildOf(reader.at(reached), [&](std::size_t child, std::uint16_t label) {
+      labels[gap] = label;
+      reader.along(labels, {child, gap + 1}, [&](std::uint32_t word, std::size_t length) {
+        if (length == labels.size()) {
+          found.push_back(word);
+        }
+      });
+    });
   }
-  if (reached.depth > 0 && place.isLeaf()) {
-    for (std::size_t i = 0; i < image::leafWords(place); ++i) {
-      const std::uint32_t word = leafWordAt(image, tree, place.index() + i);
-      const auto own = image.labelsOf(word);
-      bool isSame = own.size() == labels.size();
-      for (std::size_t at = 0; isSame && at < own.size(); ++at) {
-        isSame = at == gap || labels[at] == own[at];
-      }
-      if (isSame) {
-        found.push_back(word);
-      }
-    }
-    return found;
-  }
-  if (reached.depth < gap || place.children == 0) {
-    return found;
-  }
-  std::uint64_t inLeaves = 0;
-  for (std::size_t child = place.index();; ++child) {
-    if (child >= tree.slots.size()) {
-      image.throwDamaged("a tree leads out of its section");
-    }
-    labels[gap] = tree.slots[child].label;
-    if (labels[gap] != 0) {
-      const auto end = forEachWordAlong(image, false, labels, {child, gap + 1},
-                                        [&](std::uint32_t word, std::size_t length) {
-                                          if (length == labels.size()) {
-                                            found.push_back(word);
-                                          }
-                                        });
-      inLeaves += tree.slots[end.slot].isLeaf() ? image::leafWords(tree.slots[end.slot]) : 0;
-      // Else all words could stand behind each child.
-      if (inLeaves > image.wordCount()) {
-        image.throwDamaged("leaves of a tree overlap");
-      }
-    }
-    if (tree.slots[child].isLastChild()) {
-      return found;
-    }
-  }
+  return found;
 }
 
 std::vector<JoinedWords> wordsJoinedIn(const SearchImage& image, std::u16string_view word,
@@ -261,9 +297,9 @@ std::vector<JoinedWords> wordsJoinedIn(const SearchImage& image, std::u16string_
       }
     };
   };
-  forEachWordAlong(image, false, labels, {}, noteIn(heads));
+  TreeReader(image, false).along(labels, {}, noteIn(heads));
   std::reverse(labels.begin(), labels.end());
-  forEachWordAlong(image, true, labels, {}, noteIn(tails));
+  TreeReader(image, true).along(labels, {}, noteIn(tails));
   std::vector<JoinedWords> joined;
   for (std::size_t length = 1; length < tails.size(); ++length) {
     const auto add = [&](std::size_t headLength, Seam between) {

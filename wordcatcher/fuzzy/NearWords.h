@@ -26,11 +26,14 @@ struct NearWord {
 std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view word,
                                 std::uint32_t maxEdits, bool transpositions);
 
+// Those below are safe for any number of threads, and throw Error (damaged). They read the siblings
+// of a place one after the other where these have rare labels, which most have not.
+
 /// The word of the image that is this one. Linear in the word.
 std::optional<std::uint32_t> exactWord(const SearchImage& image, std::u16string_view word);
 
-/// The words of the image that are one word, any code unit and another word. Linear in the two and
-/// in the units that stand behind the first one in the image.
+/// The words of the image that are one word, any code unit and another word. Linear in the first,
+/// and in the second for each unit that stands behind the first in the image.
 std::vector<std::uint32_t> wordsWithUnitBetween(const SearchImage& image, std::u16string_view head,
                                                 std::u16string_view tail);
 

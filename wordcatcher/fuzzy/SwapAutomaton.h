@@ -90,8 +90,8 @@ struct SwapBand {
   }
 };
 
-/// A query prepared for simulation at up to K edits, the head as free to be left out as the rest;
-/// with `swaps` false it is the plain Levenshtein automaton.
+/// A query prepared for simulation at up to K edits, of which its head may have fewer; with `swaps`
+/// false it is the plain Levenshtein automaton.
 template <unsigned K>
 class SwapPattern : public QueryPattern<K, SwapBand<K>::kColumns + 1> {
  public:

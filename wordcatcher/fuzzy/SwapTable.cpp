@@ -1,6 +1,7 @@
 #include "wordcatcher/fuzzy/SwapTable.h"
 
 #include <bit>
+#include <cassert>
 #include <limits>
 #include <span>
 #include <unordered_map>
@@ -21,6 +22,7 @@ class NumberedSets {
     const auto [place, isNew] = _numbers.try_emplace(set, static_cast<std::uint8_t>(_sets.size()));
     if (isNew) {
       _sets.push_back(set);
+      assert(_sets.size() <= UINT8_MAX);
     }
     return place->second;
   }
@@ -108,7 +110,9 @@ SwapTable<K>::SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder) 
 template <unsigned K>
 template <bool Swaps, bool IsFirst>
 const SwapTable<K>& SwapTable<K>::made() {
-  static const SwapTable table(Swaps, IsFirst ? kInFirst : kInSecond, IsFirst);
+  // Never destroyed: threads and destructors may still ask while the program ends.
+  static const SwapTable& table =
+      *new SwapTable(Swaps, IsFirst ? kInFirst : kInSecond, IsFirst);  // NOLINT(*-owning-memory)
   return table;
 }
 

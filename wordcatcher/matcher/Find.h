@@ -21,6 +21,10 @@ namespace wordcatcher {
 /// digits of both sides agree, as no number is taken for another then: "a 12" finds the stored
 /// word "a12", and "a12" the stored words "a 12", for the one edit that joining costs. Whole texts
 /// and codes are no such words.
+///
+/// A code unit in place of the space between two words that the other side has ("goldnfish",
+/// "rai way") is an edit as well. It is looked for where a word of so many code units as the two
+/// and it may have two edits, digits being numbers here too.
 struct EditLimits {
   /// The greatest limit that there may be, in edits.
   static constexpr std::uint32_t kMaxEdits = 3;

@@ -136,18 +136,20 @@ class WORDCATCHER_EXPORT Index {
   ///
   /// Ranges are of the text as given, in bytes, half-open. Words are those of Unicode's rules; at
   /// most Options::maxQueryWords are looked at, a word of more than Options::maxWordUnits is not
-  /// looked up, and FindOptions::maxPostings bounds the phrases that are judged. Throws Error
+  /// looked up, at most 1,000,000 words near those of the text are taken (a word near two of them
+  /// counts twice), and FindOptions::maxPostings bounds the phrases that are judged. Throws Error
   /// (badInput) for edit limits that are too large.
   ///
   /// `limit` k gives the first k of all matches, unless the result is `truncated`: what a budget
   /// cut off may have come before some that are listed, and with another limit it may cut at
   /// another place, so that the first k may then differ from those of a longer list.
   ///
-  /// The time is that of search() for each word of the text within its edit limit; then at most
-  /// FindOptions::maxPostings phrases are judged, each in time linear in its words and in the ways
-  /// to pair them, and as many steps taken to try pairings. Phrases are met in the order of what
-  /// they may cost at best, so that a small `limit` ends this early; with `overlaps` other than
-  /// `all`, all matches are found and sorted first.
+  /// The time is that of search() for each word of the text within its edit limit, and, for each
+  /// two neighbours, linear in the stored beginnings of one code unit more than the first; then at
+  /// most FindOptions::maxPostings phrases are judged, each in time linear in its words and in the
+  /// ways to pair them, and as many steps taken to try pairings. Phrases are met in the order of
+  /// what they may cost at best, so that a small `limit` ends this early; with `overlaps` other
+  /// than `all`, all matches are found and sorted first.
   FindResult find(std::string_view text) const;
 
   /// The same with options: how many, how far, which of those that overlap.

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <bit>
 #include <iterator>
+#include <map>
 #include <numeric>
 #include <string_view>
 #include <tuple>
@@ -21,10 +22,10 @@ constexpr std::uint32_t kJoinEdits = 1;
 // edits: short ones agree with too much.
 constexpr std::uint32_t kUnitBetweenLimit = 2;
 
-Seam seamWithin(std::uint32_t limit) {
-  return limit >= kUnitBetweenLimit ? Seam::unit : Seam::none;
-}
 constexpr char16_t kFirstBeyondAscii = 0x80;
+
+// Words near those of a text, counted once for each of these.
+constexpr std::size_t kMostOptions = 1'000'000;
 
 // Trying all pairings of a phrase takes steps, which cost about as much as a posting.
 constexpr std::uint64_t kStepsAPosting = 1;
@@ -35,6 +36,10 @@ constexpr std::size_t kValuesAhead = 4;
 
 // Costs above are rare.
 constexpr std::size_t kCountedBounds = 64;
+
+Seam seamWithin(std::uint32_t limit) {
+  return limit >= kUnitBetweenLimit ? Seam::unit : Seam::none;
+}
 
 std::uint64_t apart(std::uint64_t a, std::uint64_t b) { return a < b ? b - a : a - b; }
 
@@ -80,6 +85,15 @@ PhraseFinder::PhraseFinder(const SearchImage& image, const FindText& text,
   makeTable();
 }
 
+/// A text that repeats words near many has as many ways as both, multiplied.
+void PhraseFinder::addOption(const WordOption& option) {
+  if (_wordOptions.size() < kMostOptions) {
+    _wordOptions.push_back(option);
+  } else {
+    _truncated = true;
+  }
+}
+
 void PhraseFinder::lookUpWords() {
   std::unordered_map<std::u16string_view, std::vector<NearWord>> known;
   for (std::uint32_t position = 0; position < _text.words.size(); ++position) {
@@ -104,7 +118,7 @@ void PhraseFinder::lookUpWords() {
       }
     }
     for (const NearWord& near : place->second) {
-      _wordOptions.push_back({near.word, {position, 1, 1, static_cast<std::uint8_t>(near.edits)}});
+      addOption({near.word, {position, 1, 1, static_cast<std::uint8_t>(near.edits)}});
     }
   }
 }
@@ -128,28 +142,39 @@ bool PhraseFinder::isNumber(const NearWord& near, std::size_t length) const {
   return false;
 }
 
-/// Neighbours in the text that are one stored word, or would be with a letter for the space.
+/// What two words of the text are in one, or with a letter for the space between them.
+std::vector<std::uint32_t> PhraseFinder::wordsJoining(const FindWord& first,
+                                                      const FindWord& second) const {
+  std::vector<std::uint32_t> words;
+  const std::size_t length = first.word.size() + 1 + second.word.size();
+  if (seamWithin(editLimit(length, false, _options.edits)) == Seam::unit) {
+    words = wordsWithUnitBetween(_image, first.word, second.word);
+    std::erase_if(words, [&](std::uint32_t word) {
+      const bool isNumber = holdsDigit(_image.textOf(word));
+      return seamWithin(editLimit(length, isNumber, _options.edits)) == Seam::none;
+    });
+  }
+  if (const auto word = exactWord(_image, first.word + second.word)) {
+    words.push_back(*word);
+  }
+  return words;
+}
+
+/// Neighbours in the text that are one stored word.
 void PhraseFinder::lookUpJoins() {
+  std::map<std::pair<std::u16string_view, std::u16string_view>, std::vector<std::uint32_t>> known;
   for (std::uint32_t position = 0; position + 1 < _text.words.size(); ++position) {
     const FindWord& first = _text.words[position];
     const FindWord& second = _text.words[position + 1];
     if (!first.isLookedUp || !second.isLookedUp) {
       continue;
     }
-    const auto join = [&](std::uint32_t word) {
-      _wordOptions.push_back({word, {position, 2, 1, kJoinEdits}});
-    };
-    if (const auto word = exactWord(_image, first.word + second.word)) {
-      join(*word);
+    const auto [place, isNew] = known.try_emplace({first.word, second.word});
+    if (isNew) {
+      place->second = wordsJoining(first, second);
     }
-    const std::size_t length = first.word.size() + 1 + second.word.size();
-    if (seamWithin(editLimit(length, false, _options.edits)) == Seam::unit) {
-      for (const std::uint32_t word : wordsWithUnitBetween(_image, first.word, second.word)) {
-        const bool isNumber = holdsDigit(_image.textOf(word));
-        if (seamWithin(editLimit(length, isNumber, _options.edits)) == Seam::unit) {
-          join(word);
-        }
-      }
+    for (const std::uint32_t word : place->second) {
+      addOption({word, {position, 2, 1, kJoinEdits}});
     }
   }
 }

@@ -13,7 +13,7 @@
 //     2 (n - q) + 2 |m - q|  for q = n - r
 //
 // and the edits of the source that brings it. (Phrases of which words are joined or split may cost
-// less. There are few, and all of them are judged first.) Phrases stand in every posting list by
+// less; all of them are judged first.) Phrases stand in every posting list by
 // their lengths, so a list falls into segments, each with one such bound. Segments are read in the
 // order of their bounds, until the bound exceeds the cost of the last of the best k: nothing that
 // is left can be among them. So a text that holds a phrase is answered from its rare words' lists,
@@ -100,6 +100,8 @@ class PhraseFinder {
     std::uint32_t position;
   };
 
+  void addOption(const WordOption& option);
+  std::vector<std::uint32_t> wordsJoining(const FindWord& first, const FindWord& second) const;
   void lookUpWords();
   bool isNumber(const NearWord& near, std::size_t length) const;
   void lookUpJoins();
