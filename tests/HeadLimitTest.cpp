@@ -9,24 +9,15 @@
 #include <optional>
 #include <vector>
 
+#include "LabelRows.h"
 #include "wordcatcher/fuzzy/BandedAutomaton.h"
 #include "wordcatcher/fuzzy/SwapAutomaton.h"
 
 namespace wordcatcher {
 namespace {
 
-using Labels = std::vector<std::uint16_t>;
-
-std::vector<Labels> labelsUpTo(std::size_t length, std::uint16_t letters) {
-  std::vector<Labels> all = {{}};
-  for (std::size_t i = 0; all[i].size() < length; ++i) {
-    for (std::uint16_t letter = 1; letter <= letters; ++letter) {
-      all.push_back(all[i]);
-      all.back().push_back(letter);
-    }
-  }
-  return all;
-}
+using testing::Labels;
+using testing::labelsUpTo;
 
 constexpr std::uint64_t kNever = 1000;
 

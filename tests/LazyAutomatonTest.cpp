@@ -11,6 +11,7 @@
 #include <random>
 #include <vector>
 
+#include "LabelRows.h"
 #include "wordcatcher/fuzzy/BandedAutomaton.h"
 #include "wordcatcher/fuzzy/SwapAutomaton.h"
 
@@ -18,7 +19,7 @@ namespace wordcatcher {
 namespace {
 
 using Random = std::mt19937;
-using Labels = std::vector<std::uint16_t>;
+using testing::Labels;
 
 /// Common labels, the rarest common one, rare ones, and, for a word of a damaged image, 0 and more
 /// than there are.

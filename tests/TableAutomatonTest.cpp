@@ -10,24 +10,15 @@
 #include <random>
 #include <vector>
 
+#include "LabelRows.h"
 #include "wordcatcher/fuzzy/SwapAutomaton.h"
 
 namespace wordcatcher {
 namespace {
 
-using Labels = std::vector<std::uint16_t>;
+using testing::Labels;
+using testing::labelsUpTo;
 using Random = std::mt19937;
-
-std::vector<Labels> labelsUpTo(std::size_t length, std::uint16_t letters) {
-  std::vector<Labels> all = {{}};
-  for (std::size_t i = 0; all[i].size() < length; ++i) {
-    for (std::uint16_t letter = 1; letter <= letters; ++letter) {
-      all.push_back(all[i]);
-      all.back().push_back(letter);
-    }
-  }
-  return all;
-}
 
 std::vector<QueryUnit> unitsOf(const Labels& query) {
   std::vector<QueryUnit> units(query.size());
