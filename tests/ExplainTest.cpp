@@ -150,6 +150,31 @@ TEST(ExplainTest, TellsWhatWasJoined) {
   expectSameInJson(split);
 }
 
+TEST(ExplainTest, TellsOfABudgetThatCutThePairing) {
+  std::string phrase;
+  std::string text = "golden";
+  for (int i = 0; i < 20; ++i) {
+    phrase += "golden goldan goldin ";
+    text += " goldon goldon goldon";
+  }
+  const auto index = indexOf(Entries{{phrase, "long"}, {"golden gate", "short"}});
+  for (const std::uint64_t postings : {100, 2000, 2'000'000}) {
+    FindOptions options;
+    options.maxPostings = postings;
+    ASSERT_TRUE(index.find(text, options).truncated);
+    const auto explained = index.explain(text, "long", options);
+    EXPECT_TRUE(explained.truncated) << postings;
+    EXPECT_NE(explained.toText().find("A budget was used up"), std::string::npos);
+    for (const auto& objection : explained.objections) {
+      EXPECT_NE(objection.find("budget"), std::string::npos) << objection;
+    }
+    EXPECT_EQ(explained.isFound, explained.objections.empty());
+    expectSameInJson(explained);
+  }
+  EXPECT_TRUE(index.explain(text, "short").truncated) << "as the list is that it stands in";
+  EXPECT_FALSE(index.explain("golden gate", "short").truncated);
+}
+
 /// What an absent value is told about: some words of each sentence.
 void expectAbsent(const FindExplanation& explained, const Values& reasons) {
   EXPECT_FALSE(explained.isFound);
@@ -411,7 +436,7 @@ TEST(ExplainTest, WordsThatAreTooLong) {
   EXPECT_EQ(explained.words.at(0).end, 11U);
   EXPECT_TRUE(explained.words.at(0).comparisons.empty());
   EXPECT_NE(explained.toText().find("  mississippi, not looked up\n"), std::string::npos);
-  EXPECT_NE(explained.toText().find("beyond the budget"), std::string::npos);
+  EXPECT_NE(explained.toText().find("A budget was used up"), std::string::npos);
   expectSameInJson(explained);
 }
 

@@ -62,7 +62,7 @@
    7. Threads. An index and a result may be used by any number of threads at once; a builder by one
       at a time. Giving back must be the last use. The library starts no thread, has no state of
       its own that changes but the log handler, never prints, never exits and takes no signals. A
-   thread must not be cancelled (pthread_cancel) or left (longjmp) inside a call.
+      thread must not be cancelled (pthread_cancel) or left (longjmp) inside a call.
 
    8. No C++ exception leaves a function. Memory that runs out is WORDCATCHER_NO_MEMORY, and leaves
       everything as it was.
@@ -291,7 +291,8 @@ typedef struct wordcatcher_match {
 
 /** The phrases near a text, by ascending distance, then by value (in UTF-16 code units): those of
    Index::query, which answers as the classic matcher does. Bytes that are not UTF-8 separate
-   words. The time is bounded by the budgets that the index was opened with. */
+   words. The words that are looked up are bounded by the budgets that the index was opened with;
+   the time is also linear in the phrases under all words found, which no budget bounds. */
 WORDCATCHER_EXPORT wordcatcher_code wordcatcher_index_query(const wordcatcher_index* index,
                                                             const char* text, size_t text_length,
                                                             wordcatcher_matches** matches,

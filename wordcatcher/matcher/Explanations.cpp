@@ -91,7 +91,8 @@ std::string listed(const std::vector<std::string>& words) {
   return list.empty() ? "none" : list;
 }
 
-constexpr const char* kCutOff = "Some words of the text were left out: it is beyond the budget.\n";
+constexpr const char* kCutOff =
+    "A budget was used up: some words, comparisons, pairings or phrases were left out.\n";
 constexpr const char* kNotCompared = " ... (beyond the budget)";
 
 /// One word of the text beside those of the phrase, of which there are so many.

@@ -137,7 +137,8 @@ struct WORDCATCHER_EXPORT FindExplanation {
 
   bool isStored = false;                ///< whether the index holds the value
   bool isFound = false;                 ///< whether find() lists it
-  bool truncated = false;               ///< whether a budget cut words or comparisons off
+  bool truncated = false;               ///< whether a budget cut words, comparisons, pairings or
+                                        ///< matches before it off
   std::vector<TextWord> words;          ///< of the text, in its order
   std::vector<std::string> phrase;      ///< the words of the phrase that fits best
   std::vector<FoundWord> pairs;         ///< what was paired, in the order of the text

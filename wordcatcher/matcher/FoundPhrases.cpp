@@ -217,10 +217,13 @@ std::optional<std::string> digitObjection(const Paired& paired,
   return std::nullopt;
 }
 
-void object(const RankedPhrase& phrase, const FindOptions& options, FindExplanation& explanation) {
+void object(const RankedPhrase& phrase, const FindOptions& options, bool isCutOff,
+            FindExplanation& explanation) {
   auto& objections = explanation.objections;
   if (phrase.phrase.empty()) {
     objections.emplace_back("Its phrase holds no word.");
+  } else if (phrase.words == 0 && isCutOff) {
+    objections.emplace_back("The budget was used up before its words were paired.");
   } else if (phrase.words == 0) {
     objections.emplace_back("None of its words is near enough to a word of the text.");
   } else if (phrase.words < options.minWords) {
@@ -265,10 +268,13 @@ std::optional<std::size_t> placeOf(const SearchImage& image, const FindText& tex
   return std::nullopt;
 }
 
-/// Why a value that matches is not listed all the same; nothing if it is.
+/// Why a value that matches is not listed all the same; nothing if it is. Sets `isCutOff` when the
+/// list is.
 std::optional<std::string> omissionOf(const SearchImage& image, const FindText& text,
-                                      std::uint32_t number, FindOptions options, bool joins) {
+                                      std::uint32_t number, FindOptions options, bool joins,
+                                      bool& isCutOff) {
   const FindResult result = findPhrases(image, text, options, joins);
+  isCutOff = isCutOff || result.truncated;
   if (lists(result, image.valueText(number))) {
     return std::nullopt;
   }
@@ -338,15 +344,17 @@ FindExplanation explainFind(const SearchImage& image, const FindText& text, std:
   for (const Pair& pair : pairs) {
     explanation.edits += pair.option.edits;
   }
+  explanation.truncated = explanation.truncated || finder.truncated();
   compareWords(image, text, phrase, options, explanation);
   listWords(image, phrase, paired, explanation);
   explanation.pairs = hitsOf(image, text, phrase, std::move(pairs));
   if (!admitted) {
-    object(phrase, options, explanation);
+    object(phrase, options, finder.truncated(), explanation);
     if (auto objection = digitObjection(paired, explanation)) {
       explanation.objections.push_back(*std::move(objection));
     }
-  } else if (auto omission = omissionOf(image, text, *number, options, joins)) {
+  } else if (auto omission =
+                 omissionOf(image, text, *number, options, joins, explanation.truncated)) {
     explanation.objections.push_back(*std::move(omission));
   }
   explanation.isFound = explanation.objections.empty();
