@@ -3,6 +3,8 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <random>
+#include <utility>
 #include <vector>
 
 namespace wordcatcher::testing {
@@ -20,6 +22,35 @@ inline std::vector<Labels> labelsUpTo(std::size_t length, std::uint16_t letters)
     }
   }
   return all;
+}
+
+/// A row so many edits of any kind away; `anyLabel()` gives what is inserted and put in place.
+template <typename AnyLabel>
+Labels edited(Labels labels, std::size_t edits, std::mt19937& random, AnyLabel anyLabel) {
+  for (; edits > 0; --edits) {
+    const auto place = labels.begin() + static_cast<std::ptrdiff_t>(random() % (labels.size() + 1));
+    switch (random() % 4) {
+      case 0:
+        labels.insert(place, anyLabel());
+        break;
+      case 1:
+        if (place != labels.end()) {
+          labels.erase(place);
+        }
+        break;
+      case 2:
+        if (place != labels.end()) {
+          *place = anyLabel();
+        }
+        break;
+      default:
+        if (place != labels.end() && place + 1 != labels.end()) {
+          std::swap(place[0], place[1]);
+        }
+        break;
+    }
+  }
+  return labels;
 }
 
 }  // namespace wordcatcher::testing

@@ -9,6 +9,7 @@
 #include <array>
 #include <optional>
 #include <random>
+#include <utility>
 #include <vector>
 
 #include "LabelRows.h"
@@ -38,35 +39,13 @@ std::vector<QueryUnit> anyQuery(Random& random, std::size_t length, std::size_t 
 }
 
 /// A word some edits away.
-Labels edited(const std::vector<QueryUnit>& units, Random& random, std::size_t letters) {
+Labels wordNear(const std::vector<QueryUnit>& units, Random& random, std::size_t letters) {
   Labels labels;
   for (const auto& unit : units) {
     labels.push_back(unit.any ? anyLabel(random, letters) : unit.label);
   }
-  for (std::size_t edits = random() % 5; edits > 0; --edits) {
-    const auto place = labels.begin() + static_cast<std::ptrdiff_t>(random() % (labels.size() + 1));
-    switch (random() % 4) {
-      case 0:
-        labels.insert(place, anyLabel(random, kLabels.size()));
-        break;
-      case 1:
-        if (place != labels.end()) {
-          labels.erase(place);
-        }
-        break;
-      case 2:
-        if (place != labels.end()) {
-          *place = anyLabel(random, kLabels.size());
-        }
-        break;
-      default:
-        if (place != labels.end() && place + 1 != labels.end()) {
-          std::swap(place[0], place[1]);
-        }
-        break;
-    }
-  }
-  return labels;
+  return testing::edited(std::move(labels), random() % 5, random,
+                         [&random] { return anyLabel(random, kLabels.size()); });
 }
 
 /// The states after each code unit of a word, by the pattern alone.
@@ -225,7 +204,7 @@ std::size_t readWords(const std::vector<QueryUnit>& units, const Pattern& patter
   Reader<K, Lanes, Pattern> reader(pattern, start, backward, memory);
   std::size_t accepted = 0;
   for (int i = 0; i < kWords; ++i) {
-    accepted += reader.read(edited(units, random, letters), i % 2 == 0, random) ? 1U : 0U;
+    accepted += reader.read(wordNear(units, random, letters), i % 2 == 0, random) ? 1U : 0U;
   }
   return accepted;
 }

@@ -16,6 +16,7 @@
 namespace wordcatcher {
 namespace {
 
+using testing::edited;
 using testing::Labels;
 using testing::labelsUpTo;
 using Random = std::mt19937;
@@ -63,8 +64,8 @@ class Both {
 
  private:
   static HeadLimit literalLimit(Limit limit, std::size_t head) {
-    return limit == Limit::first    ? HeadLimit{head, Table::kInFirst, true}
-           : limit == Limit::second ? HeadLimit{head, Table::kInSecond, false}
+    return limit == Limit::first    ? HeadLimit{head, Halves<K>::kInFirst, true}
+           : limit == Limit::second ? HeadLimit{head, Halves<K>::kInSecond, false}
                                     : HeadLimit{0, K, false};
   }
 
@@ -147,36 +148,6 @@ TEST(TableAutomatonTest, EveryQueryOfThreeLetters) {
   expectSmallWorld<2>(4, 3);
 }
 
-/// A word some edits from a query.
-Labels edited(Labels word, std::size_t edits, const std::vector<std::uint16_t>& letters,
-              Random& random) {
-  for (; edits > 0; --edits) {
-    const auto place = word.begin() + static_cast<std::ptrdiff_t>(random() % (word.size() + 1));
-    const std::uint16_t letter = letters[random() % letters.size()];
-    switch (random() % 4) {
-      case 0:
-        word.insert(place, letter);
-        break;
-      case 1:
-        if (place != word.end()) {
-          word.erase(place);
-        }
-        break;
-      case 2:
-        if (place != word.end()) {
-          *place = letter;
-        }
-        break;
-      default:
-        if (place != word.end() && place + 1 != word.end()) {
-          std::swap(place[0], place[1]);
-        }
-        break;
-    }
-  }
-  return word;
-}
-
 template <unsigned K>
 void expectLongQueries() {
   Random random(K);  // NOLINT(cert-msc32-c,cert-msc51-cpp): the same every time
@@ -186,12 +157,13 @@ void expectLongQueries() {
   for (const std::size_t length : {6U, 20U, 50U, 56U, 57U, 58U, 59U, 60U, 61U, 70U, 300U}) {
     for (int round = 0; round < 60; ++round) {
       const std::vector<std::uint16_t> letters(all.begin(), all.begin() + 1 + round % 8);
-      const Labels query = edited(Labels(length, 1), length, letters, random);
+      const auto anyLetter = [&] { return letters[random() % letters.size()]; };
+      const Labels query = edited(Labels(length, 1), length, random, anyLetter);
       const Limit limit = kLimits[random() % kLimits.size()];
       const auto units = unitsOf(query);
       Both<K> both(units, round % 2 == 0, limit, random() % (query.size() + 1));
       for (int word = 0; word < 20; ++word) {
-        accepted += both.expectSame(edited(query, random() % (K + 2), letters, random)) ? 1U : 0U;
+        accepted += both.expectSame(edited(query, random() % (K + 2), random, anyLetter)) ? 1U : 0U;
         if (::testing::Test::HasFailure()) {
           return;
         }

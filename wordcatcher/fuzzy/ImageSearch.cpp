@@ -119,13 +119,10 @@ template <unsigned K>
 void searchByHalves(const SearchImage& image, const Query& query, HitList& hits) {
   constexpr unsigned kLanes = 2 * Band<K>::kLaneBits <= 64 ? 2 : 1;
   const std::size_t length = query.units.size();
-  constexpr unsigned kInFirst = K / 2;
-  constexpr unsigned kInSecond = K - kInFirst - 1;
-  // Where the halves differ in edits, the one that allows more is the longer one.
-  const std::size_t half = (length + kInFirst - kInSecond) / 2;
+  const std::size_t half = Halves<K>::first(length);
   const std::vector<QueryUnit> reversed(query.units.rbegin(), query.units.rend());
-  const BandedPattern<K, kLanes> first(query.units, {half, kInFirst, true});
-  const BandedPattern<K, kLanes> second(reversed, {length - half, kInSecond, false});
+  const BandedPattern<K, kLanes> first(query.units, {half, Halves<K>::kInFirst, true});
+  const BandedPattern<K, kLanes> second(reversed, {length - half, Halves<K>::kInSecond, false});
   const auto memory = image.lendWalkMemory();
   Walk<K, kLanes> forward(image, image.forward(), false, first, *memory);
   Walk<K, kLanes> backward(image, image.backward(), true, second, *memory);

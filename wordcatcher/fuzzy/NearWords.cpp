@@ -172,19 +172,16 @@ template <unsigned K>
 void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units, bool swaps,
                   std::vector<NearWord>& found) {
   constexpr std::size_t kMinSplitLength = 2 + 2 * std::size_t{K};
-  constexpr unsigned kInFirst = K / 2;
-  constexpr unsigned kInSecond = K - kInFirst - 1;
   const auto accept = [&found](std::uint32_t word, std::uint32_t edits, std::size_t) {
     found.push_back({word, edits});
   };
   const auto memory = image.lendWalkMemory();
   const bool isWhole = units.size() < kMinSplitLength;
-  const std::size_t half = (units.size() + kInFirst - kInSecond) / 2;
+  const std::size_t half = Halves<K>::first(units.size());
   const std::vector<QueryUnit> reversed(units.rbegin(), units.rend());
   if constexpr (K <= 2) {
     using Automaton = TableAutomaton<K>;
     using Pattern = TablePattern<K>;
-    static_assert(kInFirst == SwapTable<K>::kInFirst && kInSecond == SwapTable<K>::kInSecond);
     const auto& table = SwapTable<K>::ofFirst(swaps);
     if (isWhole) {
       walk<Automaton>(image, false, Pattern(units, table), *memory, accept);
@@ -200,8 +197,9 @@ void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units,
       walk<Automaton>(image, false, Pattern(units, swaps, {0, K}), *memory, accept);
       return;
     }
-    walk<Automaton>(image, false, Pattern(units, swaps, {half, kInFirst, true}), *memory, accept);
-    const Pattern second(reversed, swaps, {units.size() - half, kInSecond, false});
+    walk<Automaton>(image, false, Pattern(units, swaps, {half, Halves<K>::kInFirst, true}), *memory,
+                    accept);
+    const Pattern second(reversed, swaps, {units.size() - half, Halves<K>::kInSecond, false});
     walk<Automaton>(image, true, second, *memory, accept);
   }
 }
@@ -302,15 +300,15 @@ std::vector<JoinedWords> wordsJoinedIn(const SearchImage& image, std::u16string_
   TreeReader(image, true).along(labels, {}, noteIn(tails));
   std::vector<JoinedWords> joined;
   for (std::size_t length = 1; length < tails.size(); ++length) {
-    const auto add = [&](std::size_t headLength, Seam between) {
+    const auto addBehind = [&](std::size_t headLength) {
       if (heads[headLength] != kNoWord) {
-        joined.push_back({heads[headLength], tails[length], between});
+        joined.push_back({heads[headLength], tails[length]});
       }
     };
     if (tails[length] != kNoWord) {
-      add(tails.size() - length, Seam::none);
-      if (seam == Seam::unit && length + 1 < tails.size()) {
-        add(tails.size() - length - 1, Seam::unit);
+      addBehind(tails.size() - length);
+      if (seam == Seam::unit) {
+        addBehind(tails.size() - length - 1);
       }
     }
   }

@@ -47,7 +47,6 @@ enum class Seam : std::uint8_t {
 struct JoinedWords {
   std::uint32_t head;
   std::uint32_t tail;
-  Seam seam;
 
   friend bool operator==(const JoinedWords&, const JoinedWords&) = default;
 };

@@ -40,6 +40,19 @@ struct HeadLimit {
   bool holdsBorder = false;
 };
 
+/// The halves of a query for two walks that begin at either end: of at most K edits the first half
+/// with its border has at most kInFirst, or the second without it at most kInSecond.
+template <unsigned K>
+struct Halves {
+  static constexpr unsigned kInFirst = K / 2;
+  static constexpr unsigned kInSecond = K - kInFirst - 1;
+
+  /// The code units of the first half. The half that allows more edits is the longer one.
+  static constexpr std::size_t first(std::size_t length) noexcept {
+    return (length + kInFirst - kInSecond) / 2;
+  }
+};
+
 /// Which code units of a query stand where, as the automata within K edits want to know it. Column
 /// c after d code units of a word stands for d + c - K code units of the query; a step looks at
 /// those behind the first `Window` columns. Linear in the query to make.

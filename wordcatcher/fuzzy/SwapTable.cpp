@@ -112,7 +112,8 @@ template <bool Swaps, bool IsFirst>
 const SwapTable<K>& SwapTable<K>::made() {
   // Never destroyed: threads and destructors may still ask while the program ends.
   static const SwapTable& table =
-      *new SwapTable(Swaps, IsFirst ? kInFirst : kInSecond, IsFirst);  // NOLINT(*-owning-memory)
+      *new SwapTable(Swaps, IsFirst ? Halves<K>::kInFirst : Halves<K>::kInSecond,
+                     IsFirst);  // NOLINT(*-owning-memory)
   return table;
 }
 

@@ -38,10 +38,6 @@ class SwapTable {
   static constexpr unsigned kWindow = kColumns + 1;
   static constexpr std::size_t kMatchings = std::size_t{1} << kWindow;
 
-  /// The edits that the heads of the two walks may be passed with; see searchWithin().
-  static constexpr unsigned kInFirst = K / 2;
-  static constexpr unsigned kInSecond = K - kInFirst - 1;
-
   /// From the last stage on no state is limited any more. From the first one back all are, and
   /// after one more code unit as well.
   static constexpr std::int64_t kLastStage = -static_cast<std::int64_t>(K) - 1;

@@ -41,7 +41,8 @@ struct FindText {
            std::size_t maxWords, std::size_t maxWordUnits);
 };
 
-/// How many edits a word of so many code units may have, and how many if it is a number.
+/// The edits that a word of so many code units may have; `isNumber`: it holds a digit, or what it
+/// is compared with does.
 std::uint32_t editLimit(std::size_t length, bool isNumber, const EditLimits& limits) noexcept;
 
 /// Whether a string holds a decimal digit of any script: such words name numbers, of which one that
