@@ -99,8 +99,9 @@ void setLengths(const std::string& list, EditLimits& edits) {
 
 std::string editsDescription() {
   const EditLimits edits;
-  return "Edits that a word of the text may have:\nof up to " + std::to_string(edits.shortLength) +
-         " letters, of up to " + std::to_string(edits.mediumLength) +
+  return "Edits that a word may be away from a stored one\nof up to " +
+         std::to_string(edits.shortLength) + " letters, of up to " +
+         std::to_string(edits.mediumLength) +
          ", of more (see --lengths);\na 4th number is for whole texts. Words that hold a digit\n"
          "are only found exactly (see --number-edits).\nDefault: " +
          std::to_string(edits.shortEdits) + ',' + std::to_string(edits.mediumEdits) + ',' +
@@ -109,13 +110,13 @@ std::string editsDescription() {
 
 std::string numberEditsDescription() {
   return "Edits that a word may have if it, or the stored word, holds\na digit; at most those that "
-         "its length allows.\nDefault: " +
+         "the stored word's length allows.\nDefault: " +
          std::to_string(EditLimits().numberEdits);
 }
 
 std::string lengthsDescription() {
   const EditLimits edits;
-  return "The letters up to which a word has the first of the --edits,\nand the "
+  return "The letters up to which a stored word has the first of the --edits,\nand the "
          "second.\nDefault: " +
          std::to_string(edits.shortLength) + ',' + std::to_string(edits.mediumLength);
 }

@@ -22,16 +22,16 @@ constexpr const char* kIsStored = "Whether the index holds the value.";
 constexpr const char* kToJson = "One JSON object on one line; offsets in code points.";
 
 constexpr const char* kLimitsDoc =
-    R"(How many edits a word of the text may be away from a stored word, by its length.
+    R"(How many edits a word of the text may be away from a stored word, by the stored word's length.
 
-short_length    A word of up to so many UTF-16 code units, lower-cased, is short;
+short_length    A stored word of up to so many UTF-16 code units, lower-cased, is short;
 medium_length   a longer one of up to so many is medium; all others are long.
 short_edits     Edits of a short word,
 medium_edits    of a medium one,
 long_edits      of a long one,
 whole_text_edits  of a whole text, in an index of whole texts,
-number_edits    of a word when it or the stored word holds a digit: at most those that its length
-                allows; each at most 3.
+number_edits    of a word when it or the stored word holds a digit: at most those that the stored
+                word's length allows; each at most 3.
 
 Words that hold a digit are only found exactly, which number_edits alone relaxes.)";
 
@@ -71,7 +71,7 @@ void bindLimits(py::module_& module) {
   bindRecord(
       module, "EditLimits", documented("EditLimits(" + parameters, kLimitsDoc).c_str(),
       Construction<EditLimits>::by(make),
-      Field{"short_length", &EditLimits::shortLength, "A word of up to so many is short."},
+      Field{"short_length", &EditLimits::shortLength, "A stored word of up to so many is short."},
       Field{"medium_length", &EditLimits::mediumLength, "A longer one of up to so many is medium."},
       Field{"short_edits", &EditLimits::shortEdits, "Edits of a short word."},
       Field{"medium_edits", &EditLimits::mediumEdits, "Edits of a medium word."},
@@ -144,7 +144,12 @@ std::string shown(FindExplanation explanation) {
 
 void bindFindExplanation(py::module_& module) {
   using Comparison = FindExplanation::Comparison;
+  using PhraseWord = FindExplanation::PhraseWord;
   using TextWord = FindExplanation::TextWord;
+  bindRecord(
+      module, "PhraseWord", "A word of a phrase.", Field{"word", &PhraseWord::word, "As stored."},
+      Field{"length_limit", &PhraseWord::lengthLimit, "Edits that it may have by its length."},
+      Field{"limit", &PhraseWord::limit, "Edits that it may have: less if it holds a digit."});
   bindRecord(module, "WordComparison", "A word of a phrase beside a word of the text.",
              Field{"word", &Comparison::word, "Of the phrase."},
              Field{"edits", &Comparison::edits, "Between the two."},
@@ -155,8 +160,6 @@ void bindFindExplanation(py::module_& module) {
       module, "TextWord", "A word of the text.", Field{"begin", &TextWord::begin, kBegin},
       Field{"end", &TextWord::end, kEnd}, Field{"word", &TextWord::word, "As it is looked up."},
       Field{"written", &TextWord::written, "If that is a code, as it is in the text; else empty."},
-      Field{"length_limit", &TextWord::lengthLimit, "Edits that it may have by its length."},
-      Field{"limit", &TextWord::limit, "Edits that it may have: less if it holds a digit."},
       Field{"is_looked_up", &TextWord::isLookedUp, "False for a word that is too long."},
       Field{"comparisons", &TextWord::comparisons,
             "With the words of the phrase, in its order; with some or none if truncated."});

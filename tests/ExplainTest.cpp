@@ -22,6 +22,14 @@ using testing::indexOfPhrases;
 
 using Values = std::vector<std::string>;
 
+Values wordsOf(const FindExplanation& explained) {
+  Values words;
+  for (const auto& word : explained.phrase) {
+    words.push_back(word.word);
+  }
+  return words;
+}
+
 Index places() {
   return indexOf(Entries{{"Trinidad and Tobago", "Trinidad and Tobago{ TT }"},
                          {"Bosnia and Herzegovina", "Bosnia and Herzegovina{ BA }"},
@@ -42,7 +50,12 @@ void expectSameInJson(const FindExplanation& explained) {
   EXPECT_EQ(object.at("isStored"), explained.isStored);
   EXPECT_EQ(object.at("isFound"), explained.isFound);
   EXPECT_EQ(object.at("truncated"), explained.truncated);
-  EXPECT_EQ(object.at("phrase"), json(explained.phrase));
+  json phrase = json::array();
+  for (const auto& word : explained.phrase) {
+    phrase.push_back(
+        {{"word", word.word}, {"lengthLimit", word.lengthLimit}, {"limit", word.limit}});
+  }
+  EXPECT_EQ(object.at("phrase"), phrase);
   EXPECT_EQ(object.at("missing"), json(explained.missing));
   EXPECT_EQ(object.at("surplus"), json(explained.surplus));
   EXPECT_EQ(object.at("objections"), json(explained.objections));
@@ -61,8 +74,6 @@ void expectSameInJson(const FindExplanation& explained) {
                      {"end", word.end},
                      {"word", word.word},
                      {"written", word.written},
-                     {"lengthLimit", word.lengthLimit},
-                     {"limit", word.limit},
                      {"isLookedUp", word.isLookedUp},
                      {"comparisons", comparisons}});
   }
@@ -80,7 +91,11 @@ TEST(ExplainTest, TellsWhatAPhraseCosts) {
   EXPECT_TRUE(explained.isStored);
   EXPECT_TRUE(explained.isFound);
   EXPECT_FALSE(explained.truncated);
-  EXPECT_EQ(explained.phrase, (Values{"trinidad", "and", "tobago"}));
+  EXPECT_EQ(wordsOf(explained), (Values{"trinidad", "and", "tobago"}));
+  for (std::size_t i = 0; i < 3; ++i) {
+    EXPECT_EQ(explained.phrase[i].limit, i == 1 ? 1U : 2U) << "as long as it is";
+    EXPECT_EQ(explained.phrase[i].lengthLimit, explained.phrase[i].limit);
+  }
   EXPECT_EQ(explained.pairs,
             (std::vector<FoundWord>{{3, 11, "trinidad", 1}, {16, 23, "tobago", 1}}));
   EXPECT_EQ(explained.missing, Values{"and"});
@@ -94,17 +109,16 @@ TEST(ExplainTest, TellsWhatAPhraseCosts) {
   EXPECT_EQ(word.end, 11U);
   EXPECT_EQ(word.word, "trinidat");
   EXPECT_EQ(word.written, "") << "it is no code";
-  EXPECT_EQ(word.limit, 2U);
-  EXPECT_EQ(word.lengthLimit, 2U);
   EXPECT_TRUE(word.isLookedUp);
   ASSERT_EQ(word.comparisons.size(), 3U);
   EXPECT_EQ(word.comparisons[0].word, "trinidad");
   EXPECT_EQ(word.comparisons[0].edits, 1U);
+  EXPECT_EQ(word.comparisons[0].limit, 2U);
   EXPECT_TRUE(word.comparisons[0].within);
   EXPECT_EQ(word.comparisons[1].word, "and");
   EXPECT_EQ(word.comparisons[1].edits, 6U);
+  EXPECT_EQ(word.comparisons[1].limit, 1U);
   EXPECT_FALSE(word.comparisons[1].within);
-  EXPECT_EQ(explained.words[0].limit, 0U);
   expectSameInJson(explained);
 }
 
@@ -112,10 +126,10 @@ TEST(ExplainTest, InWords) {
   EXPECT_EQ(places().explain("zeeland and new", "New Zealand{ NZ }").toText(),
             "Text:   zeeland and new\n"
             "Value:  New Zealand{ NZ }\n"
-            "Phrase: new, zealand\n"
-            "  zeeland, up to 2 edits: new 6, zealand 1 (near)\n"
-            "  and, up to 1 edit: new 3, zealand 4\n"
-            "  new, up to 1 edit: new 0 (near), zealand 6\n"
+            "Phrase: new (up to 1 edit), zealand (up to 2 edits)\n"
+            "  zeeland: new 6, zealand 1 (near)\n"
+            "  and: new 3, zealand 4\n"
+            "  new: new 0 (near), zealand 6\n"
             "Paired: zeeland with zealand, 1 edit\n"
             "Paired: new with new, 0 edits\n"
             "Missing from the text: none\n"
@@ -125,8 +139,8 @@ TEST(ExplainTest, InWords) {
 
 TEST(ExplainTest, TellsOfThePhraseThatFitsBest) {
   const auto index = places();
-  EXPECT_EQ(index.explain("aotearoa", "New Zealand{ NZ }").phrase, Values{"aotearoa"});
-  EXPECT_EQ(index.explain("zealand", "New Zealand{ NZ }").phrase, (Values{"new", "zealand"}));
+  EXPECT_EQ(wordsOf(index.explain("aotearoa", "New Zealand{ NZ }")), Values{"aotearoa"});
+  EXPECT_EQ(wordsOf(index.explain("zealand", "New Zealand{ NZ }")), (Values{"new", "zealand"}));
   FindOptions two;
   two.minWords = 2;
   EXPECT_FALSE(index.explain("aotearoa", "New Zealand{ NZ }", two).isFound);
@@ -300,8 +314,8 @@ TEST(ExplainTest, NumbersAreNotNear) {
   const auto explained = places().explain("route 67", "Route 66");
   ASSERT_EQ(explained.words.size(), 2U);
   const auto& number = explained.words[1];
-  EXPECT_EQ(number.limit, 0U);
-  EXPECT_EQ(number.lengthLimit, 0U) << "so short a word is not near anything";
+  EXPECT_EQ(explained.phrase.at(1).limit, 0U);
+  EXPECT_EQ(explained.phrase.at(1).lengthLimit, 0U) << "nothing is near so short a word";
   EXPECT_EQ(number.comparisons.at(1).edits, 1U);
   EXPECT_FALSE(number.comparisons.at(1).within);
   EXPECT_EQ(explained.cost, 4U);
@@ -311,22 +325,24 @@ TEST(ExplainTest, TellsThatADigitKeepsWordsApart) {
   const auto index = indexOfPhrases({"covid19 vaccine", "b2b"});
   const auto stored = index.explain("covidy", "covid19 vaccine");
   ASSERT_EQ(stored.words.size(), 1U);
-  EXPECT_EQ(stored.words[0].limit, 2U);
+  EXPECT_EQ(stored.phrase.at(0).limit, 0U);
+  EXPECT_EQ(stored.phrase.at(0).lengthLimit, 2U);
   EXPECT_EQ(stored.words[0].comparisons.at(0).edits, 2U);
   EXPECT_EQ(stored.words[0].comparisons.at(0).limit, 0U);
   EXPECT_EQ(stored.words[0].comparisons.at(1).limit, 2U);
-  EXPECT_NE(stored.toText().find("  covidy, up to 2 edits: covid19 2 (words with a digit must be "
-                                 "the same), vaccine 6\n"),
+  EXPECT_NE(stored.toText().find("Phrase: covid19 (up to 0 edits as it holds a digit), vaccine (up "
+                                 "to 2 edits)\n"
+                                 "  covidy: covid19 2 (words with a digit must be the same), "
+                                 "vaccine 6\n"),
             std::string::npos)
       << stored.toText();
   expectAbsent(stored, {"None",
                         "A word that holds a digit must be the same, and \"covidy\" is 2 "
                         "edits from \"covid19\"."});
   const auto given = index.explain("b2c", "b2b");
-  EXPECT_EQ(given.words.at(0).limit, 0U);
-  EXPECT_EQ(given.words.at(0).lengthLimit, 1U);
-  EXPECT_NE(given.toText().find("  b2c, up to 0 edits as it holds a digit: b2b 1 (words with a "
-                                "digit must be the same)\n"),
+  EXPECT_EQ(given.words.at(0).comparisons.at(0).limit, 0U);
+  EXPECT_EQ(given.phrase.at(0).lengthLimit, 1U);
+  EXPECT_NE(given.toText().find("  b2c: b2b 1 (words with a digit must be the same)\n"),
             std::string::npos)
       << given.toText();
   expectAbsent(given, {"None", R"("b2c" is 1 edit from "b2b".)"});
@@ -345,14 +361,15 @@ TEST(ExplainTest, TellsOfTheEditsOfNumbers) {
   options.edits.numberEdits = 1;
   const auto found = index.explain("b2c", "b2b", options);
   EXPECT_EQ(found.cost, 1U);
-  EXPECT_EQ(found.words.at(0).limit, 1U);
-  EXPECT_NE(found.toText().find("  b2c, up to 1 edit: b2b 1 (near)\n"), std::string::npos);
+  EXPECT_EQ(found.phrase.at(0).limit, 1U);
+  EXPECT_NE(found.toText().find("Phrase: b2b (up to 1 edit)\n  b2c: b2b 1 (near)\n"),
+            std::string::npos);
   const auto far = index.explain("covidy", "covid19 vaccine", options);
   EXPECT_EQ(far.words.at(0).comparisons.at(0).limit, 1U);
   EXPECT_NE(far.toText().find("covid19 2 (words with a digit: up to 1 edit), "), std::string::npos);
   expectAbsent(far, {"None", "may have up to 1 edit, and \"covidy\" is 2 edits from"});
   options.edits.numberEdits = 3;
-  EXPECT_EQ(index.explain("b2c", "b2b", options).words.at(0).limit, 1U) << "no more than others";
+  EXPECT_EQ(index.explain("b2c", "b2b", options).phrase.at(0).limit, 1U) << "no more than others";
   EXPECT_EQ(index.explain("covidy", "covid19 vaccine", options).cost, 4U);
 }
 
@@ -376,8 +393,7 @@ TEST(ExplainTest, ComparesAsManyWordsAsTheBudgetAllows) {
   EXPECT_EQ(comparisons, FindExplanation::kMaxSteps / FindExplanation::kComparisonSteps);
   EXPECT_EQ(explained.words.front().comparisons.size(), 400U);
   EXPECT_TRUE(explained.words.back().comparisons.empty());
-  EXPECT_NE(explained.toText().find("  tree, up to 1 edit: ... (beyond the budget)\n"),
-            std::string::npos);
+  EXPECT_NE(explained.toText().find("  tree: ... (beyond the budget)\n"), std::string::npos);
   expectSameInJson(explained);
   EXPECT_FALSE(index.explain(text, "tree").truncated);
 }
@@ -445,7 +461,8 @@ TEST(ExplainTest, OtherModes) {
       indexOf(Entries{{"12 Baker Street", "A"}, {"Baker Street", "B"}}, MatchingMode::wholeText);
   const auto explained = whole.explain("12 baker streat", "A");
   EXPECT_TRUE(explained.isFound);
-  EXPECT_EQ(explained.phrase, Values{"12 baker street"});
+  EXPECT_EQ(wordsOf(explained), Values{"12 baker street"});
+  EXPECT_EQ(explained.phrase.at(0).limit, 3U);
   EXPECT_EQ(explained.cost, 1U);
   EXPECT_TRUE(explained.words.at(0).comparisons.at(0).within);
   EXPECT_EQ(whole.find("baker street").matches.at(0).value, "B");
@@ -454,9 +471,9 @@ TEST(ExplainTest, OtherModes) {
       indexOf(Entries{{"Catherine", "C"}, {"Peter", "P"}}, MatchingMode::phoneticWords);
   const auto code = sounds.explain("dear Kathryn", "C");
   EXPECT_TRUE(code.isFound);
-  EXPECT_EQ(code.phrase, Values{"k0rn"});
+  EXPECT_EQ(wordsOf(code), Values{"k0rn"});
   EXPECT_EQ(code.words.at(1).word, "k0rn");
-  EXPECT_EQ(code.words.at(1).limit, 0U);
+  EXPECT_EQ(code.phrase.at(0).limit, 0U);
   EXPECT_EQ(code.words.at(1).begin, 5U);
   EXPECT_EQ(code.words.at(1).written, "Kathryn");
   EXPECT_EQ(code.surplus, Values{"dear (tr)"});
@@ -464,9 +481,9 @@ TEST(ExplainTest, OtherModes) {
   EXPECT_EQ(code.toText(),
             "Text:   dear Kathryn\n"
             "Value:  C\n"
-            "Phrase: k0rn\n"
-            "  dear (tr), up to 0 edits: k0rn 3\n"
-            "  Kathryn (k0rn), up to 0 edits: k0rn 0 (near)\n"
+            "Phrase: k0rn (up to 0 edits)\n"
+            "  dear (tr): k0rn 3\n"
+            "  Kathryn (k0rn): k0rn 0 (near)\n"
             "Paired: Kathryn with k0rn, 0 edits\n"
             "Missing from the text: none\n"
             "Left over in the text: dear (tr)\n"

@@ -173,7 +173,7 @@ TEST_F(HostileFindTest, WordsThatAreNotAsLongAsTheTreeSaysAreDamage) {
   leadToEvenWords(forged);
   const Index index = open(forged);
   EXPECT_NE(damageFoundBy([&] { index.search("rxb", 2); }).find("length"), std::string::npos);
-  EXPECT_NE(damageFoundBy([&] { index.find("rxbb"); }).find("longer"), std::string::npos);
+  EXPECT_NE(damageFoundBy([&] { index.find("rxbb"); }).find("as long as"), std::string::npos);
 }
 
 }  // namespace

@@ -105,6 +105,14 @@ struct Outcome {
 
 class HostilePhrasesTest : public ::testing::TestWithParam<Sample> {
  protected:
+  /// What is made once for a program and kept is no question's.
+  void SetUp() override {
+    const Index index = testing::openIndex(GetParam().bytes());
+    for (const Question& question : GetParam().questions) {
+      testing::faultOfAnswers(index, question, true);
+    }
+  }
+
   /// Asks all that is asked of the sample.
   Outcome examine(const ImageBytes& bytes) {
     Outcome outcome;

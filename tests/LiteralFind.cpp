@@ -159,7 +159,7 @@ bool LiteralFind::mayPair(std::u16string_view inPhrase, std::u16string_view inTe
       return edits <= limits.wholeTextEdits;
     default:
       const bool isNumber = namesNumber(inPhrase) || namesNumber(inText);
-      return edits <= limitByLength(inText, limits) && (!isNumber || edits <= limits.numberEdits);
+      return edits <= limitByLength(inPhrase, limits) && (!isNumber || edits <= limits.numberEdits);
   }
 }
 

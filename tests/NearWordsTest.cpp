@@ -61,23 +61,20 @@ class Words {
         edits.push_back(literalEdits(query, word, swaps));
       }
       for (std::uint32_t most = 0; most <= kMostEdits; ++most) {
-        std::vector<NearWord> expected;
-        for (std::uint32_t i = 0; i < _words.size(); ++i) {
-          if (edits[i] <= most) {
-            expected.push_back({i, static_cast<std::uint32_t>(edits[i])});
-          }
+        matches += expectNear(query, edits, {most}, swaps);
+        // From lengths of which all such words are to those that none is of.
+        for (std::size_t longer = 0; most > 0 && longer <= 2 * most + 2; ++longer) {
+          const std::size_t fromLength =
+              query.size() + longer - std::min<std::size_t>(query.size(), most);
+          expectNear(query, edits, {most, fromLength}, swaps);
         }
-        matches += expected.size();
-        EXPECT_TRUE(nearWords(*_image, query, most, swaps) == expected)
-            << displayUtf8(query) << " within " << most << (swaps ? " with" : " without")
-            << " swaps of " << _words.size() << " words";
       }
     }
     return matches;
   }
 
   std::vector<NearWord> near(std::u16string_view query, std::uint32_t most) const {
-    return nearWords(*_image, query, most, true);
+    return nearWords(*_image, query, {most}, true);
   }
 
   void expectExact(std::u16string_view query) const {
@@ -136,6 +133,23 @@ class Words {
   }
 
  private:
+  std::size_t expectNear(std::u16string_view query, const std::vector<std::uint64_t>& edits,
+                         NearLimit limit, bool swaps) const {
+    std::vector<NearWord> expected;
+    for (std::uint32_t i = 0; i < _words.size(); ++i) {
+      const std::size_t length = _words[i].size();
+      const bool isShort = limit.edits > 0 && length < limit.fromLength;
+      if (edits[i] <= limit.edits - (isShort ? 1U : 0U)) {
+        expected.push_back(
+            {i, static_cast<std::uint32_t>(edits[i]), static_cast<std::uint32_t>(length)});
+      }
+    }
+    EXPECT_TRUE(nearWords(*_image, query, limit, swaps) == expected)
+        << displayUtf8(query) << " within " << limit.edits << " from length " << limit.fromLength
+        << (swaps ? " with" : " without") << " swaps of " << _words.size() << " words";
+    return expected.size();
+  }
+
   bool has(const std::u16string& word) const {
     return std::binary_search(_words.begin(), _words.end(), word);
   }

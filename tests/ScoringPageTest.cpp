@@ -14,6 +14,7 @@
 #include <string>
 #include <vector>
 
+#include "FindSupport.h"
 #include "TestSupport.h"
 #include "wordcatcher/matcher/Index.h"
 
@@ -107,7 +108,7 @@ std::string drawingOfPairs(const FindExplanation& explanation) {
   dot << "  }\n";
   row("phrase", "the phrase", "#fbf4e6");
   for (const auto& word : explanation.phrase) {
-    dot << "    " << phraseNode(word) << " [label=" << inQuotes(word) << "];\n";
+    dot << "    " << phraseNode(word.word) << " [label=" << inQuotes(word.word) << "];\n";
   }
   dot << "  }\n  \"none\" [label=\"left over: 2 each\", fillcolor=\"#f4f4f4\"];\n";
   for (const auto& word : explanation.words) {
@@ -257,6 +258,10 @@ TEST_F(ScoringPageTest, WhatItSaysInPassingHolds) {
   FindOptions options;
   options.transpositions = false;
   EXPECT_TRUE(index().find("nwe", options).matches.empty());
+  const Index ox = testing::indexOfPhrases({"oxygen", "ox"});
+  EXPECT_EQ(testing::valuesOf(ox.find("oxgyene")), std::vector<std::string>{"oxygen"});
+  EXPECT_EQ(testing::valuesOf(ox.find("oxyn")), std::vector<std::string>{"oxygen"});
+  EXPECT_TRUE(ox.find("oxe").matches.empty());
   EXPECT_EQ(index().find("zealand new").matches.at(0).cost, 0);
   EXPECT_EQ(index().explain("trinidat and tobbago", "Trinidad and Tobago").cost, 2);
   EXPECT_EQ(index().explain("newyork yrok", "York").cost, 3);

@@ -38,14 +38,16 @@ class Both {
   using Table = SwapTable<K>;
   using Automaton = TableAutomaton<K>;
 
-  Both(const std::vector<QueryUnit>& units, bool swaps, Limit limit, std::size_t head)
+  Both(const std::vector<QueryUnit>& units, bool swaps, Limit limit, std::size_t head,
+       int leastLonger)
       : _literal(units, swaps, literalLimit(limit, head)),
+        _leastLength(static_cast<std::ptrdiff_t>(units.size()) + leastLonger),
         _table(limit == Limit::none
-                   ? TablePattern<K>(units, Table::ofFirst(swaps))
-                   : TablePattern<K>(
-                         units,
-                         limit == Limit::first ? Table::ofFirst(swaps) : Table::ofSecond(swaps),
-                         head)),
+                   ? TablePattern<K>(units, Table::ofFirst(swaps, leastLonger))
+                   : TablePattern<K>(units,
+                                     limit == Limit::first ? Table::ofFirst(swaps, leastLonger)
+                                                           : Table::ofSecond(swaps, leastLonger),
+                                     head)),
         _automaton(_table, false, _memory) {}
 
   /// Compares what both say of a word; whether they accept it.
@@ -55,7 +57,9 @@ class Both {
       set = stepped(set, depth, word[depth]);
     }
     const std::uint64_t accepted = set == 0 ? 0 : set & _literal.acceptingAt(word.size());
-    const bool isAccepted = accepted != 0;
+    const bool isLongEnough = static_cast<std::ptrdiff_t>(word.size()) >= _leastLength;
+    const bool isAccepted =
+        accepted != 0 && (isLongEnough || SwapBand<K>::distanceOf(accepted) < K);
     const std::uint32_t distance =
         isAccepted ? SwapBand<K>::distanceOf(accepted) : Automaton::kNotAccepted;
     expectWalk(word, distance);
@@ -108,6 +112,7 @@ class Both {
   }
 
   SwapPattern<K> _literal;
+  std::ptrdiff_t _leastLength;  // of words of K edits
   TablePattern<K> _table;
   AutomatonMemory _memory;
   Automaton _automaton;
@@ -123,14 +128,17 @@ void expectSmallWorld(std::size_t length, std::uint16_t letters) {
     const auto units = unitsOf(query);
     for (const Limit limit : kLimits) {
       for (std::size_t head = 0; head <= (limit == Limit::none ? 0 : query.size()); ++head) {
-        for (const bool swaps : {false, true}) {
-          Both<K> both(units, swaps, limit, head);
-          for (const auto& word : words) {
-            accepted += both.expectSame(word) ? 1U : 0U;
+        for (int leastLonger = -int{K}; leastLonger <= int{K}; ++leastLonger) {
+          for (const bool swaps : {false, true}) {
+            Both<K> both(units, swaps, limit, head, leastLonger);
+            for (const auto& word : words) {
+              accepted += both.expectSame(word) ? 1U : 0U;
+            }
+            ASSERT_FALSE(::testing::Test::HasFailure())
+                << ::testing::PrintToString(query) << ", head " << head << ", limit "
+                << static_cast<int>(limit) << (swaps ? ", swaps" : "") << ", longer by "
+                << leastLonger;
           }
-          ASSERT_FALSE(::testing::Test::HasFailure())
-              << ::testing::PrintToString(query) << ", head " << head << ", limit "
-              << static_cast<int>(limit) << (swaps ? ", swaps" : "");
         }
       }
     }
@@ -161,7 +169,9 @@ void expectLongQueries() {
       const Labels query = edited(Labels(length, 1), length, random, anyLetter);
       const Limit limit = kLimits[random() % kLimits.size()];
       const auto units = unitsOf(query);
-      Both<K> both(units, round % 2 == 0, limit, random() % (query.size() + 1));
+      const std::size_t head = random() % (query.size() + 1);
+      const int leastLonger = static_cast<int>(random() % (2 * K + 1)) - int{K};
+      Both<K> both(units, round % 2 == 0, limit, head, leastLonger);
       for (int word = 0; word < 20; ++word) {
         accepted += both.expectSame(edited(query, random() % (K + 2), random, anyLetter)) ? 1U : 0U;
         if (::testing::Test::HasFailure()) {

@@ -200,17 +200,17 @@ enum {
 #define WORDCATCHER_ANY_COST UINT64_MAX
 
 /** What wordcatcher_index_find() looks for and how much of it. The lengths that make a word short,
-   medium or long are UTF-16 code units of its lower-case form; an edit is one code unit replaced,
-   inserted or left out. Edits are at most 3 each. Words that hold a digit are only found exactly,
-   which `number_edits` alone relaxes. */
+   medium or long are UTF-16 code units of a stored word in lower case; an edit is one code unit
+   replaced, inserted or left out. Edits are at most 3 each. Words that hold a digit are only found
+   exactly, which `number_edits` alone relaxes. */
 typedef struct wordcatcher_find_options {
   size_t size;               /**< set by wordcatcher_find_options_init() */
   size_t limit;              /**< matches at the most: the first ones of all; 10 */
   uint64_t max_cost;         /**< the greatest cost of a match; WORDCATCHER_ANY_COST */
   size_t min_words;          /**< words of a phrase that the text must hold; 1, as for 0 */
-  size_t short_length;       /**< a word of up to so many code units is short; 2 */
+  size_t short_length;       /**< a stored word of up to so many code units is short; 2 */
   size_t medium_length;      /**< a longer one of up to so many is medium, others are long; 5 */
-  uint32_t short_edits;      /**< edits that a short word of the text may have; 0 */
+  uint32_t short_edits;      /**< edits from a short word to the text's; 0 */
   uint32_t medium_edits;     /**< a medium one; 1 */
   uint32_t long_edits;       /**< a long one; 2 */
   uint32_t whole_text_edits; /**< the whole text, in an index of whole texts; 3 */
@@ -218,7 +218,7 @@ typedef struct wordcatcher_find_options {
   int32_t overlaps;          /**< WORDCATCHER_OVERLAPS_...; all */
   uint64_t max_postings;     /**< postings (phrases under a word) that are looked at; 2,000,000 */
   uint64_t number_edits;     /**< edits of a word when it or the stored word holds a digit: at most
-                                those that its length allows; 0 */
+                                those that the stored word's length allows; 0 */
 } wordcatcher_find_options;
 
 /** Fills the options with the defaults named above. `size`: sizeof *options. NULL does nothing. */

@@ -153,9 +153,14 @@ def test_explain_numbers_and_codes(tmp_path: Path) -> None:
     numbers = Index.open(tmp_path / "words")
     assert values(numbers.find("b118")) == []
     assert values(numbers.find("b118", edits=EditLimits(number_edits=1))) == ["Catherine b117"]
-    (word,) = numbers.explain("b118", "Catherine b117").words
-    assert (word.written, word.length_limit, word.limit, word.is_looked_up) == ("", 1, 0, True)
-    assert word.comparisons[1].limit == 0
+    explanation = numbers.explain("b118", "Catherine b117")
+    (word,) = explanation.words
+    assert (word.written, word.is_looked_up) == ("", True)
+    assert [each.limit for each in word.comparisons] == [0, 0]
+    assert [(each.word, each.length_limit, each.limit) for each in explanation.phrase] == [
+        ("catherine", 2, 2),
+        ("b117", 1, 0),
+    ]
     codes = Index.open(tmp_path / "phonetic").explain("déar "
                                                       "Kathryn", "Catherine b117")
     assert [each.written for each in codes.words] == ["déar",

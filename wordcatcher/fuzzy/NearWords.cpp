@@ -167,13 +167,16 @@ void walk(const SearchImage& image, bool backward, const typename Automaton::Pat
 /// Two walks, each with few edits in the half of the query that it reads first; see
 /// ImageSearch.cpp. Walks along the whole query count the least edits that their limits allow, so a
 /// word that both meet has the lesser of its two counts: with all edits in reach of one half, that
-/// is the distance.
+/// is the distance. Words of K edits have at least `fromLength` code units.
 template <unsigned K>
-void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units, bool swaps,
-                  std::vector<NearWord>& found) {
-  constexpr std::size_t kMinSplitLength = 2 + 2 * std::size_t{K};
-  const auto accept = [&found](std::uint32_t word, std::uint32_t edits, std::size_t) {
-    found.push_back({word, edits});
+void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units,
+                  std::size_t fromLength, bool swaps, std::vector<NearWord>& found) {
+  constexpr std::size_t kMinSplitLength = K <= 2 ? 4 : 2 + 2 * std::size_t{K};
+  const auto accept = [&found, fromLength](std::uint32_t word, std::uint32_t edits,
+                                           std::size_t length) {
+    if (edits < K || length >= fromLength) {
+      found.push_back({word, edits, static_cast<std::uint32_t>(length)});
+    }
   };
   const auto memory = image.lendWalkMemory();
   const bool isWhole = units.size() < kMinSplitLength;
@@ -182,13 +185,17 @@ void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units,
   if constexpr (K <= 2) {
     using Automaton = TableAutomaton<K>;
     using Pattern = TablePattern<K>;
-    const auto& table = SwapTable<K>::ofFirst(swaps);
+    constexpr std::int64_t kEdits = K;
+    const auto leastLonger = static_cast<int>(
+        std::clamp(static_cast<std::int64_t>(fromLength) - static_cast<std::int64_t>(units.size()),
+                   -kEdits, kEdits));
+    const auto& table = SwapTable<K>::ofFirst(swaps, leastLonger);
     if (isWhole) {
       walk<Automaton>(image, false, Pattern(units, table), *memory, accept);
       return;
     }
     walk<Automaton>(image, false, Pattern(units, table, half), *memory, accept);
-    const Pattern second(reversed, SwapTable<K>::ofSecond(swaps), units.size() - half);
+    const Pattern second(reversed, SwapTable<K>::ofSecond(swaps, leastLonger), units.size() - half);
     walk<Automaton>(image, true, second, *memory, accept);
   } else {
     using Automaton = LazyAutomaton<K, 1, SwapPattern<K>>;
@@ -206,27 +213,31 @@ void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units,
 
 }  // namespace
 
-std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view word,
-                                std::uint32_t maxEdits, bool transpositions) {
+std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view word, NearLimit limit,
+                                bool transpositions) {
   std::vector<NearWord> found;
   if (word.empty()) {
     return found;
   }
   const auto units = unitsOf(image, word);
-  switch (maxEdits) {
+  if (limit.edits > 0 && limit.fromLength > word.size() + limit.edits) {
+    // None of so many edits is that long.
+    limit = {limit.edits - 1, 0};
+  }
+  switch (limit.edits) {
     case 0:
       if (const auto same = exactWord(image, word)) {
-        found.push_back({*same, 0});
+        found.push_back({*same, 0, static_cast<std::uint32_t>(word.size())});
       }
       return found;
     case 1:
-      searchWithin<1>(image, units, transpositions, found);
+      searchWithin<1>(image, units, limit.fromLength, transpositions, found);
       break;
     case 2:
-      searchWithin<2>(image, units, transpositions, found);
+      searchWithin<2>(image, units, limit.fromLength, transpositions, found);
       break;
     default:
-      searchWithin<3>(image, units, transpositions, found);
+      searchWithin<3>(image, units, limit.fromLength, transpositions, found);
       break;
   }
   std::sort(found.begin(), found.end(), [](const NearWord& a, const NearWord& b) {

@@ -15,16 +15,24 @@ namespace wordcatcher {
 struct NearWord {
   std::uint32_t word;
   std::uint32_t edits;
+  std::uint32_t length;  // in code units
 
   friend bool operator==(const NearWord&, const NearWord&) = default;
 };
 
-/// Every word of the image within so many edits of a lower-cased one, ascending by word: plain edit
+/// How many edits a word of an image may be away: at most 3, and one less if it is shorter than so
+/// many code units.
+struct NearLimit {
+  std::uint32_t edits = 0;
+  std::size_t fromLength = 0;
+};
+
+/// Every word of the image within the limit of a lower-cased one, ascending by word: plain edit
 /// distance, with no signs of special meaning, neighbours swapped being one edit if
-/// `transpositions` says so (see editDistance). `maxEdits` is at most 3. Safe for any number of
-/// threads. Throws Error (damaged).
-std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view word,
-                                std::uint32_t maxEdits, bool transpositions);
+/// `transpositions` says so (see editDistance). Safe for any number of threads. Throws Error
+/// (damaged).
+std::vector<NearWord> nearWords(const SearchImage& image, std::u16string_view word, NearLimit limit,
+                                bool transpositions);
 
 // Those below are safe for any number of threads, and throw Error (damaged). They read the siblings
 // of a place one after the other where these have rare labels, which most have not.

@@ -5,6 +5,7 @@
 #include <limits>
 #include <span>
 #include <unordered_map>
+#include <utility>
 
 #include "wordcatcher/fuzzy/SwapAutomaton.h"
 
@@ -61,16 +62,32 @@ typename SwapTable<K>::State stateOf(std::uint64_t set) {
   return state;
 }
 
+/// All states but those that can only lead to words of K edits and too few code units. Of K edits
+/// nothing is left, so that column c says what such a word is longer by at its end: K - c. A swap
+/// that is under way ends one column up.
+template <unsigned K>
+std::uint64_t longEnough(int leastLonger) {
+  using Plain = Band<K>;
+  const int columns = static_cast<int>(K) - leastLonger + 1;
+  const std::uint64_t tooFar = Plain::kRow & ~((std::uint64_t{1} << columns) - 1);
+  const std::uint64_t tooFarToSwap = Plain::kRow & ~((std::uint64_t{1} << (columns - 1)) - 1);
+  return ~(tooFar << (K * Plain::kColumns) |
+           tooFarToSwap << (SwapBand<K>::kPlainBits + (K - 1) * Plain::kColumns));
+}
+
 }  // namespace
 
 // All of it is read off the pattern of a query in which every stage is so far from both ends that
 // these make no difference.
 template <unsigned K>
-SwapTable<K>::SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder) {
+SwapTable<K>::SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder, int leastLonger) {
   constexpr std::size_t kHead = 3 * K + 5;
   const std::vector<QueryUnit> units(2 * kHead);
   const SwapPattern<K> pattern(units, swaps, {kHead, editsOfHead, headHoldsBorder});
   const std::uint64_t begin = std::uint64_t{1} << K;
+  const auto validAt = [&pattern, allowed = longEnough<K>(leastLonger)](std::size_t depth) {
+    return pattern.validAt(depth) & allowed;
+  };
 
   std::array<NumberedSets, kStages> setsOf;
   std::array<std::size_t, kStages> firsts = {};
@@ -80,8 +97,7 @@ SwapTable<K>::SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder) 
     auto& next = setsOf[indexOf(stage - 1)];
     const auto depth = static_cast<std::size_t>(static_cast<std::int64_t>(kHead) - stage);
     if (stage >= 0 || stage == kLastStage) {
-      _starts[indexOf(stage)] =
-          sets.numberOf(pattern.closedAt(begin, depth) & pattern.validAt(depth));
+      _starts[indexOf(stage)] = sets.numberOf(pattern.closedAt(begin, depth) & validAt(depth));
     }
     firsts[indexOf(stage)] = _states.size();
     for (std::size_t number = 0; number < sets.size(); ++number) {
@@ -90,7 +106,7 @@ SwapTable<K>::SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder) 
       for (std::size_t columns = 0; columns < kMatchings; ++columns) {
         const std::uint64_t byMatch = pattern.closedAt(B::matched(set, columns), depth + 1);
         const Number to =
-            next.numberOf((pattern.editedAt(set, depth) | byMatch) & pattern.validAt(depth + 1));
+            next.numberOf((pattern.editedAt(set, depth) | byMatch) & validAt(depth + 1));
         _steps.push_back(to);
         if (to != kDead && std::has_single_bit(columns)) {
           state.wanted = static_cast<std::uint8_t>(state.wanted | columns);
@@ -108,23 +124,35 @@ SwapTable<K>::SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder) 
 }
 
 template <unsigned K>
-template <bool Swaps, bool IsFirst>
+template <bool Swaps, bool IsFirst, int LeastLonger>
 const SwapTable<K>& SwapTable<K>::made() {
   // Never destroyed: threads and destructors may still ask while the program ends.
   static const SwapTable& table =
-      *new SwapTable(Swaps, IsFirst ? Halves<K>::kInFirst : Halves<K>::kInSecond,
-                     IsFirst);  // NOLINT(*-owning-memory)
+      *new SwapTable(Swaps, IsFirst ? Halves<K>::kInFirst : Halves<K>::kInSecond, IsFirst,
+                     LeastLonger);  // NOLINT(*-owning-memory)
   return table;
 }
 
 template <unsigned K>
-const SwapTable<K>& SwapTable<K>::ofFirst(bool swaps) {
-  return swaps ? made<true, true>() : made<false, true>();
+template <bool Swaps, bool IsFirst>
+const SwapTable<K>& SwapTable<K>::tableOf(int leastLonger) {
+  constexpr int kEdits = K;
+  return [leastLonger]<int... I>(std::integer_sequence<int, I...>)->const SwapTable& {
+    constexpr std::array<const SwapTable& (*)(), sizeof...(I)> kTables = {
+        &made<Swaps, IsFirst, I - kEdits>...};
+    return kTables[static_cast<std::size_t>(leastLonger + kEdits)]();
+  }
+  (std::make_integer_sequence<int, 2 * kEdits + 1>());
 }
 
 template <unsigned K>
-const SwapTable<K>& SwapTable<K>::ofSecond(bool swaps) {
-  return swaps ? made<true, false>() : made<false, false>();
+const SwapTable<K>& SwapTable<K>::ofFirst(bool swaps, int leastLonger) {
+  return swaps ? tableOf<true, true>(leastLonger) : tableOf<false, true>(leastLonger);
+}
+
+template <unsigned K>
+const SwapTable<K>& SwapTable<K>::ofSecond(bool swaps, int leastLonger) {
+  return swaps ? tableOf<true, false>(leastLonger) : tableOf<false, false>(leastLonger);
 }
 
 template class SwapTable<1>;

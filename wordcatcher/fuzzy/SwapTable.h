@@ -66,10 +66,12 @@ class SwapTable {
   SwapTable(const SwapTable&) = delete;
   SwapTable& operator=(const SwapTable&) = delete;
 
-  /// The table of the first walk, in which the head holds its border, or of the second. Made when
-  /// it is first asked for. Safe for any number of threads.
-  static const SwapTable& ofFirst(bool swaps);
-  static const SwapTable& ofSecond(bool swaps);
+  /// The table of the first walk, in which the head holds its border, or of the second. A word that
+  /// takes K edits is not accepted unless it is at least so many code units longer than the query:
+  /// from -K, which excludes none, to K. Made when it is first asked for. Safe for any number of
+  /// threads.
+  static const SwapTable& ofFirst(bool swaps, int leastLonger);
+  static const SwapTable& ofSecond(bool swaps, int leastLonger);
 
   const Stage& stage(std::int64_t stage) const noexcept { return _stages[indexOf(stage)]; }
 
@@ -77,9 +79,11 @@ class SwapTable {
   Number start(std::int64_t stage) const noexcept { return _starts[indexOf(stage)]; }
 
  private:
-  SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder);
-  template <bool Swaps, bool IsFirst>
+  SwapTable(bool swaps, unsigned editsOfHead, bool headHoldsBorder, int leastLonger);
+  template <bool Swaps, bool IsFirst, int LeastLonger>
   static const SwapTable& made();
+  template <bool Swaps, bool IsFirst>
+  static const SwapTable& tableOf(int leastLonger);
 
   static std::size_t indexOf(std::int64_t stage) noexcept {
     return static_cast<std::size_t>(std::clamp(stage, kLastStage, kFirstStage) - kLastStage);

@@ -1,7 +1,9 @@
 // The two forms of an explanation: for programs and for people.
 
+#include <algorithm>
 #include <concepts>
 #include <initializer_list>
+#include <iterator>
 #include <nlohmann/json.hpp>
 #include <string>
 #include <utility>
@@ -54,6 +56,12 @@ std::string array(const std::vector<std::string>& texts) {
   return array(texts, [](const std::string& text) { return json(text); });
 }
 
+std::string phraseWord(const FindExplanation::PhraseWord& word) {
+  return object({{"word", json(word.word)},
+                 {"lengthLimit", json(word.lengthLimit)},
+                 {"limit", json(word.limit)}});
+}
+
 std::string comparison(const FindExplanation::Comparison& each) {
   return object({{"word", json(each.word)},
                  {"edits", json(each.edits)},
@@ -66,8 +74,6 @@ std::string textWord(const FindExplanation::TextWord& word) {
                  {"end", json(word.end)},
                  {"word", json(word.word)},
                  {"written", json(word.written)},
-                 {"lengthLimit", json(word.lengthLimit)},
-                 {"limit", json(word.limit)},
                  {"isLookedUp", json(word.isLookedUp)},
                  {"comparisons", array(word.comparisons, &comparison)}});
 }
@@ -95,26 +101,32 @@ constexpr const char* kCutOff =
     "A budget was used up: some words, comparisons, pairings or phrases were left out.\n";
 constexpr const char* kNotCompared = " ... (beyond the budget)";
 
-/// One word of the text beside those of the phrase, of which there are so many.
-std::string lineOf(const FindExplanation::TextWord& word, std::size_t phraseWords) {
+/// A word of the phrase with its limit.
+std::string limited(const FindExplanation::PhraseWord& word) {
+  return word.word + " (up to " + counted(word.limit, "edit") +
+         (word.limit < word.lengthLimit ? " as it holds a digit)" : ")");
+}
+
+/// One word of the text beside those of the phrase.
+std::string lineOf(const FindExplanation::TextWord& word,
+                   const std::vector<FindExplanation::PhraseWord>& phrase) {
   std::string line = "  " + shown(word);
   if (!word.isLookedUp) {
     return line + ", not looked up\n";
   }
-  line += ", up to " + counted(word.limit, "edit") +
-          (word.limit < word.lengthLimit ? " as it holds a digit:" : ":");
-  for (const auto& each : word.comparisons) {
-    line += (&each == &word.comparisons.front() ? " " : ", ") + each.word + ' ' +
-            std::to_string(each.edits);
+  line += phrase.empty() ? "" : ":";
+  for (std::size_t i = 0; i < word.comparisons.size(); ++i) {
+    const auto& each = word.comparisons[i];
+    line += (i == 0 ? " " : ", ") + each.word + ' ' + std::to_string(each.edits);
     if (each.within) {
       line += " (near)";
-    } else if (each.edits <= word.lengthLimit) {
+    } else if (each.edits <= phrase[i].lengthLimit) {
       // Only a digit has the limit of the two fall below that of the length.
       line += each.limit == 0 ? " (words with a digit must be the same)"
                               : " (words with a digit: up to " + counted(each.limit, "edit") + ')';
     }
   }
-  return line + (word.comparisons.size() < phraseWords ? kNotCompared : "") + '\n';
+  return line + (word.comparisons.size() < phrase.size() ? kNotCompared : "") + '\n';
 }
 
 }  // namespace
@@ -127,7 +139,7 @@ std::string FindExplanation::toJson() const {
                  {"cost", json(cost)},
                  {"edits", json(edits)},
                  {"words", array(words, &textWord)},
-                 {"phrase", array(phrase)},
+                 {"phrase", array(phrase, &phraseWord)},
                  {"pairs", array(pairs, &foundWord)},
                  {"missing", array(missing)},
                  {"surplus", array(surplus)},
@@ -138,9 +150,11 @@ std::string FindExplanation::toJson() const {
 std::string FindExplanation::toText() const {
   std::string lines = "Text:   " + text + "\nValue:  " + value + '\n';
   if (isStored) {
-    lines += "Phrase: " + listed(phrase) + '\n';
+    std::vector<std::string> limits;
+    std::transform(phrase.begin(), phrase.end(), std::back_inserter(limits), &limited);
+    lines += "Phrase: " + listed(limits) + '\n';
     for (const auto& word : words) {
-      lines += lineOf(word, phrase.size());
+      lines += lineOf(word, phrase);
     }
     for (const auto& pair : pairs) {
       lines += "Paired: " + text.substr(pair.begin, pair.end - pair.begin) + " with " + pair.word +

@@ -11,9 +11,11 @@
 
 namespace wordcatcher {
 
-/// How many edits a word of the text may be away from a stored word, by its length in UTF-16 code
-/// units when lower-cased. An edit is one code unit replaced, inserted or left out, the first one
-/// as any other. A limit above kMaxEdits is an error (badInput).
+/// How many edits a word of the text may be away from a stored word, by the length of the stored
+/// word in UTF-16 code units when lower-cased: what a phrase's word may suffer does not depend on
+/// what a text makes of it, so that one more mistake never brings a phrase nearer. An edit is one
+/// code unit replaced, inserted or left out, the first one as any other. A limit above kMaxEdits is
+/// an error (badInput).
 ///
 /// Words that hold a digit name something that one edit turns into another thing, so those of the
 /// text and those stored are only found exactly, and the limits by length do not relax this:
@@ -23,13 +25,13 @@ namespace wordcatcher {
 /// and codes are no such words.
 ///
 /// A code unit in place of the space between two words that the other side has ("goldnfish",
-/// "rai way") is an edit as well. It is looked for where a word of so many code units as the two
-/// and it may have two edits, digits being numbers here too.
+/// "rai way") is an edit as well. It is looked for where a stored word of so many code units as the
+/// two and it may have two edits, digits being numbers here too.
 struct EditLimits {
   /// The greatest limit that there may be, in edits.
   static constexpr std::uint32_t kMaxEdits = 3;
 
-  std::size_t shortLength = 2;    ///< a word of up to so many code units is short
+  std::size_t shortLength = 2;    ///< a stored word of up to so many code units is short
   std::size_t mediumLength = 5;   ///< a longer one of up to so many is medium; all others are long
   std::uint32_t shortEdits = 0;   ///< edits of a short word
   std::uint32_t mediumEdits = 1;  ///< of a medium one
@@ -37,7 +39,7 @@ struct EditLimits {
   std::uint32_t wholeTextEdits = 3;  ///< of a whole text, in an index of whole texts
 
   /// Of a word when it or the stored word holds a decimal digit of any script; at most those that
-  /// its length allows.
+  /// the stored word's length allows.
   std::uint32_t numberEdits = 0;
 
   /// Whether all members are equal.
@@ -108,24 +110,29 @@ struct WORDCATCHER_EXPORT FindExplanation {
   static constexpr std::uint64_t kMaxSteps = 16'777'216;
   static constexpr std::uint64_t kComparisonSteps = 256;  ///< see kMaxSteps
 
+  /// A word of the phrase.
+  struct PhraseWord {
+    std::string word;           ///< as stored
+    std::uint32_t lengthLimit;  ///< edits that it may have by its length
+    std::uint32_t limit;        ///< edits that it may have: less if it holds a digit
+  };
+
   /// A word of the phrase beside a word of the text.
   struct Comparison {
     std::string word;     ///< of the phrase
     std::uint64_t edits;  ///< between the two
-    std::uint32_t limit;  ///< edits that the two may have: less than the text's word may have by
+    std::uint32_t limit;  ///< edits that the two may have: less than the phrase's word may have by
                           ///< its length if one of them holds a digit
     bool within;          ///< whether the two may be paired
   };
 
   /// A word of the text.
   struct TextWord {
-    std::size_t begin;          ///< in the text, in bytes
-    std::size_t end;            ///< the byte behind its last one
-    std::string word;           ///< as it is looked up, or as it is if it is too long
-    std::string written;        ///< if `word` is a code: as it is in the text; else empty
-    std::uint32_t lengthLimit;  ///< edits that it may have by its length
-    std::uint32_t limit;        ///< edits that it may have: less if it holds a digit
-    bool isLookedUp;            ///< false if it is too long
+    std::size_t begin;    ///< in the text, in bytes
+    std::size_t end;      ///< the byte behind its last one
+    std::string word;     ///< as it is looked up, or as it is if it is too long
+    std::string written;  ///< if `word` is a code: as it is in the text; else empty
+    bool isLookedUp;      ///< false if it is too long
 
     /// With the words of the phrase, in its order: with all, or fewer if `truncated`; with none if
     /// it is too long.
@@ -140,7 +147,7 @@ struct WORDCATCHER_EXPORT FindExplanation {
   bool truncated = false;               ///< whether a budget cut words, comparisons, pairings or
                                         ///< matches before it off
   std::vector<TextWord> words;          ///< of the text, in its order
-  std::vector<std::string> phrase;      ///< the words of the phrase that fits best
+  std::vector<PhraseWord> phrase;       ///< the words of the phrase that fits best
   std::vector<FoundWord> pairs;         ///< what was paired, in the order of the text
   std::vector<std::string> missing;     ///< words of the phrase that the text lacks
   std::vector<std::string> surplus;     ///< words of the text that are left over; of an index of

@@ -39,26 +39,23 @@ class CodeWords {
 
 FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& limits,
                    WordSegmenter& segmenter, std::size_t maxWords, std::size_t maxWordUnits)
-    : source(text),
-      hasNumbers(mode == MatchingMode::words),
-      hasCodes(mode == MatchingMode::phoneticWords) {
+    : source(text), _mode(mode), _limits(limits) {
   const std::u16string units = decodeUtf8(text);
-  const auto add = [&](std::u16string word, std::size_t begin, std::size_t end,
-                       std::uint32_t lengthLimit, std::uint32_t limit) {
+  const auto add = [&](std::u16string word, std::size_t begin, std::size_t end) {
+    const bool isNumber = hasNumbers() && holdsDigit(word);
     const bool isLookedUp = word.size() <= maxWordUnits;
     truncated = truncated || !isLookedUp;
-    words.push_back({std::move(word), begin, end, lengthLimit, limit, isLookedUp});
+    words.push_back({std::move(word), begin, end, isNumber, isLookedUp});
   };
   if (mode == MatchingMode::wholeText) {
     if (!units.empty()) {
-      add(units.size() <= maxWordUnits ? toLower(units) : units, 0, text.size(),
-          limits.wholeTextEdits, limits.wholeTextEdits);
+      add(units.size() <= maxWordUnits ? toLower(units) : units, 0, text.size());
     }
     return;
   }
   const ByteOffsets offsets(text);
   std::optional<CodeWords> codes;
-  if (hasCodes) {
+  if (hasCodes()) {
     codes.emplace(segmenter);
   }
   segmenter.start(units);
@@ -70,28 +67,47 @@ FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& l
     const auto first = static_cast<std::size_t>(token->data() - units.data());
     const std::size_t begin = offsets.of(first);
     const std::size_t end = offsets.of(first + token->size());
-    if (!hasCodes || token->size() > maxWordUnits) {
+    if (!hasCodes() || token->size() > maxWordUnits) {
       std::u16string word(*token);
       if (token->size() <= maxWordUnits) {
         word = toLower(*token);
       }
-      const std::uint32_t lengthLimit = hasCodes ? 0 : editLimit(word.size(), false, limits);
-      const std::uint32_t limit =
-          hasCodes ? 0 : editLimit(word.size(), hasNumbers && holdsDigit(word), limits);
-      add(std::move(word), begin, end, lengthLimit, limit);
+      add(std::move(word), begin, end);
       continue;
     }
     for (const auto& code : codes->of(*token)) {
-      add(code, begin, end, 0, 0);
+      add(code, begin, end);
     }
   }
 }
 
-std::uint32_t editLimit(std::size_t length, bool isNumber, const EditLimits& limits) noexcept {
-  const std::uint32_t limit = length <= limits.shortLength    ? limits.shortEdits
-                              : length <= limits.mediumLength ? limits.mediumEdits
-                                                              : limits.longEdits;
-  return isNumber ? std::min(limit, limits.numberEdits) : limit;
+std::uint32_t FindText::editLimit(std::size_t length, bool isNumber) const noexcept {
+  switch (_mode) {
+    case MatchingMode::wholeText:
+      return _limits.wholeTextEdits;
+    case MatchingMode::phoneticWords:
+      return 0;
+    default: {
+      const std::uint32_t limit = length <= _limits.shortLength    ? _limits.shortEdits
+                                  : length <= _limits.mediumLength ? _limits.mediumEdits
+                                                                   : _limits.longEdits;
+      return isNumber ? std::min(limit, _limits.numberEdits) : limit;
+    }
+  }
+}
+
+NearLimit FindText::nearLimit(const FindWord& word) const noexcept {
+  const std::size_t length = word.word.size();
+  const std::size_t reach = EditLimits::kMaxEdits;
+  NearLimit most;
+  for (std::size_t other = length - std::min(length, reach); other <= length + reach; ++other) {
+    const std::uint32_t limit = editLimit(other, word.isNumber);
+    const std::size_t apart = length < other ? other - length : length - other;
+    if (apart <= limit && limit > most.edits) {
+      most = {limit, other};
+    }
+  }
+  return most;
 }
 
 bool holdsDigit(std::u16string_view word) noexcept {

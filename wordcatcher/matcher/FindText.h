@@ -7,6 +7,7 @@
 #include <string_view>
 #include <vector>
 
+#include "wordcatcher/fuzzy/NearWords.h"
 #include "wordcatcher/matcher/Find.h"
 #include "wordcatcher/matcher/IndexBuilder.h"
 #include "wordcatcher/text/WordSegmenter.h"
@@ -18,9 +19,8 @@ struct FindWord {
   std::u16string word;  // as it is looked up: lower-cased, or a code, lower-cased; else as it is
   std::size_t begin;    // in the text, in bytes
   std::size_t end;
-  std::uint32_t lengthLimit;  // edits that its length allows
-  std::uint32_t limit;        // edits that it may have, which is less if it holds a digit
-  bool isLookedUp;            // false for a word beyond the budget
+  bool isNumber;    // whether it holds a digit where that makes a difference
+  bool isLookedUp;  // false for a word beyond the budget
 };
 
 /// A text cut into the words that an index of some mode is asked for.
@@ -29,21 +29,27 @@ struct FindText {
   std::string_view source;  // the host's text, which must live as long as this is used
   bool truncated = false;   // whether a budget cut words off, or left one out
 
-  // Whether words that hold a digit have a limit of their own. A whole text is more than a number,
-  // and the digits of codes are sounds.
-  bool hasNumbers;
-
-  // Whether the words are codes.
-  bool hasCodes;
-
   /// Budgets as in Index::Options. Linear in the text.
   FindText(std::string_view text, MatchingMode mode, const EditLimits& limits, WordSegmenter& words,
            std::size_t maxWords, std::size_t maxWordUnits);
-};
 
-/// The edits that a word of so many code units may have; `isNumber`: it holds a digit, or what it
-/// is compared with does.
-std::uint32_t editLimit(std::size_t length, bool isNumber, const EditLimits& limits) noexcept;
+  /// The edits that a stored word of so many code units may be away from a word of the text;
+  /// `isNumber`: one of the two holds a digit.
+  std::uint32_t editLimit(std::size_t length, bool isNumber) const noexcept;
+
+  /// A limit for words of any length that excludes none within its own.
+  NearLimit nearLimit(const FindWord& word) const noexcept;
+
+  /// Whether words that hold a digit have a limit of their own. A whole text is more than a number,
+  /// and the digits of codes are sounds.
+  bool hasNumbers() const noexcept { return _mode == MatchingMode::words; }
+
+  bool hasCodes() const noexcept { return _mode == MatchingMode::phoneticWords; }
+
+ private:
+  MatchingMode _mode;
+  EditLimits _limits;
+};
 
 /// Whether a string holds a decimal digit of any script: such words name numbers, of which one that
 /// is a digit off is another.

@@ -124,9 +124,7 @@ void leaveOutOverlaps(std::vector<FoundPhrase>& matches, Overlaps overlaps) {
 FindExplanation::Comparison comparisonOf(const FindText& text, const FindWord& word,
                                          const std::u16string& other, const FindOptions& options) {
   const std::uint64_t edits = editDistance(word.word, other, options.transpositions);
-  const std::uint32_t limit = text.hasNumbers && holdsDigit(other)
-                                  ? std::min(word.limit, options.edits.numberEdits)
-                                  : word.limit;
+  const std::uint32_t limit = text.editLimit(other.size(), word.isNumber || holdsDigit(other));
   return {displayUtf8(other), edits, limit, edits <= limit};
 }
 
@@ -139,11 +137,9 @@ void compareWords(const SearchImage& image, const FindText& text, const RankedPh
     compared.begin = word.begin;
     compared.end = word.end;
     compared.word = displayUtf8(word.word);
-    if (text.hasCodes && word.isLookedUp) {
+    if (text.hasCodes() && word.isLookedUp) {
       compared.written = text.source.substr(word.begin, word.end - word.begin);
     }
-    compared.lengthLimit = word.lengthLimit;
-    compared.limit = word.limit;
     compared.isLookedUp = word.isLookedUp;
     if (!word.isLookedUp) {
       continue;
@@ -181,12 +177,14 @@ struct Paired {
   }
 };
 
-void listWords(const SearchImage& image, const RankedPhrase& phrase, const Paired& paired,
-               FindExplanation& explanation) {
+void listWords(const SearchImage& image, const FindText& text, const RankedPhrase& phrase,
+               const Paired& paired, FindExplanation& explanation) {
   for (std::size_t i = 0; i < paired.inPhrase.size(); ++i) {
-    explanation.phrase.push_back(wordText(image, phrase.phrase[i]));
+    const std::u16string word = image.textOf(phrase.phrase[i] & ~image::kPhraseEnd);
+    explanation.phrase.push_back({displayUtf8(word), text.editLimit(word.size(), false),
+                                  text.editLimit(word.size(), holdsDigit(word))});
     if (!paired.inPhrase[i]) {
-      explanation.missing.push_back(explanation.phrase.back());
+      explanation.missing.push_back(explanation.phrase.back().word);
     }
   }
   for (std::size_t i = 0; i < paired.inText.size(); ++i) {
@@ -204,7 +202,7 @@ std::optional<std::string> digitObjection(const Paired& paired,
     for (std::size_t j = 0; j < word.comparisons.size(); ++j) {
       const auto& other = word.comparisons[j];
       if (paired.inText[i] || paired.inPhrase[j] || other.within ||
-          other.edits > word.lengthLimit) {
+          other.edits > explanation.phrase[j].lengthLimit) {
         continue;
       }
       return "A word that holds a digit " +
@@ -346,7 +344,7 @@ FindExplanation explainFind(const SearchImage& image, const FindText& text, std:
   }
   explanation.truncated = explanation.truncated || finder.truncated();
   compareWords(image, text, phrase, options, explanation);
-  listWords(image, phrase, paired, explanation);
+  listWords(image, text, phrase, paired, explanation);
   explanation.pairs = hitsOf(image, text, phrase, std::move(pairs));
   if (!admitted) {
     object(phrase, options, finder.truncated(), explanation);

@@ -117,11 +117,11 @@ class WORDCATCHER_EXPORT Index {
   ///
   /// Every phrase is judged by itself. Its cost is the edits of its words, and 2 for each of its
   /// words that the text lacks, and 2 for each word of the text that it leaves over, over the best
-  /// one-to-one pairing of the words of both; words are paired within the edit limits of the text's
-  /// word. Two neighbouring words that the other side writes as one, with the same letters, are
-  /// paired with it for one edit, unless all edit limits of words are 0; and also when a code unit
-  /// stands for the space ("goldnfish", "rai way"), if a word of so many code units may have two
-  /// edits. A phrase is found when at least one of its words is paired.
+  /// one-to-one pairing of the words of both; words are paired within the edit limit of the
+  /// phrase's word. Two neighbouring words that the other side writes as one, with the same
+  /// letters, are paired with it for one edit, unless all edit limits of words are 0; and also when
+  /// a code unit stands for the space ("goldnfish", "rai way"), if a word of so many code units may
+  /// have two edits. A phrase is found when at least one of its words is paired.
   ///
   /// The order: the smaller cost; then more words of the phrase paired; then more of these without
   /// edits; then less disorder (0 for a pair that follows the one before it directly, in the phrase
@@ -144,7 +144,8 @@ class WORDCATCHER_EXPORT Index {
   /// cut off may have come before some that are listed, and with another limit it may cut at
   /// another place, so that the first k may then differ from those of a longer list.
   ///
-  /// The time is that of search() for each word of the text within its edit limit, and, for each
+  /// The time is that of search() for each word of the text, within the most edits that a stored
+  /// word so near to it may have, and, for each
   /// two neighbours, linear in the stored beginnings of one code unit more than the first; then at
   /// most FindOptions::maxPostings phrases are judged, each in time linear in its words and in the
   /// ways to pair them, and as many steps taken to try pairings. Phrases are met in the order of

@@ -103,19 +103,7 @@ void PhraseFinder::lookUpWords() {
     }
     const auto [place, isNew] = known.try_emplace(word.word);
     if (isNew) {
-      place->second = nearWords(_image, word.word, word.limit, _options.transpositions);
-      for (const NearWord& near : place->second) {
-        _image.prefetchPostingsOf(near.word);
-        _image.prefetchOffsetOf(near.word);
-      }
-      for (const NearWord& near : place->second) {
-        _image.prefetchLabelsOf(near.word);
-      }
-      if (_text.hasNumbers && !holdsDigit(word.word)) {
-        std::erase_if(place->second, [&](const NearWord& near) {
-          return near.edits > _options.edits.numberEdits && isNumber(near, word.word.size());
-        });
-      }
+      place->second = wordsNear(word);
     }
     for (const NearWord& near : place->second) {
       addOption({near.word, {position, 1, 1, static_cast<std::uint8_t>(near.edits)}});
@@ -123,12 +111,27 @@ void PhraseFinder::lookUpWords() {
   }
 }
 
-/// Whether a word near one of so many code units holds a digit. In a damaged image it may be any
-/// length.
-bool PhraseFinder::isNumber(const NearWord& near, std::size_t length) const {
+std::vector<NearWord> PhraseFinder::wordsNear(const FindWord& word) const {
+  auto words = nearWords(_image, word.word, _text.nearLimit(word), _options.transpositions);
+  for (const NearWord& near : words) {
+    _image.prefetchPostingsOf(near.word);
+    _image.prefetchOffsetOf(near.word);
+  }
+  for (const NearWord& near : words) {
+    _image.prefetchLabelsOf(near.word);
+  }
+  std::erase_if(words, [&](const NearWord& near) {
+    return near.edits > _text.editLimit(near.length, word.isNumber) ||
+           (near.edits > _text.editLimit(near.length, true) && isNumber(near));
+  });
+  return words;
+}
+
+/// Whether a word near one of the text holds a digit. In a damaged image it may be any length.
+bool PhraseFinder::isNumber(const NearWord& near) const {
   const auto labels = _image.labelsOf(near.word);
-  if (labels.size() > length + near.edits) {
-    _image.throwDamaged("a word is longer than its place in a tree says");
+  if (labels.size() != near.length) {
+    _image.throwDamaged("a word is not as long as its place in a tree says");
   }
   for (std::size_t i = 0; i < labels.size(); ++i) {
     const char16_t unit = _image.unitOf(labels[i]);
@@ -147,11 +150,11 @@ std::vector<std::uint32_t> PhraseFinder::wordsJoining(const FindWord& first,
                                                       const FindWord& second) const {
   std::vector<std::uint32_t> words;
   const std::size_t length = first.word.size() + 1 + second.word.size();
-  if (seamWithin(editLimit(length, false, _options.edits)) == Seam::unit) {
+  if (seamWithin(_text.editLimit(length, false)) == Seam::unit) {
     words = wordsWithUnitBetween(_image, first.word, second.word);
     std::erase_if(words, [&](std::uint32_t word) {
       const bool isNumber = holdsDigit(_image.textOf(word));
-      return seamWithin(editLimit(length, isNumber, _options.edits)) == Seam::none;
+      return seamWithin(_text.editLimit(length, isNumber)) == Seam::none;
     });
   }
   if (const auto word = exactWord(_image, first.word + second.word)) {
@@ -185,7 +188,8 @@ void PhraseFinder::lookUpSplits() {
     if (!word.isLookedUp) {
       continue;
     }
-    for (const JoinedWords& joined : wordsJoinedIn(_image, word.word, seamWithin(word.limit))) {
+    const Seam seam = seamWithin(_text.editLimit(word.word.size(), word.isNumber));
+    for (const JoinedWords& joined : wordsJoinedIn(_image, word.word, seam)) {
       _splits.push_back({joined.head, joined.tail, position});
     }
   }

@@ -103,7 +103,8 @@ class PhraseFinder {
   void addOption(const WordOption& option);
   std::vector<std::uint32_t> wordsJoining(const FindWord& first, const FindWord& second) const;
   void lookUpWords();
-  bool isNumber(const NearWord& near, std::size_t length) const;
+  std::vector<NearWord> wordsNear(const FindWord& word) const;
+  bool isNumber(const NearWord& near) const;
   void lookUpJoins();
   void lookUpSplits();
   void makeTable();
