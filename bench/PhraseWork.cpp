@@ -4,6 +4,18 @@
 
 namespace wordcatcher::bench {
 
+namespace {
+
+std::string_view phraseOfValue(std::string_view value) { return value.substr(0, value.find("{ ")); }
+
+std::string spaced(std::string_view phrase) {
+  std::string words(phrase);
+  std::replace(words.begin(), words.end(), '-', ' ');
+  return words;
+}
+
+}  // namespace
+
 PhraseWork::PhraseWork(const std::vector<std::string>& arguments)
     : _phrases(linesOf(arguments.at(0))),
       _questions(questionsOf(arguments.at(1))),
@@ -27,6 +39,14 @@ Index PhraseWork::open() {
   Index index = Index::open(_path);
   result["openSeconds"] = watch.seconds();
   return index;
+}
+
+bool PhraseWork::hasWordsOfSource(const Question& question, std::string_view value) const {
+  return spaced(phraseOfValue(value)) == spaced(_phrases[question.source]);
+}
+
+bool PhraseWork::isSpelledAsSource(const Question& question, std::string_view value) const {
+  return phraseOfValue(value) == _phrases[question.source];
 }
 
 }  // namespace wordcatcher::bench

@@ -31,14 +31,18 @@ class PhraseWork {
   Index open();
 
   /// Asks every question once to see what is found: first, within ten, or at all, where
-  /// `isSource(question, value)` tells whether a value is what the question was made of; and how
-  /// many answers were cut short. Then asks it all again, warm, and tells the latency of an answer
-  /// with its release, in microseconds, as medianSeconds() has it. `ask(text)` gives an answer with
-  /// `matches` and `truncated`.
+  /// `isSource(question, value)` tells whether a value is what the question was made of; how often
+  /// the first one is spelled as that is; and how many answers were cut short. Then asks it all
+  /// again, warm, and tells the latency of an answer with its release, in microseconds, as
+  /// medianSeconds() has it. `ask(text)` gives an answer with `matches` and `truncated`.
   template <typename Ask, typename IsSource>
   void ask(Ask ask, IsSource isSource);
 
-  const std::string& phrase(std::size_t number) const { return _phrases[number]; }
+  /// Whether a value's phrase has the words of the question's source. Hyphens stand for spaces:
+  /// what stands between words says nothing to an index of words.
+  bool hasWordsOfSource(const Question& question, std::string_view value) const;
+
+  bool isNumbered() const { return _numbered; }
 
   std::string dataOf(std::size_t number) const {
     return _numbered ? _phrases[number] + "{ " + std::to_string(number) + " }" : _phrases[number];
@@ -46,6 +50,9 @@ class PhraseWork {
 
   /// What was told so far.
   nlohmann::json result;
+
+  /// Whether a value's phrase is the question's source to the letter.
+  bool isSpelledAsSource(const Question& question, std::string_view value) const;
 
  private:
   std::vector<std::string> _phrases;
@@ -59,6 +66,7 @@ void PhraseWork::ask(Ask ask, IsSource isSource) {
   constexpr std::size_t kShown = 10;
   std::size_t found = 0;
   std::size_t first = 0;
+  std::size_t spelledFirst = 0;
   std::size_t withinTen = 0;
   std::size_t matchCount = 0;
   std::size_t truncated = 0;
@@ -72,6 +80,7 @@ void PhraseWork::ask(Ask ask, IsSource isSource) {
     const bool isThere = source != matches.end();
     found += isThere ? 1 : 0;
     first += isThere && place == 0 ? 1 : 0;
+    spelledFirst += !matches.empty() && isSpelledAsSource(question, matches.front().value) ? 1 : 0;
     withinTen += isThere && place < kShown ? 1 : 0;
     matchCount += matches.size();
     truncated += answer.truncated ? 1 : 0;
@@ -81,6 +90,7 @@ void PhraseWork::ask(Ask ask, IsSource isSource) {
   result["questions"] = _questions.size();
   result["found"] = found;
   result["foundFirst"] = first;
+  result["spelledFirst"] = spelledFirst;
   result["foundWithinTen"] = withinTen;
   result["matches"] = matchCount;
   result["truncated"] = truncated;

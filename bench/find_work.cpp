@@ -3,7 +3,7 @@
 //     find_work PHRASES QUERIES INDEX plain|numbered
 //
 // prints one JSON object of what PhraseWork tells, for a find with ten matches. A question is
-// answered by any of the phrases that read as its source does.
+// answered by any of the phrases that have the words of its source.
 
 #include "PhraseWork.h"
 
@@ -16,7 +16,7 @@ nlohmann::json run(const std::vector<std::string>& arguments) {
   const Index index = work.open();
   work.ask([&index](const std::string& text) { return index.find(text); },
            [&work](const Question& question, std::string_view value) {
-             return value.substr(0, value.find("{ ")) == work.phrase(question.source);
+             return work.hasWordsOfSource(question, value);
            });
   return work.result;
 }

@@ -2,8 +2,9 @@
 //
 //     query_work PHRASES QUERIES INDEX plain|numbered
 //
-// prints one JSON object of what PhraseWork tells, for a query. A question is answered by the very
-// record that it was made of, and no answer may be cut short.
+// prints one JSON object of what PhraseWork tells, for a query. A question is answered by any of
+// the phrases that have the words of its source, or, if they are numbered, by the very record that
+// it was made of; and no answer may be cut short.
 
 #include <stdexcept>
 
@@ -18,7 +19,8 @@ nlohmann::json run(const std::vector<std::string>& arguments) {
   const Index index = work.open();
   work.ask([&index](const std::string& text) { return index.query(text); },
            [&work](const Question& question, std::string_view value) {
-             return value == work.dataOf(question.source);
+             return work.isNumbered() ? value == work.dataOf(question.source)
+                                      : work.hasWordsOfSource(question, value);
            });
   if (work.result["truncated"] != 0) {
     throw std::runtime_error("A question was cut short.");

@@ -143,7 +143,7 @@ class ChartTest(unittest.TestCase):
 
 TIMES = {"mean": 4.0, "p50": 3.0, "p99": 9.0}
 PHRASES = {
-    "query": TIMES, "questions": 4, "found": 3, "foundFirst": 2, "foundWithinTen": 3,
+    "query": TIMES, "questions": 4, "found": 3, "foundFirst": 2, "spelledFirst": 1, "foundWithinTen": 3,
     "indexBytes": 5e6, "heapBytes": 6e6, "buildPeakBytes": 7e6, "buildSeconds": 0.5,
     "openSeconds": 1e-4,
 }

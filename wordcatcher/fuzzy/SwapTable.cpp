@@ -140,7 +140,7 @@ const SwapTable<K>& SwapTable<K>::tableOf(int leastLonger) {
   return [leastLonger]<int... I>(std::integer_sequence<int, I...>)->const SwapTable& {
     constexpr std::array<const SwapTable& (*)(), sizeof...(I)> kTables = {
         &made<Swaps, IsFirst, I - kEdits>...};
-    return kTables[static_cast<std::size_t>(leastLonger + kEdits)]();
+    return kTables.at(static_cast<std::size_t>(leastLonger) + K)();  // from below 0 it wraps around
   }
   (std::make_integer_sequence<int, 2 * kEdits + 1>());
 }
