@@ -234,7 +234,7 @@ class CompareTest(unittest.TestCase):
         page = self.page()
         cited = brought_up_to_date(text_of(CHOOSING), page, "2031-01-02-compare")
         self.assertEqual({figure for _, figure in CITED.findall(cited)},
-                         {"10×", "20×", "50.00 %"})
+                         {"10×", "20×", "50.00 %", "25.00 %"})
 
 
 class MachineTest(unittest.TestCase):
