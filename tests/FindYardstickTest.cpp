@@ -174,6 +174,29 @@ TEST(FindYardstickTest, EveryTextOverAFewWordsInAllPhrasesOverThem) {
   EXPECT_GT(matches, 10000U) << "the comparison was not of empty lists";
 }
 
+TEST(FindYardstickTest, EveryWordBesideStoredOnesOfEveryLength) {
+  std::vector<std::string> letters = {""};
+  for (std::size_t i = 0; letters[i].size() < 8; ++i) {
+    letters.push_back(letters[i] + 'a');
+    letters.push_back(letters[i] + 'b');
+  }
+  std::vector<std::string> stored;
+  std::vector<std::string> texts(letters.begin() + 1, letters.end());
+  for (std::size_t i = 1; i < letters.size(); ++i) {
+    if (letters[i].size() < 4 || i % 5 == 0) {
+      stored.push_back(letters[i]);
+    }
+  }
+  const Both all(asEntries(stored));
+  const auto options = manyOptions();
+  std::size_t matches = 0;
+  for (std::size_t i = 0; i < texts.size() && !HasFailure(); ++i) {
+    matches += all.expectSame(texts[i], options[0]).size();
+    matches += all.expectSame(texts[i], options[i % options.size()]).size();
+  }
+  EXPECT_GT(matches, 5000U) << "the comparison was not of empty lists";
+}
+
 TEST(FindYardstickTest, LongerTexts) {
   const Both all(asEntries({"a", "b", "ab", "ba", "a b", "b a", "a a", "b ab", "ab a", "a b a",
                             "b b a", "ab ab", "ba a b", "a a a", "b a b"}));
