@@ -77,8 +77,10 @@ void bindLimits(py::module_& module) {
       Field{"medium_edits", &EditLimits::mediumEdits, "Edits of a medium word."},
       Field{"long_edits", &EditLimits::longEdits, "Edits of a long word."},
       Field{"whole_text_edits", &EditLimits::wholeTextEdits, "Edits of a whole text."},
-      Field{"number_edits", &EditLimits::numberEdits,
-            "Edits of a word when it or the stored word holds a digit."});
+      Field{
+          "number_edits", &EditLimits::numberEdits,
+          "Edits of a word when it or the stored word holds a digit: at most those that the stored "
+          "word's length allows."});
 }
 
 void bindFind(py::module_& module) {

@@ -346,7 +346,24 @@ TEST(ExplainTest, TellsThatADigitKeepsWordsApart) {
             std::string::npos)
       << given.toText();
   expectAbsent(given, {"None", R"("b2c" is 1 edit from "b2b".)"});
-  // It says so only where that is the reason.
+  // The text's digit counts as the stored one does.
+  const auto plain = indexOfPhrases({"covidx", "b2b sales"});
+  const auto only = plain.explain("covid1", "covidx");
+  EXPECT_EQ(only.phrase.at(0).limit, 2U);
+  EXPECT_EQ(only.words.at(0).comparisons.at(0).limit, 0U);
+  expectAbsent(only, {"None", R"("covid1" is 1 edit from "covidx".)"});
+  // It says so only where that is the reason: two edits are too many for a word of three letters.
+  const auto far = plain.explain("b33", "b2b sales");
+  EXPECT_EQ(far.words.at(0).comparisons.at(0).edits, 2U);
+  EXPECT_NE(far.toText().find("Phrase: b2b (up to 0 edits as it holds a digit), sales (up to 1 "
+                              "edit)\n  b33: b2b 2, sales 5\n"),
+            std::string::npos)
+      << far.toText();
+  expectAbsent(far, {"None"});
+  const auto second = indexOfPhrases({"vaccine b2b"}).explain("b33", "vaccine b2b");
+  EXPECT_NE(second.toText().find("  b33: vaccine 7, b2b 2\n"), std::string::npos)
+      << second.toText();
+  expectAbsent(second, {"None"});
   EXPECT_TRUE(index.explain("covidy vaccine", "covid19 vaccine").isFound);
   expectAbsent(index.explain("covid", "b2b"), {"None"});
   FindOptions dear;

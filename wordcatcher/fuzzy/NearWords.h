@@ -20,8 +20,8 @@ struct NearWord {
   friend bool operator==(const NearWord&, const NearWord&) = default;
 };
 
-/// How many edits a word of an image may be away: at most 3, and one less if it is shorter than so
-/// many code units.
+/// How many edits a word of an image may be away: at most 3, and one less, if not 0 already, when
+/// it is shorter than so many code units.
 struct NearLimit {
   std::uint32_t edits = 0;
   std::size_t fromLength = 0;

@@ -120,7 +120,7 @@ std::string lineOf(const FindExplanation::TextWord& word,
     line += (i == 0 ? " " : ", ") + each.word + ' ' + std::to_string(each.edits);
     if (each.within) {
       line += " (near)";
-    } else if (each.edits <= phrase[i].lengthLimit) {
+    } else if (i < phrase.size() && each.edits <= phrase[i].lengthLimit) {
       // Only a digit has the limit of the two fall below that of the length.
       line += each.limit == 0 ? " (words with a digit must be the same)"
                               : " (words with a digit: up to " + counted(each.limit, "edit") + ')';

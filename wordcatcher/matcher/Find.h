@@ -13,7 +13,7 @@ namespace wordcatcher {
 
 /// How many edits a word of the text may be away from a stored word, by the length of the stored
 /// word in UTF-16 code units when lower-cased: what a phrase's word may suffer does not depend on
-/// what a text makes of it, so that one more mistake never brings a phrase nearer. An edit is one
+/// what a text makes of it, so that a word does not come nearer by one more mistake. An edit is one
 /// code unit replaced, inserted or left out, the first one as any other. A limit above kMaxEdits is
 /// an error (badInput).
 ///

@@ -145,12 +145,11 @@ class WORDCATCHER_EXPORT Index {
   /// another place, so that the first k may then differ from those of a longer list.
   ///
   /// The time is that of search() for each word of the text, within the most edits that a stored
-  /// word so near to it may have, and, for each
-  /// two neighbours, linear in the stored beginnings of one code unit more than the first; then at
-  /// most FindOptions::maxPostings phrases are judged, each in time linear in its words and in the
-  /// ways to pair them, and as many steps taken to try pairings. Phrases are met in the order of
-  /// what they may cost at best, so that a small `limit` ends this early; with `overlaps` other
-  /// than `all`, all matches are found and sorted first.
+  /// word so near to it may have, and, for each two neighbours, linear in the stored beginnings of
+  /// one code unit more than the first; then at most FindOptions::maxPostings phrases are judged,
+  /// each in time linear in its words and in the ways to pair them, and as many steps taken to try
+  /// pairings. Phrases are met in the order of what they may cost at best, so that a small `limit`
+  /// ends this early; with `overlaps` other than `all`, all matches are found and sorted first.
   FindResult find(std::string_view text) const;
 
   /// The same with options: how many, how far, which of those that overlap.
