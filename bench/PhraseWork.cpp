@@ -1,5 +1,7 @@
 #include "PhraseWork.h"
 
+#include <algorithm>
+
 #include "wordcatcher/matcher/IndexBuilder.h"
 
 namespace wordcatcher::bench {

@@ -32,9 +32,9 @@ class PhraseWork {
 
   /// Asks every question once to see what is found: first, within ten, or at all, where
   /// `isSource(question, value)` tells whether a value is what the question was made of; how often
-  /// the first one is spelled as that is; and how many answers were cut short. Then asks it all
-  /// again, warm, and tells the latency of an answer with its release, in microseconds, as
-  /// medianSeconds() has it. `ask(text)` gives an answer with `matches` and `truncated`.
+  /// the first one has the source's phrase to the letter; and how many answers were cut short. Then
+  /// asks it all again, warm, and tells the latency of an answer with its release, in microseconds,
+  /// as medianSeconds() has it. `ask(text)` gives an answer with `matches` and `truncated`.
   template <typename Ask, typename IsSource>
   void ask(Ask ask, IsSource isSource);
 
@@ -51,10 +51,10 @@ class PhraseWork {
   /// What was told so far.
   nlohmann::json result;
 
+ private:
   /// Whether a value's phrase is the question's source to the letter.
   bool isSpelledAsSource(const Question& question, std::string_view value) const;
 
- private:
   std::vector<std::string> _phrases;
   std::vector<Question> _questions;
   std::string _path;

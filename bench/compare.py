@@ -271,7 +271,8 @@ def made_work(counts):
     text = "## W3: many phrases\n\n"
     text += (
         "Phrases made of WordNet's words with their frequencies, numbered; the same questions of "
-        "the first million for each. "
+        "the first million for each. A source is found as the very record, within ten as any phrase "
+        "of its words. "
         + "; ".join(f"{count:,} phrases: {in_words(turns[count])}" for count in counts)
         + ".\n\n"
     )

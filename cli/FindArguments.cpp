@@ -99,7 +99,7 @@ void setLengths(const std::string& list, EditLimits& edits) {
 
 std::string editsDescription() {
   const EditLimits edits;
-  return "Edits that a word may be away from a stored one\nof up to " +
+  return "How many edits a word may be away from a stored one\nof up to " +
          std::to_string(edits.shortLength) + " letters, of up to " +
          std::to_string(edits.mediumLength) +
          ", of more (see --lengths);\na 4th number is for whole texts. Words that hold a digit\n"

@@ -58,8 +58,8 @@ The cost of a phrase is the edits of its words, and 2 for each of its words that
 limit           Phrases at the most; None for all.
 max_cost        The greatest cost of a phrase; None for any.
 min_words       Words of a phrase that the text must hold; at least 1.
-edits           EditLimits: how many edits a stored word may have, by its length; None for the usual
-                ones.
+edits           EditLimits: how many edits a word may be away from a stored one, by the length of
+                that; None for the usual ones.
 transpositions  Whether two neighbouring letters that changed places are one edit, not two.
 overlaps        What becomes of phrases whose ranges in the text overlap: "all" gives every one,
                 "no_sub" none within the larger range of another, "longest" those with the longest

@@ -148,10 +148,11 @@ void bindFindExplanation(py::module_& module) {
   using Comparison = FindExplanation::Comparison;
   using PhraseWord = FindExplanation::PhraseWord;
   using TextWord = FindExplanation::TextWord;
-  bindRecord(
-      module, "PhraseWord", "A word of a phrase.", Field{"word", &PhraseWord::word, "As stored."},
-      Field{"length_limit", &PhraseWord::lengthLimit, "Edits that it may have by its length."},
-      Field{"limit", &PhraseWord::limit, "Edits that it may have: less if it holds a digit."});
+  bindRecord(module, "PhraseWord", "A word of a phrase.",
+             Field{"word", &PhraseWord::word, "As stored."},
+             Field{"length_limit", &PhraseWord::lengthLimit,
+                   "Edits that a text's word may be away from it by its length."},
+             Field{"limit", &PhraseWord::limit, "The same: less if it holds a digit."});
   bindRecord(module, "WordComparison", "A word of a phrase beside a word of the text.",
              Field{"word", &Comparison::word, "Of the phrase."},
              Field{"edits", &Comparison::edits, "Between the two."},

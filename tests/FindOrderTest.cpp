@@ -155,7 +155,8 @@ std::string edited(const std::string& text, std::mt19937& random) {
   return toUtf8(testing::edited(fromUtf8(text).value(), random)).value();
 }
 
-/// The words of a text beside those of a phrase of as many, the first of both with each other.
+/// The words of a text beside those of a phrase, whose first one belongs to the text's word
+/// `firstWord`.
 struct Beside {
   std::uint64_t cost;
   std::vector<std::uint64_t> edits;  // between words of one place
@@ -238,8 +239,7 @@ TEST(FindOrderTest, AMistakeThatMakesAWordLongerDoesNotMakeItNearer) {
   EXPECT_EQ(index.explain("abcdxy ghi mno", "abcdef ghi").edits, 2U);
   EXPECT_EQ(first("abcdxy ghi mno"), "abcdef ghi");
   EXPECT_EQ(first("abcdxyz ghi mno"), "mno") << "which is an edit more";
-  EXPECT_EQ(first("abx mno"), "mno");
-  EXPECT_EQ(index.explain("abxyzv", "ab").pairs.size(), 0U);
+  EXPECT_TRUE(index.explain("abx mno", "ab").pairs.empty());
 }
 
 TEST(FindOrderTest, ThePhraseThatTheEditsMakeComesFirst) {

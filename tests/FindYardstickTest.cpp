@@ -189,10 +189,13 @@ TEST(FindYardstickTest, EveryWordBesideStoredOnesOfEveryLength) {
   }
   const Both all(asEntries(stored));
   const auto options = manyOptions();
+  std::mt19937 random(46);  // NOLINT(cert-msc32-c,cert-msc51-cpp): the same every time
   std::size_t matches = 0;
   for (std::size_t i = 0; i < texts.size() && !HasFailure(); ++i) {
-    matches += all.expectSame(texts[i], options[0]).size();
-    matches += all.expectSame(texts[i], options[i % options.size()]).size();
+    matches += all.expectSame(texts[i], unlimited()).size();
+    for (int some = 0; some < 4; ++some) {
+      matches += all.expectSame(texts[i], options[random() % options.size()]).size();
+    }
   }
   EXPECT_GT(matches, 5000U) << "the comparison was not of empty lists";
 }

@@ -205,7 +205,7 @@ class CompareTest(unittest.TestCase):
         page = self.page()
         self.assertIn("| W1 k=1, mean | 2 µs | 4 µs | missed |", page)
         self.assertIn("| W1 k=3, mean | 170 µs | 4 µs | reached |", page)
-        self.assertIn("| W2 find, source first | 99.5 % | 50.00 % | missed |", page)
+        self.assertIn("| W2 find, source's words first | 99.5 % | 50.00 % | missed |", page)
         self.assertIn("| W2 build | 1 s | 0.5 s | reached |", page)
         self.assertIn("| W3, 5 M against 1 M: query, p50 | 3 times | 1 times | reached |", page)
 

@@ -167,11 +167,13 @@ void walk(const SearchImage& image, bool backward, const typename Automaton::Pat
 /// Two walks, each with few edits in the half of the query that it reads first; see
 /// ImageSearch.cpp. Walks along the whole query count the least edits that their limits allow, so a
 /// word that both meet has the lesser of its two counts: with all edits in reach of one half, that
-/// is the distance. Words of K edits have at least `fromLength` code units.
+/// is the distance. Words of K edits are left out if they have fewer than `fromLength` code units.
 template <unsigned K>
 void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units,
                   std::size_t fromLength, bool swaps, std::vector<NearWord>& found) {
+  // Halves of fewer code units rule too little out.
   constexpr std::size_t kMinSplitLength = K <= 2 ? 4 : 2 + 2 * std::size_t{K};
+  // Up to 2 edits the tables leave out the short ones, so that the walks do not follow them.
   const auto accept = [&found, fromLength](std::uint32_t word, std::uint32_t edits,
                                            std::size_t length) {
     if (edits < K || length >= fromLength) {

@@ -4,10 +4,12 @@
 // The automaton of a SwapPattern as a table that serves all queries.
 //
 // Which set of states a code unit leads to depends on the query only by the columns behind which
-// the query has that code unit, and by how far away the end of a limited head is. There are few
-// sets, and few columns, so all steps are made once for a program. That a set of states does not
-// depend on the query itself, so that its automaton need not be made for each, is the discovery of
-// Schulz and Mihov, "Fast string correction with Levenshtein automata" (2002).
+// the query has that code unit, by how far away the end of a limited head is, and by how much
+// longer than the query words must be to have all edits. There are few sets, and few columns, so
+// all steps are made once for a program: a table for each walk, with swaps and without, and for
+// each such length, 32 in all, of some 200 KB. That a set of states does not depend on the query
+// itself, so that its automaton need not be made for each, is the discovery of Schulz and Mihov,
+// "Fast string correction with Levenshtein automata" (2002).
 //
 // Unlike those of a SwapPattern the sets may hold states behind the end of the query. From these
 // nothing is accepted, nor do they keep a walk alive that the others would not.
@@ -23,7 +25,7 @@
 namespace wordcatcher {
 
 /// All steps at up to K edits, K being 1 or 2, with the head's limit in edits that one of two walks
-/// has. Immutable.
+/// has, and the least length that words of K edits have. Immutable.
 ///
 /// After d code units a query with a limited head of h code units is in stage h - d, where all
 /// stages beyond the first and the last are alike. A set of states is a number in its stage.

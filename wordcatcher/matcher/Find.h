@@ -13,9 +13,9 @@ namespace wordcatcher {
 
 /// How many edits a word of the text may be away from a stored word, by the length of the stored
 /// word in UTF-16 code units when lower-cased: what a phrase's word may suffer does not depend on
-/// what a text makes of it, so that a word does not come nearer by one more mistake. An edit is one
-/// code unit replaced, inserted or left out, the first one as any other. A limit above kMaxEdits is
-/// an error (badInput).
+/// what a text makes of it, so that a word of letters does not come nearer by one more mistake. An
+/// edit is one code unit replaced, inserted or left out, the first one as any other. A limit above
+/// kMaxEdits is an error (badInput).
 ///
 /// Words that hold a digit name something that one edit turns into another thing, so those of the
 /// text and those stored are only found exactly, and the limits by length do not relax this:
@@ -113,8 +113,9 @@ struct WORDCATCHER_EXPORT FindExplanation {
   /// A word of the phrase.
   struct PhraseWord {
     std::string word;           ///< as stored
-    std::uint32_t lengthLimit;  ///< edits that it may have by its length
-    std::uint32_t limit;        ///< edits that it may have: less if it holds a digit
+    std::uint32_t lengthLimit;  ///< edits that a text's word may be away from it by its length; of
+                                ///< a code none, of a whole text whatever its length
+    std::uint32_t limit;        ///< the same: less if it holds a digit
   };
 
   /// A word of the phrase beside a word of the text.

@@ -37,7 +37,7 @@ struct FindText {
   /// `isNumber`: one of the two holds a digit.
   std::uint32_t editLimit(std::size_t length, bool isNumber) const noexcept;
 
-  /// A limit for words of any length that excludes none within its own.
+  /// The least limit with which nearWords() leaves out no stored word that these limits admit.
   NearLimit nearLimit(const FindWord& word) const noexcept;
 
   /// Whether words that hold a digit have a limit of their own. A whole text is more than a number,

@@ -20,8 +20,13 @@ namespace {
 
 using Range = std::pair<std::size_t, std::size_t>;  // begin, end
 
+/// A word of a phrase, whose last one carries a flag.
+std::u16string wordUnits(const SearchImage& image, std::uint32_t word) {
+  return image.textOf(word & ~image::kPhraseEnd);
+}
+
 std::string wordText(const SearchImage& image, std::uint32_t word) {
-  return displayUtf8(image.textOf(word & ~image::kPhraseEnd));
+  return displayUtf8(wordUnits(image, word));
 }
 
 std::vector<FoundWord> hitsOf(const SearchImage& image, const FindText& text,
@@ -180,7 +185,7 @@ struct Paired {
 void listWords(const SearchImage& image, const FindText& text, const RankedPhrase& phrase,
                const Paired& paired, FindExplanation& explanation) {
   for (std::size_t i = 0; i < paired.inPhrase.size(); ++i) {
-    const std::u16string word = image.textOf(phrase.phrase[i] & ~image::kPhraseEnd);
+    const std::u16string word = wordUnits(image, phrase.phrase[i]);
     explanation.phrase.push_back({displayUtf8(word), text.editLimit(word.size(), false),
                                   text.editLimit(word.size(), holdsDigit(word))});
     if (!paired.inPhrase[i]) {

@@ -120,8 +120,8 @@ class WORDCATCHER_EXPORT Index {
   /// one-to-one pairing of the words of both; words are paired within the edit limit of the
   /// phrase's word. Two neighbouring words that the other side writes as one, with the same
   /// letters, are paired with it for one edit, unless all edit limits of words are 0; and also when
-  /// a code unit stands for the space ("goldnfish", "rai way"), if a word of so many code units may
-  /// have two edits. A phrase is found when at least one of its words is paired.
+  /// a code unit stands for the space ("goldnfish", "rai way"), if a stored word of so many code
+  /// units may have two edits. A phrase is found when at least one of its words is paired.
   ///
   /// The order: the smaller cost; then more words of the phrase paired; then more of these without
   /// edits; then less disorder (0 for a pair that follows the one before it directly, in the phrase
