@@ -164,6 +164,57 @@ void walk(const SearchImage& image, bool backward, const typename Automaton::Pat
   BandedWalk<Automaton>(image, tree, backward, pattern, memory).run(pattern.start(), accept);
 }
 
+/// The patterns of the walks within K edits. Up to 2 edits there are tables, which leave out words
+/// of K edits that are less than so many code units longer than the query (or shorter, below 0);
+/// beyond, such words are met.
+template <unsigned K, bool HasTable = (K <= 2)>
+class Patterns {
+ public:
+  using Automaton = TableAutomaton<K>;
+  using Pattern = typename Automaton::Pattern;
+  using Units = std::vector<QueryUnit>;
+
+  Patterns(bool swaps, std::int64_t leastLonger)
+      : _swaps(swaps), _leastLonger(static_cast<int>(std::clamp(leastLonger, -kEdits, kEdits))) {}
+
+  Pattern whole(const Units& units) const {
+    return Pattern(units, SwapTable<K>::ofFirst(_swaps, _leastLonger));
+  }
+  Pattern first(const Units& units, std::size_t head) const {
+    return Pattern(units, SwapTable<K>::ofFirst(_swaps, _leastLonger), head);
+  }
+  Pattern second(const Units& reversed, std::size_t head) const {
+    return Pattern(reversed, SwapTable<K>::ofSecond(_swaps, _leastLonger), head);
+  }
+
+ private:
+  static constexpr std::int64_t kEdits = K;
+
+  bool _swaps;
+  int _leastLonger;
+};
+
+template <unsigned K>
+class Patterns<K, false> {
+ public:
+  using Automaton = LazyAutomaton<K, 1, SwapPattern<K>>;
+  using Pattern = SwapPattern<K>;
+  using Units = std::vector<QueryUnit>;
+
+  Patterns(bool swaps, std::int64_t) : _swaps(swaps) {}
+
+  Pattern whole(const Units& units) const { return Pattern(units, _swaps, {0, K}); }
+  Pattern first(const Units& units, std::size_t head) const {
+    return Pattern(units, _swaps, {head, Halves<K>::kInFirst, true});
+  }
+  Pattern second(const Units& reversed, std::size_t head) const {
+    return Pattern(reversed, _swaps, {head, Halves<K>::kInSecond, false});
+  }
+
+ private:
+  bool _swaps;
+};
+
 /// Two walks, each with few edits in the half of the query that it reads first; see
 /// ImageSearch.cpp. Walks along the whole query count the least edits that their limits allow, so a
 /// word that both meet has the lesser of its two counts: with all edits in reach of one half, that
@@ -173,44 +224,24 @@ void searchWithin(const SearchImage& image, const std::vector<QueryUnit>& units,
                   std::size_t fromLength, bool swaps, std::vector<NearWord>& found) {
   // Halves of fewer code units rule too little out.
   constexpr std::size_t kMinSplitLength = K <= 2 ? 4 : 2 + 2 * std::size_t{K};
-  // Up to 2 edits the tables leave out the short ones, so that the walks do not follow them.
   const auto accept = [&found, fromLength](std::uint32_t word, std::uint32_t edits,
                                            std::size_t length) {
     if (edits < K || length >= fromLength) {
       found.push_back({word, edits, static_cast<std::uint32_t>(length)});
     }
   };
+  using Automaton = typename Patterns<K>::Automaton;
+  const Patterns<K> patterns(
+      swaps, static_cast<std::int64_t>(fromLength) - static_cast<std::int64_t>(units.size()));
   const auto memory = image.lendWalkMemory();
-  const bool isWhole = units.size() < kMinSplitLength;
+  if (units.size() < kMinSplitLength) {
+    walk<Automaton>(image, false, patterns.whole(units), *memory, accept);
+    return;
+  }
   const std::size_t half = Halves<K>::first(units.size());
   const std::vector<QueryUnit> reversed(units.rbegin(), units.rend());
-  if constexpr (K <= 2) {
-    using Automaton = TableAutomaton<K>;
-    using Pattern = TablePattern<K>;
-    constexpr std::int64_t kEdits = K;
-    const auto leastLonger = static_cast<int>(
-        std::clamp(static_cast<std::int64_t>(fromLength) - static_cast<std::int64_t>(units.size()),
-                   -kEdits, kEdits));
-    const auto& table = SwapTable<K>::ofFirst(swaps, leastLonger);
-    if (isWhole) {
-      walk<Automaton>(image, false, Pattern(units, table), *memory, accept);
-      return;
-    }
-    walk<Automaton>(image, false, Pattern(units, table, half), *memory, accept);
-    const Pattern second(reversed, SwapTable<K>::ofSecond(swaps, leastLonger), units.size() - half);
-    walk<Automaton>(image, true, second, *memory, accept);
-  } else {
-    using Automaton = LazyAutomaton<K, 1, SwapPattern<K>>;
-    using Pattern = SwapPattern<K>;
-    if (isWhole) {
-      walk<Automaton>(image, false, Pattern(units, swaps, {0, K}), *memory, accept);
-      return;
-    }
-    walk<Automaton>(image, false, Pattern(units, swaps, {half, Halves<K>::kInFirst, true}), *memory,
-                    accept);
-    const Pattern second(reversed, swaps, {units.size() - half, Halves<K>::kInSecond, false});
-    walk<Automaton>(image, true, second, *memory, accept);
-  }
+  walk<Automaton>(image, false, patterns.first(units, half), *memory, accept);
+  walk<Automaton>(image, true, patterns.second(reversed, units.size() - half), *memory, accept);
 }
 
 }  // namespace

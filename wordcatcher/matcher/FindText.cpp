@@ -42,7 +42,8 @@ FindText::FindText(std::string_view text, MatchingMode mode, const EditLimits& l
     : source(text), _mode(mode), _limits(limits) {
   const std::u16string units = decodeUtf8(text);
   const auto add = [&](std::u16string word, std::size_t begin, std::size_t end) {
-    const bool isNumber = hasNumbers() && holdsDigit(word);
+    // A whole text is more than a number, and the digits of codes are sounds.
+    const bool isNumber = mode == MatchingMode::words && holdsDigit(word);
     const bool isLookedUp = word.size() <= maxWordUnits;
     truncated = truncated || !isLookedUp;
     words.push_back({std::move(word), begin, end, isNumber, isLookedUp});

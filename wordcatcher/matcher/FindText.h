@@ -40,10 +40,6 @@ struct FindText {
   /// The least limit with which nearWords() leaves out no stored word that these limits admit.
   NearLimit nearLimit(const FindWord& word) const noexcept;
 
-  /// Whether words that hold a digit have a limit of their own. A whole text is more than a number,
-  /// and the digits of codes are sounds.
-  bool hasNumbers() const noexcept { return _mode == MatchingMode::words; }
-
   bool hasCodes() const noexcept { return _mode == MatchingMode::phoneticWords; }
 
  private:

@@ -37,10 +37,6 @@ constexpr std::size_t kValuesAhead = 4;
 // Costs above are rare.
 constexpr std::size_t kCountedBounds = 64;
 
-Seam seamWithin(std::uint32_t limit) {
-  return limit >= kUnitBetweenLimit ? Seam::unit : Seam::none;
-}
-
 std::uint64_t apart(std::uint64_t a, std::uint64_t b) { return a < b ? b - a : a - b; }
 
 /// The items by their buckets, in each in their order. Linear in both: for what differs little,
@@ -145,16 +141,20 @@ bool PhraseFinder::isNumber(const NearWord& near) const {
   return false;
 }
 
+/// What may stand between two words of so many code units with it; `isNumber`: one holds a digit.
+Seam PhraseFinder::seamOf(std::size_t length, bool isNumber) const noexcept {
+  return _text.editLimit(length, isNumber) >= kUnitBetweenLimit ? Seam::unit : Seam::none;
+}
+
 /// What two words of the text are in one, or with a letter for the space between them.
 std::vector<std::uint32_t> PhraseFinder::wordsJoining(const FindWord& first,
                                                       const FindWord& second) const {
   std::vector<std::uint32_t> words;
   const std::size_t length = first.word.size() + 1 + second.word.size();
-  if (seamWithin(_text.editLimit(length, false)) == Seam::unit) {
+  if (seamOf(length, false) == Seam::unit) {
     words = wordsWithUnitBetween(_image, first.word, second.word);
     std::erase_if(words, [&](std::uint32_t word) {
-      const bool isNumber = holdsDigit(_image.textOf(word));
-      return seamWithin(_text.editLimit(length, isNumber)) == Seam::none;
+      return seamOf(length, holdsDigit(_image.textOf(word))) == Seam::none;
     });
   }
   if (const auto word = exactWord(_image, first.word + second.word)) {
@@ -188,7 +188,7 @@ void PhraseFinder::lookUpSplits() {
     if (!word.isLookedUp) {
       continue;
     }
-    const Seam seam = seamWithin(_text.editLimit(word.word.size(), word.isNumber));
+    const Seam seam = seamOf(word.word.size(), word.isNumber);
     for (const JoinedWords& joined : wordsJoinedIn(_image, word.word, seam)) {
       _splits.push_back({joined.head, joined.tail, position});
     }

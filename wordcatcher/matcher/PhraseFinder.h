@@ -101,6 +101,7 @@ class PhraseFinder {
   };
 
   void addOption(const WordOption& option);
+  Seam seamOf(std::size_t length, bool isNumber) const noexcept;
   std::vector<std::uint32_t> wordsJoining(const FindWord& first, const FindWord& second) const;
   void lookUpWords();
   std::vector<NearWord> wordsNear(const FindWord& word) const;
